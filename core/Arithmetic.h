@@ -1,0 +1,17 @@
+#pragma once
+
+#include <cstdint>
+
+namespace android {
+
+/** `total` plus the low 32 bits of `amount`, wrapping at 2^32 as the device's counters do. */
+constexpr int32_t addWrapped(int32_t total, int64_t amount) {
+    return static_cast<int32_t>(static_cast<uint32_t>(total) + static_cast<uint32_t>(amount));
+}
+
+/** Whole seconds from `begin` to `end`, both in nanoseconds, truncated toward zero. */
+constexpr int64_t secondsBetween(int64_t begin, int64_t end) {
+    return (end - begin) / 1'000'000'000;
+}
+
+}  // namespace android

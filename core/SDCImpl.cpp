@@ -1,0 +1,82 @@
+#include "core/SDCImpl.h"
+
+#include "rgb/RgbShot.h"
+#include "usage/RegisterInfo.h"
+
+namespace android {
+
+Mutex SDCImpl::sLock;
+SDCImpl* SDCImpl::mSDC = nullptr;
+
+SDCImpl* SDCImpl::getInstance() {
+    Mutex::Autolock lock(sLock);
+    if (mSDC == nullptr) mSDC = new SDCImpl;
+    return mSDC;
+}
+
+SDCImpl::SDCImpl() : mRgbShot(RgbShot::getInstance()), mRegisterInfo(RegisterInfo::getInstance()) {}
+
+void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
+                            const std::string& opPkg, long long rate) {
+    if (enabled) {
+        handleEnable(type, pkg, opPkg, rate);
+    } else {
+        handleDisable(type, pkg, opPkg);
+    }
+}
+
+void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long long rate) {
+    switch (type) {
+        case 1:
+        case 4:
+        case 16:
+        case 35:
+            mRegisterInfo->handleEnable(type, pkg, opPkg, rate);
+            break;
+    }
+}
+
+void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
+    switch (type) {
+        case 1:
+        case 4:
+        case 16:
+        case 35:
+            mRegisterInfo->handleDisable(type, pkg, opPkg);
+            break;
+    }
+}
+
+void SDCImpl::cleanupConnection(const String8& pkg, const String8& opPkg, int type) {
+    if (pkg.string() != nullptr) handleCleanupConnection(type, pkg.string(), opPkg.string());
+}
+
+void SDCImpl::handleCleanupConnection(int type, std::string pkg, std::string opPkg) {
+    handleDisable(type, pkg, opPkg);
+}
+
+void SDCImpl::setNotification(const Vector<int>& notification) {
+    mRegisterInfo->setNotification(notification);
+}
+
+void SDCImpl::setRgbShotCount() {
+    mRgbShot->setRgbShotCount();
+}
+
+void SDCImpl::notifySdcClock(int hour) {
+    if (hour == 23) mRegisterInfo->notifyDayNight();
+}
+
+void SDCImpl::notifySdcReset(int hour) {
+    if (hour == 23) mRegisterInfo->notifyRegisterInfoReset();
+}
+
+void SDCImpl::putRgbShotTally(int hour) {
+    if (hour == 7) mRgbShot->putRgbShotTally();
+}
+
+void SDCImpl::notifyRgbShotReset(int hour) {
+    if (hour == 7) mRgbShot->notifyRgbShotReset();
+}
+
+}  // namespace android

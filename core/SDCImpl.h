@@ -1,0 +1,80 @@
+#pragma once
+
+#include <string>
+
+#include <utils/Mutex.h>
+#include <utils/String8.h>
+#include <utils/Vector.h>
+
+#include "core/Export.h"
+
+namespace android {
+
+class RegisterInfo;
+class RgbShot;
+
+/**
+ * The object through which the sensor service feeds the statistics modules: it routes each call by
+ * sensor type or by hour of the day, and keeps no state of its own.
+ *
+ * All operations may be called from any thread and take no lock but those of the modules that they
+ * reach. None reports an error.
+ *
+ * `pkg` is the connection's package name (of a component of the system server, its listener's class
+ * name), `opPkg` the package that owns it; `type` is a sensor type of the platform. Types without a
+ * route do nothing.
+ */
+class SENSOR_PRIV_EXPORT SDCImpl {
+public:
+    /**
+     * The single instance; the first call creates it and with it, in the order of its members, the
+     * modules, and with the first of these the worker thread. Locks `sLock`.
+     */
+    static SDCImpl* getInstance();
+
+    SDCImpl();
+
+    /** A sensor was enabled, or disabled, for a connection; `rate` belongs to an enable only. */
+    void enableSuccess(bool enabled, int type, const std::string& pkg, const std::string& opPkg,
+                       long long rate);
+
+    void handleEnable(int type, std::string pkg, std::string opPkg, long long rate);
+    void handleDisable(int type, std::string pkg, std::string opPkg);
+
+    /** A connection was closed that still had `type` enabled: counts as a disable. */
+    void cleanupConnection(const String8& pkg, const String8& opPkg, int type);
+
+    void handleCleanupConnection(int type, std::string pkg, std::string opPkg);
+
+    /** Hands on a notification: element 0 is its kind, the rest is as the kind has it. */
+    void setNotification(const Vector<int>& notification);
+
+    /** Counts one screen sample. */
+    void setRgbShotCount();
+
+    // The host calls each of these once an hour with the hour of the day, 0 to 23; they act on one
+    // or two hours each and ignore the rest. Reports come before the resets of the same hour
+    // because the host calls them in that order; nothing here enforces it.
+
+    /** 23: the daily reports. */
+    void notifySdcClock(int hour);
+
+    /** 23: the daily resets. */
+    void notifySdcReset(int hour);
+
+    /** 7: the daily report of screen samples. */
+    void putRgbShotTally(int hour);
+
+    /** 7: the daily reset of screen samples. */
+    void notifyRgbShotReset(int hour);
+
+private:
+    // Constant after construction.
+    RgbShot* const mRgbShot;
+    RegisterInfo* const mRegisterInfo;
+
+    static Mutex sLock;
+    static SDCImpl* mSDC GUARDED_BY(sLock);
+};
+
+}  // namespace android

@@ -1,0 +1,67 @@
+#include "core/SensorHandlerThread.h"
+
+#include <cstdint>
+#include <limits>
+
+namespace android {
+
+Mutex SensorHandlerThread::sLock;
+SensorHandlerThread* SensorHandlerThread::mHandlerThread = nullptr;
+
+SensorHandlerThread* SensorHandlerThread::getInstance() {
+    Mutex::Autolock lock(sLock);
+    if (mHandlerThread == nullptr) {
+        mHandlerThread = new SensorHandlerThread("sensor_native_handler", 0);
+        // The running loop holds the only other reference: this one keeps the instance, and what
+        // is still posted to it, valid after quit().
+        mHandlerThread->incStrong(nullptr);
+    }
+    return mHandlerThread;
+}
+
+SensorHandlerThread::SensorHandlerThread(const char* name, int priority)
+      : Thread(/*canCallJava=*/true),
+        mLooper(new Looper(/*allowNonCallbacks=*/false)),
+        mQuit(false) {
+    run(name, priority, 0);
+}
+
+SensorHandlerThread::~SensorHandlerThread() {
+    quit();
+}
+
+void SensorHandlerThread::sendMessage(const sp<MessageHandler>& handler, int what) {
+    mLooper->wake();
+    mLooper->sendMessage(handler, Message(what));
+}
+
+void SensorHandlerThread::sendMessageDelayed(const sp<MessageHandler>& handler, int what,
+                                             int delayMs) {
+    mLooper->wake();
+    mLooper->sendMessageDelayed(int64_t{delayMs} * 1'000'000, handler, Message(what));
+}
+
+void SensorHandlerThread::removeMessage(const sp<MessageHandler>& handler, int what) {
+    mLooper->wake();
+    mLooper->removeMessages(handler, what);
+}
+
+void SensorHandlerThread::removeAllMessages(const sp<MessageHandler>& handler) {
+    mLooper->wake();
+    mLooper->removeMessages(handler);
+}
+
+bool SensorHandlerThread::threadLoop() {
+    do {
+        mLooper->pollOnce(std::numeric_limits<int>::max());
+    } while (!mQuit && !exitPending());
+    return false;
+}
+
+void SensorHandlerThread::quit() {
+    if (mQuit) return;
+    mQuit = true;
+    mLooper->wake();
+}
+
+}  // namespace android

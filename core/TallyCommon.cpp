@@ -1,0 +1,88 @@
+#include "core/TallyCommon.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <cstdio>
+#include <utility>
+
+#include <cutils/properties.h>
+#include <unistd.h>
+
+#include "core/CounterProperty.h"
+#include "core/Log.h"
+
+/** Of the device's telemetry library: three NUL-terminated texts. */
+extern "C" void track_event(const char* moduleId, const char* eventId, const char* payload);
+
+namespace android {
+
+Mutex TallyCommon::sLock;
+TallyCommon* TallyCommon::mTallyCommon = nullptr;
+
+TallyCommon* TallyCommon::getInstance() {
+    Mutex::Autolock lock(sLock);
+    if (mTallyCommon == nullptr) mTallyCommon = new TallyCommon;
+    return mTallyCommon;
+}
+
+TallyCommon::TallyCommon() : mModuleId("N273"), mBootFinished(false) {}
+
+void TallyCommon::trackEvent(std::string eventId, std::map<std::string, std::string> params) {
+    setTally({std::move(eventId), convertMapToTally(std::move(params))});
+}
+
+void TallyCommon::setTally(DataWrapper data) {
+    if (mLogSwitch != 0) SENSOR_PRIV_LOGE("SDC Event = %s", data.eventId.c_str());
+    track_event(mModuleId.c_str(), data.eventId.c_str(), data.payload.c_str());
+}
+
+std::string TallyCommon::convertMapToTally(std::map<std::string, std::string> params) {
+    std::string result;
+    for (const auto& [key, value] : params)
+        result.append(key).append(":").append(value).append("&");
+    if (!result.empty()) result.pop_back();
+    return result;
+}
+
+std::string TallyCommon::intToStr(int value) {
+    char text[20] = {};
+    std::snprintf(text, sizeof(text), "%d", value);
+    return text;
+}
+
+std::string TallyCommon::longToStr(long value) {
+    char text[30] = {};
+    std::snprintf(text, sizeof(text), "%ld", value);
+    return text;
+}
+
+void TallyCommon::splitStr(const std::string& text, const std::string& delimiter,
+                           std::vector<std::string>& out) {
+    // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): `text` may lie in `out`
+    const std::string source = text;
+    out.clear();
+    size_t begin = 0;
+    size_t end = delimiter.empty() ? std::string::npos : source.find_first_of(delimiter);
+    while (end != std::string::npos) {
+        out.push_back(source.substr(begin, end - begin));
+        begin = end + delimiter.size();
+        end = source.find(delimiter, begin);
+    }
+    out.push_back(source.substr(std::min(begin, source.size())));
+}
+
+void TallyCommon::BootNotFinish() {
+    while (!mBootFinished) {
+        char text[PROP_VALUE_MAX] = {};
+        property_get("service.bootanim.exit", text, "unkown");
+        int32_t exited = 0;
+        parseInt32(text, &exited);
+        if (exited == 1) {
+            mBootFinished = true;
+            return;
+        }
+        usleep(200'000);
+    }
+}
+
+}  // namespace android

@@ -1,0 +1,85 @@
+#include "replay/Library.h"
+
+#include <type_traits>
+#include <utility>
+
+namespace replay {
+
+namespace {
+
+/** Turns what the trace gives into what the operation takes. */
+template <typename Parameter, typename Given>
+decltype(auto) convert(const Given& given) {
+    using Type = std::decay_t<Parameter>;
+    if constexpr (std::is_same_v<Type, android::String8>) {
+        return android::String8(given.c_str());
+    } else if constexpr (std::is_same_v<Type, android::Vector<int>>) {
+        android::Vector<int> list;
+        list.appendArray(given.data(), given.size());
+        return list;
+    } else {
+        return static_cast<const Given&>(given);
+    }
+}
+
+template <typename Class, typename Result, typename... Parameters, size_t... I>
+std::optional<std::string> call(Result (Class::*operation)(Parameters...),
+                                [[maybe_unused]] const std::vector<Argument>& arguments,
+                                std::index_sequence<I...>) {
+    Class* object = Class::getInstance();
+    auto invoke = [&] {
+        return (object->*operation)(convert<Parameters>(
+                std::get<typename ArgumentFor<std::decay_t<Parameters>>::type>(arguments[I]))...);
+    };
+    if constexpr (std::is_void_v<Result>) {
+        invoke();
+        return std::nullopt;
+    } else if constexpr (std::is_same_v<Result, bool>) {
+        return invoke() ? "true" : "false";
+    } else {
+        return std::to_string(invoke());
+    }
+}
+
+/** `Operation` is a member of a singleton, or `getInstance` itself. */
+template <auto Operation>
+std::optional<std::string> call(const std::vector<Argument>& arguments) {
+    if constexpr (std::is_member_function_pointer_v<decltype(Operation)>) {
+        using Arguments = typename ArgumentsOf<decltype(Operation)>::type;
+        return call(Operation, arguments, std::make_index_sequence<std::tuple_size_v<Arguments>>());
+    } else {
+        Operation();
+        return std::nullopt;
+    }
+}
+
+std::optional<std::string> callByIndex(size_t index, const std::vector<Argument>& arguments) {
+    constexpr std::optional<std::string> (*kCalls[])(const std::vector<Argument>&) = {
+#define CALL(Class, operation) call<&android::Class::operation>,
+#define VARIABLE(name)
+#include "replay/library.inc"
+#undef CALL
+#undef VARIABLE
+    };
+    return kCalls[index](arguments);
+}
+
+void setByIndex(size_t index, int32_t value) {
+    constexpr void (*kSetters[])(int32_t) = {
+#define CALL(Class, operation)
+#define VARIABLE(name) [](int32_t number) { ::name = static_cast<decltype(::name)>(number); },
+#include "replay/library.inc"
+#undef CALL
+#undef VARIABLE
+    };
+    kSetters[index](value);
+}
+
+}  // namespace
+
+extern "C" const Library* sensor_replay_library() {
+    static constexpr Library kLibrary{callByIndex, setByIndex};
+    return &kLibrary;
+}
+
+}  // namespace replay

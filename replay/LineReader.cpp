@@ -1,0 +1,85 @@
+#include "replay/LineReader.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+
+#include <sys/mman.h>
+#include <unistd.h>
+
+namespace replay {
+
+namespace {
+
+constexpr size_t kBlock = size_t{256} << 10;
+constexpr size_t kCapacity = LineReader::kMaxLine + kBlock;
+
+/** Pages of shared memory that are never touched cost nothing. */
+void* mapShared(size_t size) {
+    void* memory = mmap(nullptr, size, PROT_READ | PROT_WRITE,
+                        MAP_SHARED | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
+    return memory == MAP_FAILED ? nullptr : memory;
+}
+
+}  // namespace
+
+LineReader::LineReader(int fd)
+      : mFd(fd),
+        mState(static_cast<State*>(mapShared(sizeof(State) + kCapacity + kPadding))) {
+    if (mState == nullptr) mError = std::strerror(errno);
+}
+
+LineReader::~LineReader() {
+    if (mState != nullptr) munmap(mState, sizeof(State) + kCapacity + kPadding);
+    close(mFd);
+}
+
+std::optional<std::string_view> LineReader::next() {
+    if (mError) return std::nullopt;
+    ++mState->lineNumber;
+    size_t searched = 0;
+    for (;;) {
+        char* const begin = buffer() + mState->begin;
+        const size_t unread = mState->end - mState->begin;
+        const void* feed = std::memchr(begin + searched, '\n', unread - searched);
+        if (feed == nullptr && !mState->ended) {
+            searched = unread;
+            if (!fill()) return std::nullopt;
+            continue;
+        }
+        if (feed == nullptr && unread == 0) return std::nullopt;
+        const size_t length = feed == nullptr
+                                      ? unread
+                                      : static_cast<size_t>(static_cast<const char*>(feed) - begin);
+        mState->begin += std::min(length + 1, unread);
+        return std::string_view(begin, length);
+    }
+}
+
+bool LineReader::hasLine() const {
+    return mState == nullptr || mState->ended ||
+           std::memchr(buffer() + mState->begin, '\n', mState->end - mState->begin) != nullptr;
+}
+
+bool LineReader::fill() {
+    std::memmove(buffer(), buffer() + mState->begin, mState->end - mState->begin);
+    mState->end -= mState->begin;
+    mState->begin = 0;
+    if (mState->end >= kMaxLine) {
+        mError = "the line is longer than 64 MiB";
+        return false;
+    }
+    ssize_t count;
+    do {
+        count = read(mFd, buffer() + mState->end, kBlock);
+    } while (count < 0 && errno == EINTR);
+    if (count < 0) {
+        mError = std::string("cannot read: ") + std::strerror(errno);
+        return false;
+    }
+    mState->ended = count == 0;
+    mState->end += static_cast<size_t>(count);
+    return true;
+}
+
+}  // namespace replay

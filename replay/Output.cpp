@@ -1,0 +1,113 @@
+#include "replay/Output.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+
+#include <json/json.h>
+#include <unistd.h>
+
+#include "replay/VirtualClock.h"
+
+namespace replay {
+
+namespace {
+
+constexpr size_t kFlushSize = size_t{64} << 10;
+constexpr int64_t kNsPerMs = 1'000'000;
+
+/** The clock as a person reads it: the day since the boot and the time of that day. */
+std::string formatClock(int64_t ns) {
+    const auto ms = static_cast<long long>(ns / kNsPerMs);
+    char text[64];
+    int length = std::snprintf(text, sizeof(text), "day %lld %02lld:%02lld:%02lld.%03lld",
+                               ms / 86'400'000 + 1, ms / 3'600'000 % 24, ms / 60'000 % 60,
+                               ms / 1000 % 60, ms % 1000);
+    if (const auto rest = static_cast<int>(ns % kNsPerMs)) {
+        length += std::snprintf(text + length, sizeof(text) - length, "%06d", rest);
+    }
+    return std::string(text, length);
+}
+
+/** `text` with every run of blanks as one: the styled lists are indented for a page. */
+std::string squeezed(std::string_view text) {
+    std::string result;
+    for (const char c : text) {
+        if (c != ' ' || result.empty() || result.back() != ' ') result += c;
+    }
+    return result;
+}
+
+char levelLetter(int level) {
+    constexpr std::string_view kLetters = "??VDIWEFS";
+    return level >= 0 && static_cast<size_t>(level) < kLetters.size() ? kLetters[level] : '?';
+}
+
+}  // namespace
+
+std::string toJson(std::string_view text) {
+    return Json::valueToQuotedString(std::string(text).c_str());
+}
+
+std::string formatMs(int64_t ns) {
+    std::string text = std::to_string(ns / kNsPerMs);
+    if (int64_t rest = ns % kNsPerMs; rest != 0) {
+        const std::string decimals = std::to_string(kNsPerMs + rest).substr(1);
+        text += '.' + decimals.substr(0, decimals.find_last_not_of('0') + 1);
+    }
+    return text;
+}
+
+void Output::boot(std::string_view kind) {
+    line(R"("boot": )" + toJson(kind), "boot", kind);
+}
+
+void Output::event(std::string_view module, std::string_view id, std::string_view payload) {
+    line(R"("event": {"module": )" + toJson(module) + R"(, "id": )" + toJson(id) +
+                 R"(, "payload": )" + toJson(payload) + '}',
+         "event", std::string(id) + "  " + squeezed(payload));
+}
+
+void Output::property(std::string_view name, std::string_view value) {
+    line(R"("property": {"name": )" + toJson(name) + R"(, "value": )" + toJson(value) + '}',
+         "property", std::string(name) + " = " + std::string(value));
+}
+
+void Output::log(int level, std::string_view tag, std::string_view text) {
+    line(R"("log": {"level": )" + std::to_string(level) + R"(, "tag": )" + toJson(tag) +
+                 R"(, "text": )" + toJson(text) + '}',
+         "log", std::string(1, levelLetter(level)) + "  " + std::string(text));
+}
+
+void Output::result(std::string_view call, std::string_view json) {
+    line(R"("result": {"call": )" + toJson(call) + R"(, "value": )" + std::string(json) + '}',
+         "result", std::string(call) + " = " + std::string(json));
+}
+
+void Output::line(std::string_view json, std::string_view kind, std::string_view text) {
+    const int64_t now = virtual_clock::now();
+    if (mFormat == OutputFormat::kJson) {
+        mGathered += R"({"at": )" + formatMs(now) + ", ";
+        mGathered.append(json).append("}\n");
+    } else {
+        mGathered += formatClock(now) + "  ";
+        mGathered.append(kind).append(10 - kind.size(), ' ').append(text).append("\n");
+    }
+    if (mGathered.size() >= kFlushSize) flush();
+}
+
+void Output::flush() {
+    std::string_view rest = mGathered;
+    while (!rest.empty()) {
+        const ssize_t count = write(STDOUT_FILENO, rest.data(), rest.size());
+        if (count < 0 && errno == EINTR) continue;
+        if (count < 0) {
+            std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
+            _exit(1);
+        }
+        rest.remove_prefix(static_cast<size_t>(count));
+    }
+    mGathered.clear();
+}
+
+}  // namespace replay

@@ -1,0 +1,345 @@
+#include "replay/TraceLine.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <type_traits>
+
+#include "platform/PropertyService.h"
+#include "replay/LineReader.h"
+
+namespace replay {
+
+namespace {
+
+using simdjson::dom::array;
+using simdjson::dom::element;
+using simdjson::dom::object;
+using Error = std::optional<std::string>;
+
+/** 285 years; the clock and every wait that the Looper can ask for still fit 63 bits. */
+constexpr int64_t kMaxTimeMs = 9'000'000'000'000;
+constexpr int64_t kNsPerMs = 1'000'000;
+constexpr size_t kMaxDecimals = 6;
+
+std::string quoted(std::string_view text) {
+    return '"' + std::string(text) + '"';
+}
+
+// One reader for each kind of argument.
+
+Error read(element json, bool* value) {
+    return json.get(*value) == simdjson::SUCCESS ? Error() : "must be true or false";
+}
+
+Error read(element json, int64_t* value) {
+    return json.get(*value) == simdjson::SUCCESS ? Error() : "must be an integer of 64 bits";
+}
+
+Error read(element json, int32_t* value) {
+    int64_t wide = 0;
+    if (json.get(wide) != simdjson::SUCCESS || wide != static_cast<int32_t>(wide)) {
+        return "must be an integer of 32 bits";
+    }
+    *value = static_cast<int32_t>(wide);
+    return {};
+}
+
+Error read(element json, std::string* value) {
+    std::string_view text;
+    if (json.get(text) != simdjson::SUCCESS) return "must be a text";
+    if (text.find('\0') != std::string_view::npos) return "must be a text without NUL";
+    value->assign(text);
+    return {};
+}
+
+Error read(element json, IntList* value) {
+    array list;
+    if (json.get(list) != simdjson::SUCCESS) return "must be an array of integers";
+    for (const element item : list) {
+        if (Error error = read(item, &value->emplace_back())) return "each element " + *error;
+    }
+    return {};
+}
+
+[[maybe_unused]] Error read(element json, sensors_event_t* event) {
+    object fields;
+    if (json.get(fields) != simdjson::SUCCESS) return "must be an event";
+    element type;
+    element data;
+    array numbers;
+    if (fields.size() != 2 || fields["type"].get(type) != simdjson::SUCCESS ||
+        fields["data"].get(data) != simdjson::SUCCESS) {
+        return R"(must be an event with "type" and "data")";
+    }
+    if (Error error = read(type, &event->type)) return R"("type" )" + *error;
+    if (data.get(numbers) != simdjson::SUCCESS || numbers.size() > std::size(event->data)) {
+        return R"("data" must be an array of at most 16 numbers)";
+    }
+    float* next = event->data;
+    for (const element item : numbers) {
+        double number = 0;
+        if (item.get(number) != simdjson::SUCCESS) return R"("data" must hold numbers)";
+        *next++ = static_cast<float>(number);
+    }
+    return {};
+}
+
+/** A call or a variable as a trace names it, and how to read what belongs to it. */
+struct Call {
+    std::string_view name;
+    size_t count;
+    Error (*readArgument)(size_t index, element json, int64_t at, Argument* argument);
+};
+
+struct Variable {
+    std::string_view name;
+    Error (*readValue)(element json, int32_t* value);
+};
+
+template <typename T>
+Error readAlternative(element json, int64_t at, Argument* argument) {
+    T value{};
+    if constexpr (std::is_same_v<T, sensors_event_t>) value.timestamp = at;
+    Error error = read(json, &value);
+    *argument = std::move(value);
+    return error;
+}
+
+template <typename Arguments>
+struct ReaderOf;
+template <typename... Types>
+struct ReaderOf<std::tuple<Types...>> {
+    static Error readArgument(size_t index, element json, int64_t at, Argument* argument) {
+        constexpr std::array<Error (*)(element, int64_t, Argument*), sizeof...(Types) + 1> kReaders{
+                readAlternative<Types>..., nullptr};
+        return kReaders[index](json, at, argument);
+    }
+};
+
+template <typename Operation>
+constexpr Call describeCall(std::string_view name) {
+    using Arguments = typename ArgumentsOf<Operation>::type;
+    return {name, std::tuple_size_v<Arguments>, ReaderOf<Arguments>::readArgument};
+}
+
+template <typename Type>
+Error readVariable(element json, int32_t* value) {
+    Type typed{};
+    Error error = read(json, &typed);
+    *value = static_cast<int32_t>(typed);
+    return error;
+}
+
+constexpr Call kCalls[] = {
+#define CALL(Class, operation) \
+    describeCall<decltype(&android::Class::operation)>(#Class "." #operation),
+#define VARIABLE(name)
+#include "replay/library.inc"
+#undef CALL
+#undef VARIABLE
+};
+
+constexpr Variable kVariables[] = {
+#define CALL(Class, operation)
+#define VARIABLE(name) {#name, readVariable<decltype(::name)>},
+#include "replay/library.inc"
+#undef CALL
+#undef VARIABLE
+};
+
+template <typename Entry, size_t Size>
+std::optional<size_t> indexOf(const Entry (&table)[Size], std::string_view name) {
+    const auto* found = std::find_if(std::begin(table), std::end(table),
+                                     [&](const Entry& entry) { return entry.name == name; });
+    if (found == std::end(table)) return std::nullopt;
+    return static_cast<size_t>(found - table);
+}
+
+/** A key that stands twice means two things at once. */
+Error checkKeys(object json) {
+    for (auto field = json.begin(); field != json.end(); ++field) {
+        for (auto other = json.begin(); other != field; ++other) {
+            if (field.key() == other.key()) return "the key " + quoted(field.key()) + " twice";
+        }
+    }
+    return {};
+}
+
+/** The JSON number `digits`, of that value, as milliseconds: in nanoseconds, if they are whole. */
+std::optional<int64_t> toNanoseconds(std::string_view digits, double value) {
+    if (value < 0 || value > static_cast<double>(kMaxTimeMs)) return std::nullopt;
+    if (digits.find_first_of("eE") != std::string_view::npos) {
+        const double time = value * kNsPerMs;
+        return time == std::floor(time) ? std::optional(static_cast<int64_t>(time)) : std::nullopt;
+    }
+    // Read digit by digit: a double does not hold the nanoseconds of a year.
+    const size_t point = digits.find('.');
+    const size_t end = digits.find_last_of(".123456789") + 1;
+    if (end - point - 1 > kMaxDecimals) return std::nullopt;
+    int64_t time = 0;
+    for (size_t i = 0; i < point + 1 + kMaxDecimals; ++i) {
+        if (i == point || digits[i] == '-') continue;
+        time = time * 10 + (i < end ? digits[i] - '0' : 0);
+    }
+    return time;
+}
+
+Error readCall(element json, TraceLine* line) {
+    std::string_view name;
+    if (json.get(name) != simdjson::SUCCESS) return R"("call" must be a text)";
+    const std::optional<size_t> index = indexOf(kCalls, name);
+    if (!index) return "unknown call " + quoted(name);
+    line->action = TraceLine::Action::kCall;
+    line->call = *index;
+    return {};
+}
+
+/** Reads the arguments of `line->call`; none if there is no `json`. */
+Error readArguments(const std::optional<element>& json, TraceLine* line) {
+    const Call& call = kCalls[line->call];
+    array values;
+    if (json && json->get(values) != simdjson::SUCCESS) return R"("args" must be an array)";
+    const size_t given = json ? values.size() : 0;
+    if (given != call.count) {
+        return std::string(call.name) + " takes " + std::to_string(call.count) +
+               " arguments, not " + std::to_string(given);
+    }
+    line->arguments.resize(call.count);
+    size_t index = 0;
+    if (!json) return {};
+    for (const element value : values) {
+        if (Error error = call.readArgument(index, value, line->at, &line->arguments[index])) {
+            return "argument " + std::to_string(index + 1) + " of " + std::string(call.name) + ' ' +
+                   *error;
+        }
+        ++index;
+    }
+    return {};
+}
+
+Error readVariables(element json, TraceLine* line) {
+    line->action = TraceLine::Action::kSet;
+    line->variables.clear();
+    object values;
+    if (json.get(values) != simdjson::SUCCESS) return R"("set" must be an object)";
+    if (Error error = checkKeys(values)) return error;
+    for (const auto [name, value] : values) {
+        const std::optional<size_t> index = indexOf(kVariables, name);
+        if (!index) return "unknown variable " + quoted(name);
+        auto& variable = line->variables.emplace_back(*index, 0);
+        if (Error error = kVariables[*index].readValue(value, &variable.second)) {
+            return quoted(name) + ' ' + *error;
+        }
+    }
+    return {};
+}
+
+Error readProperties(element json, TraceLine* line) {
+    line->action = TraceLine::Action::kProperty;
+    line->properties.clear();
+    object values;
+    if (json.get(values) != simdjson::SUCCESS) return R"("property" must be an object)";
+    if (Error error = checkKeys(values)) return error;
+    for (const auto [name, value] : values) {
+        auto& property = line->properties.emplace_back(name, std::nullopt);
+        if (name.find('\0') != std::string_view::npos) return "a property's name holds a NUL";
+        if (!value.is_null()) {
+            if (Error error = read(value, &property.second.emplace())) {
+                return quoted(name) + ' ' + *error + " or null";
+            }
+        }
+        if (Error error = platform::refuseProperty(property.first, property.second.value_or(""))) {
+            return quoted(name) + ": " + *error;
+        }
+    }
+    return {};
+}
+
+Error readBoot(element json, TraceLine* line) {
+    line->action = TraceLine::Action::kBoot;
+    std::string_view kind;
+    if (json.get(kind) == simdjson::SUCCESS && kind == "device") {
+        line->boot = BootKind::kDevice;
+    } else if (json.get(kind) == simdjson::SUCCESS && kind == "process") {
+        line->boot = BootKind::kProcess;
+    } else {
+        return R"("boot" must be "device" or "process")";
+    }
+    return {};
+}
+
+}  // namespace
+
+std::string_view callName(size_t index) {
+    return kCalls[index].name;
+}
+
+std::optional<std::string> TraceParser::parse(std::string_view text, TraceLine* line) {
+    static_assert(LineReader::kPadding >= simdjson::SIMDJSON_PADDING);
+    element document;
+    object fields;
+    const auto status = mParser.parse(text.data(), text.size(), false).get(document);
+    if (status != simdjson::SUCCESS) {
+        return std::string("not valid JSON: ") + simdjson::error_message(status);
+    }
+    if (document.get(fields) != simdjson::SUCCESS) return "not a JSON object";
+    if (Error error = checkKeys(fields)) return error;
+
+    line->action = TraceLine::Action::kNone;
+    std::optional<element> at;
+    std::optional<element> arguments;
+    int actions = 0;
+    Error error;
+    for (const auto [key, value] : fields) {
+        if (key == "at") {
+            at = value;
+        } else if (key == "args") {
+            arguments = value;
+        } else {
+            ++actions;
+            if (key == "call") {
+                error = readCall(value, line);
+            } else if (key == "set") {
+                error = readVariables(value, line);
+            } else if (key == "property") {
+                error = readProperties(value, line);
+            } else if (key == "boot") {
+                error = readBoot(value, line);
+            } else {
+                error = "unknown key " + quoted(key);
+            }
+        }
+        if (error) return error;
+    }
+    if (actions > 1) return "more than one action";
+    if (!at) return R"("at" is missing)";
+
+    std::optional<int64_t> time;
+    if (int64_t ms = 0; at->get(ms) == simdjson::SUCCESS) {
+        if (ms >= 0 && ms <= kMaxTimeMs) time = ms * kNsPerMs;
+    } else if (at->is_number()) {
+        // The document tree rounds fractions to double; the text has them exactly.
+        auto number =
+                mNumberParser.iterate(text.data(), text.size(), text.size() + LineReader::kPadding);
+        std::string_view digits;
+        double value = 0;
+        if (number["at"].raw_json_token().get(digits) == simdjson::SUCCESS &&
+            at->get(value) == simdjson::SUCCESS) {
+            time = toNanoseconds(digits, value);
+        }
+    }
+    if (!time) return R"("at" must be a number of at most six decimals, from 0 to 9e12)";
+    line->at = *time;
+
+    if (line->action == TraceLine::Action::kCall) return readArguments(arguments, line);
+    if (arguments) return R"("args" without a call)";
+    return {};
+}
+
+bool isSkipped(std::string_view text) {
+    const size_t first = text.find_first_not_of(" \t\r");
+    return first == std::string_view::npos || text[first] == '#';
+}
+
+}  // namespace replay

@@ -1,0 +1,8 @@
+# Debian packages, for the scripts beside this one to source.
+
+# To build the library and sensor-replay.
+BUILD_PACKAGES='g++ cmake ninja-build pkg-config android-libutils-dev android-liblog-dev
+    android-libcutils-dev libjsoncpp-dev libsqlite3-dev libsimdjson-dev libcli11-dev libpng-dev'
+
+# To test them as well.
+TEST_PACKAGES='clang-14 libclang-rt-14-dev clang-format-14 clang-tidy-14 libgtest-dev'

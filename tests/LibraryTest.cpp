@@ -1,0 +1,60 @@
+#include "tests/LibraryTest.h"
+
+#include <sstream>
+#include <utility>
+
+#include <android/log.h>
+#include <cutils/properties.h>
+
+#include "platform/PropertyService.h"
+#include "platform/Telemetry.h"
+#include "replay/VirtualClock.h"
+
+namespace {
+
+/** Never destroyed: the worker thread outlives the test. */
+Lines& transcript() {
+    static auto* const instance = new Lines;
+    return *instance;
+}
+
+template <typename... Parts>
+void note(const Parts&... parts) {
+    std::ostringstream line;
+    line << static_cast<double>(virtual_clock::now()) / 1e6 << ' ';
+    (line << ... << parts);
+    transcript().push_back(line.str());
+}
+
+}  // namespace
+
+LibraryTest::LibraryTest() {
+    __android_log_set_minimum_priority(ANDROID_LOG_VERBOSE);
+    __android_log_set_logger([](const __android_logger_data* data, const char* text) {
+        note("log ", data->priority, ' ', text);
+    });
+    platform::observeEvents([](const char* module, const char* id, const char* payload) {
+        EXPECT_STREQ(module, "N273");
+        note(id, ' ', payload);
+    });
+    platform::observePropertySet(
+            [](const char* name, const char* value) { note(name, '=', value); });
+}
+
+void LibraryTest::advanceTo(double ms) {
+    virtual_clock::advanceTo(static_cast<int64_t>(ms * 1e6));
+}
+
+Lines LibraryTest::taken() {
+    return std::exchange(transcript(), {});
+}
+
+void LibraryTest::setProperty(const std::string& name, const std::string& value) {
+    platform::setDeviceProperty(name, value);
+}
+
+std::string LibraryTest::property(const std::string& name) {
+    char value[PROP_VALUE_MAX];
+    property_get(name.c_str(), value, "");
+    return value;
+}

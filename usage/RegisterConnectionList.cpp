@@ -1,0 +1,171 @@
+#include "usage/RegisterConnectionList.h"
+
+#include <algorithm>
+#include <vector>
+
+#include <json/json.h>
+#include <utils/Timers.h>
+
+#include "core/Arithmetic.h"
+
+namespace android {
+
+namespace {
+
+constexpr int64_t kNoRate = -1;
+constexpr int kDisplayOn = 2;
+constexpr size_t kMaxReported = 50;
+
+void credit(int32_t* seconds, int64_t begin, int64_t end) {
+    *seconds = addWrapped(*seconds, secondsBetween(begin, end));
+}
+
+}  // namespace
+
+RegisterConnectionList::RegisterConnectionList() : mCurrentRate(kNoRate), mDisplayState(-1) {}
+
+RegisterConnectionList::~RegisterConnectionList() = default;
+
+void RegisterConnectionList::update(const std::string& pkg, const std::string& opPkg, bool enable,
+                                    long long rate) {
+    if (enable) {
+        handleEnable(pkg, opPkg, rate);
+    } else {
+        handleDisable(pkg, opPkg);
+    }
+}
+
+void RegisterConnectionList::handleEnable(const std::string& pkg, const std::string& opPkg,
+                                          long long rate) {
+    const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
+    Mutex::Autolock lock(mLock);
+
+    // Only one of those at the current rate earns the time, whoever comes first in the table.
+    bool credited = false;
+    for (auto& [key, info] : mConnections) {
+        if (info.beginTime == 0) continue;
+        if (!credited && info.rate == mCurrentRate) {
+            credit(&info.time, info.beginTime, now);
+            if (isDisplayOn() && info.onBeginTime != 0) credit(&info.ontime, info.onBeginTime, now);
+            credited = true;
+        }
+        info.beginTime = now;
+        if (isDisplayOn()) info.onBeginTime = now;
+    }
+
+    if (mCurrentRate == kNoRate || rate < mCurrentRate) mCurrentRate = rate;
+
+    const auto [it, inserted] = mConnections.try_emplace(pkg + "/" + opPkg);
+    PkgRegInfo& info = it->second;
+    if (inserted) info.rate = rate;
+    info.beginTime = now;
+    if (isDisplayOn()) info.onBeginTime = now;
+    info.enableCount = addWrapped(std::max(info.enableCount, 0), 1);
+}
+
+void RegisterConnectionList::handleDisable(const std::string& pkg, const std::string& opPkg) {
+    const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
+    Mutex::Autolock lock(mLock);
+
+    const auto it = mConnections.find(pkg + "/" + opPkg);
+    if (it == mConnections.end()) return;
+    PkgRegInfo& ended = it->second;
+    ended.enableCount = addWrapped(ended.enableCount, -1);
+    if (ended.enableCount != 0) return;
+
+    if (ended.rate != mCurrentRate) {
+        ended.beginTime = 0;
+        ended.onBeginTime = 0;
+        return;
+    }
+    credit(&ended.time, ended.beginTime, now);
+    ended.beginTime = 0;
+    if (isDisplayOn()) credit(&ended.ontime, ended.onBeginTime, now);
+    ended.onBeginTime = 0;
+
+    mCurrentRate = kNoRate;
+    for (auto& [key, info] : mConnections) {
+        if (info.beginTime == 0) continue;
+        if (mCurrentRate == kNoRate || info.rate < mCurrentRate) mCurrentRate = info.rate;
+        info.beginTime = now;
+        if (isDisplayOn()) info.onBeginTime = now;
+    }
+}
+
+void RegisterConnectionList::setDisplayState(int state) {
+    if (state == mDisplayState) return;
+    mDisplayState = state;
+    handleDisplayStateChanged();
+}
+
+void RegisterConnectionList::handleDisplayStateChanged() {
+    const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
+    Mutex::Autolock lock(mLock);
+
+    if (isDisplayOn()) {
+        for (auto& [key, info] : mConnections) {
+            if (info.beginTime != 0) info.onBeginTime = now;
+        }
+        return;
+    }
+    bool credited = false;
+    for (auto& [key, info] : mConnections) {
+        if (!credited && info.rate == mCurrentRate && info.beginTime != 0 &&
+            info.onBeginTime != 0) {
+            credit(&info.ontime, info.onBeginTime, now);
+            credited = true;
+        }
+        info.onBeginTime = 0;
+    }
+}
+
+std::string RegisterConnectionList::getRegisterConnectionInfo() {
+    std::vector<std::pair<std::string, PkgRegInfo>> ended;
+    {
+        Mutex::Autolock lock(mLock);
+        for (auto it = mConnections.begin(); it != mConnections.end();) {
+            if (it->second.beginTime == 0 && it->second.time != 0) {
+                ended.emplace_back(*it);
+                it = mConnections.erase(it);
+            } else {
+                ++it;
+            }
+        }
+    }
+    // By key first, so that equal times come out alike on every platform.
+    std::sort(ended.begin(), ended.end(),
+              [](const auto& a, const auto& b) { return a.first < b.first; });
+    std::stable_sort(ended.begin(), ended.end(), comp);
+
+    Json::Value root;
+    for (size_t i = 0; i < std::min(ended.size(), kMaxReported); ++i) {
+        const auto& [key, info] = ended[i];
+        Json::Value entry;
+        entry["pkg"] = key;
+        entry["rate"] = std::to_string(static_cast<int32_t>(info.rate));  // the low 32 bits
+        entry["time"] = std::to_string(info.time);
+        entry["ontime"] = std::to_string(info.ontime);
+        root["list"].append(entry);
+    }
+    if (root.isNull()) return {};
+    std::string text = root.toStyledString();
+    text.erase(std::remove(text.begin(), text.end(), '\n'), text.end());
+    text.erase(std::remove(text.begin(), text.end(), '\r'), text.end());
+    return text;
+}
+
+bool RegisterConnectionList::comp(const std::pair<std::string, PkgRegInfo>& a,
+                                  const std::pair<std::string, PkgRegInfo>& b) {
+    return a.second.time > b.second.time;
+}
+
+void RegisterConnectionList::clear() {
+    Mutex::Autolock lock(mLock);
+    mConnections.clear();
+}
+
+bool RegisterConnectionList::isDisplayOn() const {
+    return mDisplayState == kDisplayOn;
+}
+
+}  // namespace android
