@@ -29,11 +29,12 @@ std::string formatClock(int64_t ns) {
     return std::string(text, length);
 }
 
-/** `text` with every run of blanks as one: the styled lists are indented for a page. */
+/** `text` with every run of blanks and tabs as one blank: lists are indented for a page. */
 std::string squeezed(std::string_view text) {
     std::string result;
     for (const char c : text) {
-        if (c != ' ' || result.empty() || result.back() != ' ') result += c;
+        const bool blank = c == ' ' || c == '\t';
+        if (!blank || result.empty() || result.back() != ' ') result += blank ? ' ' : c;
     }
     return result;
 }

@@ -177,6 +177,7 @@ private:
         int status = 0;
         while (waitpid(child, &status, 0) < 0 && errno == EINTR) {}
         if (WIFSIGNALED(status)) {
+            if (WTERMSIG(status) == SIGPIPE) raise(SIGPIPE);  // nobody reads the output any more
             fail(mName + ':' + std::to_string(mReader->lineNumber()) +
                          ": the process died here or just before: " + strsignal(WTERMSIG(status)),
                  kStatusFailed);

@@ -1,0 +1,226 @@
+#include "usage/RegisterInfo.h"
+
+#include <json/json.h>
+
+#include "core/SDCImpl.h"
+#include "tests/LibraryTest.h"
+#include "usage/RegisterConnectionList.h"
+
+namespace android {
+namespace {
+
+/** A span cannot begin at 0 of the clock, which means "not enabled": tests begin later. */
+constexpr double kStartMs = 1000;
+
+/** Drives one list, with times in seconds. Connections are named "PKG/PKG" by one name. */
+class RegisterConnectionListTest : public LibraryTest {
+protected:
+    void enable(double second, const std::string& pkg, long long rate) {
+        advanceTo(kStartMs + second * 1000);
+        mList.update(pkg, pkg, true, rate);
+    }
+
+    void disable(double second, const std::string& pkg) {
+        advanceTo(kStartMs + second * 1000);
+        mList.update(pkg, pkg, false, 0);
+    }
+
+    void display(double second, int state) {
+        advanceTo(kStartMs + second * 1000);
+        mList.setDisplayState(state);
+    }
+
+    /** What the list reports, a line each: "a 10 s on 5 s at 20000" for the connection "a/a". */
+    Lines reported() {
+        Lines lines;
+        const std::string text = mList.getRegisterConnectionInfo();
+        EXPECT_EQ(text.find_first_of("\n\r"), std::string::npos);
+        Json::Value root;
+        EXPECT_TRUE(text.empty() || Json::Reader().parse(text, root));
+        for (const Json::Value& entry : root["list"]) {
+            const std::string key = entry["pkg"].asString();
+            lines.push_back(key.substr(0, key.find('/')) + ' ' + entry["time"].asString() +
+                            " s on " + entry["ontime"].asString() + " s at " +
+                            entry["rate"].asString());
+        }
+        return lines;
+    }
+
+    RegisterConnectionList mList;
+};
+
+TEST_F(RegisterConnectionListTest, CreditsTimeToWhoeverSetsTheRate) {
+    enable(0, "a", 20000);
+    enable(10, "b", 5000);
+    disable(40.9, "b");
+    disable(45.9, "a");
+    EXPECT_EQ(reported(), (Lines{"b 30 s on 0 s at 5000", "a 15 s on 0 s at 20000"}));
+    EXPECT_EQ(reported(), (Lines{}));
+}
+
+TEST_F(RegisterConnectionListTest, ASlowerConnectionThatEndsFirstEarnsNothing) {
+    enable(0, "fast", 5000);
+    enable(10, "slow", 20000);
+    disable(100, "slow");
+    disable(110, "fast");
+    EXPECT_EQ(reported(), (Lines{"fast 110 s on 0 s at 5000"}));
+}
+
+TEST_F(RegisterConnectionListTest, CountsEnablesOfOneConnectionAndKeepsItsFirstRate) {
+    enable(0, "a", 20000);
+    enable(10, "a", 5000);  // lowers the current rate: "a" itself no longer holds it
+    disable(20, "a");
+    disable(30, "a");
+    EXPECT_EQ(reported(), (Lines{"a 10 s on 0 s at 20000"}));
+
+    disable(40, "a");  // unknown by now
+    enable(50, "b", 5000);
+    disable(60, "b");
+    disable(70, "b");  // its count falls to -1, which the next enable makes 1
+    enable(80, "b", 5000);
+    disable(90, "b");
+    EXPECT_EQ(reported(), (Lines{"b 20 s on 0 s at 5000"}));
+}
+
+TEST_F(RegisterConnectionListTest, CreditsOnlyOneOfSeveralAtTheCurrentRate) {
+    enable(0, "a", 5000);
+    enable(10, "b", 5000);
+    enable(30, "c", 5000);
+    mList.update("a", "a", false, 0);
+    mList.update("b", "b", false, 0);
+    mList.update("c", "c", false, 0);
+    // 10 s were "a" alone; the next 20 s belong to "a" or to "b", whichever the table has first.
+    const Lines lines = reported();
+    EXPECT_TRUE(lines == (Lines{"a 30 s on 0 s at 5000"}) ||
+                lines == (Lines{"b 20 s on 0 s at 5000", "a 10 s on 0 s at 5000"}));
+}
+
+TEST_F(RegisterConnectionListTest, CountsTheTimeThatTheDisplayIsOn) {
+    enable(0, "a", 20000);
+    display(5, 2);
+    display(5.5, 2);
+    display(45, 1);
+    display(50, 3);
+    display(60, 2);
+    disable(70, "a");
+    display(80, 2);
+    enable(90, "b", 5000);
+    display(95, 0);
+    disable(100, "b");
+    EXPECT_EQ(reported(), (Lines{"a 70 s on 50 s at 20000", "b 10 s on 5 s at 5000"}));
+}
+
+TEST_F(RegisterConnectionListTest, TheResetKeepsTheCurrentRateThatNobodyHolds) {
+    enable(0, "a", 5000);
+    mList.clear();
+    enable(10, "b", 20000);
+    disable(3610, "b");
+    EXPECT_EQ(reported(), (Lines{}));
+    enable(4000, "c", 5000);
+    disable(4010, "c");  // ends at the rate: it is found anew, and the next one counts
+    enable(4100, "d", 20000);
+    disable(4120, "d");
+    EXPECT_EQ(reported(), (Lines{"d 20 s on 0 s at 20000", "c 10 s on 0 s at 5000"}));
+}
+
+TEST_F(RegisterConnectionListTest, ReportsTheFiftyLongestAndDropsTheOthers) {
+    for (int i = 1; i <= 70; ++i) {
+        enable(1000 * i, "app" + std::to_string(i), 4294967296 + i);
+        disable(1000 * i + i, "app" + std::to_string(i));
+    }
+    enable(80000, "running", 1);
+    const Lines lines = reported();
+    ASSERT_EQ(lines.size(), 50u);
+    EXPECT_EQ(lines.front(), "app70 70 s on 0 s at 70");  // the low 32 bits of the rate
+    EXPECT_EQ(lines.back(), "app21 21 s on 0 s at 21");
+    EXPECT_EQ(reported(), (Lines{}));
+}
+
+TEST_F(RegisterConnectionListTest, LaysOutTheListAsOneStyledLine) {
+    enable(0, "a", 20000);
+    disable(1, "a");
+    EXPECT_EQ(mList.getRegisterConnectionInfo(),
+              "{\t\"list\" : \t[\t\t{\t\t\t\"ontime\" : \"0\",\t\t\t\"pkg\" : \"a/a\","
+              "\t\t\t\"rate\" : \"20000\",\t\t\t\"time\" : \"1\"\t\t}\t]}");
+}
+
+/** The facade's routes to the registrations and the sample count. */
+class SDCImplTest : public LibraryTest {
+protected:
+    void connect(double second, bool enabled, int type, const char* pkg) {
+        advanceTo(kStartMs + second * 1000);
+        mSdc->enableSuccess(enabled, type, pkg, "op", 1000);
+    }
+
+    SDCImpl* const mSdc = SDCImpl::getInstance();
+};
+
+TEST_F(SDCImplTest, RoutesFourSensorTypesToTwoDailyReports) {
+    for (int type : {0, 1, 4, 5, 16, 35, 36, -1}) {
+        const std::string pkg = "t" + std::to_string(type);
+        connect(10, true, type, pkg.c_str());
+        connect(20 + type, false, type, pkg.c_str());
+    }
+    for (int hour = 0; hour < 24; ++hour) mSdc->notifySdcClock(hour);
+    EXPECT_EQ(taken(), (Lines{}));  // posted, not sent at once
+    advanceTo(60'000);
+    const Lines lines = taken();
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_NE(lines[0].find("N273|10003 app_list:{"), std::string::npos);
+    EXPECT_NE(lines[0].find("\"t1/op\""), std::string::npos);
+    EXPECT_NE(lines[0].find("\"t35/op\""), std::string::npos);
+    EXPECT_NE(lines[1].find("N273|10004 app_list:{"), std::string::npos);
+    EXPECT_NE(lines[1].find("\"t4/op\""), std::string::npos);
+    EXPECT_NE(lines[1].find("\"t16/op\""), std::string::npos);
+}
+
+TEST_F(SDCImplTest, ACleanUpIsADisable) {
+    connect(0, true, 1, "pkg");
+    advanceTo(kStartMs + 5000);
+    mSdc->cleanupConnection(String8("pkg"), String8("op"), 1);
+    mSdc->notifySdcClock(23);
+    advanceTo(kStartMs + 6000);
+    EXPECT_EQ(taken().size(), 1u);
+}
+
+TEST_F(SDCImplTest, AResetThatFollowsItsTickAtOnceOvertakesTheReport) {
+    connect(0, true, 1, "pkg");
+    connect(10, false, 1, "pkg");
+    mSdc->notifySdcReset(22);
+    mSdc->notifySdcClock(23);
+    mSdc->notifySdcReset(23);
+    advanceTo(20'000);
+    EXPECT_EQ(taken(), (Lines{}));
+}
+
+TEST_F(SDCImplTest, TakesTheDisplayStateFromWholeNotificationsOfItsKind) {
+    const auto notify = [this](std::initializer_list<int> values) {
+        Vector<int> list;
+        for (int value : values) list.add(value);
+        mSdc->setNotification(list);
+    };
+    connect(0, true, 1, "pkg");
+    notify({});
+    notify({2, 0});
+    notify({2, 0, 2});
+    advanceTo(kStartMs + 10'000);
+    notify({3, 0, 1});
+    advanceTo(kStartMs + 20'000);
+    notify({2, 7, 1, 9});
+    connect(30, false, 1, "pkg");
+    mSdc->notifySdcClock(23);
+    advanceTo(40'000);
+    EXPECT_NE(taken().at(0).find("\"ontime\" : \"20\""), std::string::npos);
+}
+
+TEST_F(SDCImplTest, ReportsAndResetsTheSampleCountAtSevenOnly) {
+    mSdc->setRgbShotCount();
+    for (int hour = 0; hour < 24; ++hour) mSdc->putRgbShotTally(hour);
+    mSdc->setRgbShotCount();
+    for (int hour = 0; hour < 24; ++hour) mSdc->notifyRgbShotReset(hour);
+    mSdc->putRgbShotTally(7);
+    EXPECT_EQ(taken(), (Lines{"0 N273|10009 count:1", "0 N273|10009 count:0"}));
+}
+
+}  // namespace
+}  // namespace android

@@ -1,0 +1,125 @@
+#include "core/SensorHandlerThread.h"
+
+#include <functional>
+#include <limits>
+#include <thread>
+#include <utility>
+#include <vector>
+
+#include "replay/VirtualClock.h"
+#include "tests/LibraryTest.h"
+
+namespace android {
+namespace {
+
+/** Notes each message with its time: "500 a3" for code 3 of the handler "a", 500 ms after 0. */
+class Recorder : public MessageHandler {
+public:
+    Recorder(std::string name, Lines* lines) : mName(std::move(name)), mLines(lines) {}
+
+    void handleMessage(const Message& message) override {
+        mLines->push_back(std::to_string(virtual_clock::now() / 1'000'000) + ' ' + mName +
+                          std::to_string(message.what));
+        if (onMessage) onMessage(message.what);
+    }
+
+    std::function<void(int)> onMessage;
+
+private:
+    const std::string mName;
+    Lines* const mLines;
+};
+
+class SensorHandlerThreadTest : public LibraryTest {
+protected:
+    SensorHandlerThread* const mThread = SensorHandlerThread::getInstance();
+    Lines mLines;
+    const sp<Recorder> mA = new Recorder("a", &mLines);
+    const sp<Recorder> mB = new Recorder("b", &mLines);
+};
+
+TEST_F(SensorHandlerThreadTest, RunsMessagesAtTheirTimesAndEqualTimesInOrderOfPosting) {
+    mThread->sendMessageDelayed(mA, 1, 500);
+    mThread->sendMessageDelayed(mB, 2, 200);
+    mThread->sendMessageDelayed(mA, 3, 200);
+    mThread->sendMessage(mB, 4);
+    mThread->sendMessageDelayed(mA, 5, 0);
+    advanceTo(200);
+    EXPECT_EQ(mLines, (Lines{"0 b4", "0 a5", "200 b2", "200 a3"}));
+    advanceTo(499);
+    EXPECT_EQ(mLines.size(), 4u);
+    advanceTo(1000);
+    EXPECT_EQ(mLines.back(), "500 a1");
+}
+
+TEST_F(SensorHandlerThreadTest, ANegativeDelayIsDueAtOnceAndTheLongestDelayDoesNotOverflow) {
+    mThread->sendMessageDelayed(mA, 1, std::numeric_limits<int>::max());
+    mThread->sendMessageDelayed(mA, 2, -5);
+    advanceTo(2147483646);
+    EXPECT_EQ(mLines, (Lines{"0 a2"}));
+    advanceTo(2147483647);
+    EXPECT_EQ(mLines.back(), "2147483647 a1");
+}
+
+TEST_F(SensorHandlerThreadTest, RemovesAllMessagesOfACodeOrOfAHandlerAndNoOthers) {
+    for (int delayMs : {0, 10, 20}) {
+        mThread->sendMessageDelayed(mA, 1, delayMs);
+        mThread->sendMessageDelayed(mA, 2, delayMs);
+        mThread->sendMessageDelayed(mB, 1, delayMs);
+    }
+    mThread->removeMessage(mA, 1);
+    advanceTo(10);
+    EXPECT_EQ(mLines, (Lines{"0 a2", "0 b1", "10 a2", "10 b1"}));
+    mThread->removeAllMessages(mA);
+    advanceTo(20);
+    EXPECT_EQ(mLines.size(), 5u);
+    EXPECT_EQ(mLines.back(), "20 b1");
+}
+
+TEST_F(SensorHandlerThreadTest, AHandlerMayPostAgainFromTheWorker) {
+    mA->onMessage = [this](int what) {
+        if (what < 3) mThread->sendMessageDelayed(mA, what + 1, 100);
+    };
+    mThread->sendMessageDelayed(mA, 1, 50);
+    advanceTo(1000);
+    EXPECT_EQ(mLines, (Lines{"50 a1", "150 a2", "250 a3"}));
+}
+
+TEST_F(SensorHandlerThreadTest, FractionsWaitForWholeMillisecondsFromTheStartOfTheWait) {
+    mThread->sendMessageDelayed(mA, 1, 100);
+    advanceTo(0.25);
+    mThread->sendMessageDelayed(mB, 9, 5000);  // wakes the loop, which waits anew: 100 ms
+    advanceTo(100);
+    EXPECT_EQ(mLines, (Lines{}));
+    advanceTo(100.25);
+    EXPECT_EQ(mLines, (Lines{"100 a1"}));
+}
+
+TEST_F(SensorHandlerThreadTest, AfterQuittingNothingIsDelivered) {
+    mThread->sendMessageDelayed(mA, 1, 100);
+    advanceTo(50);
+    mThread->quit();
+    mThread->quit();
+    mThread->sendMessage(mA, 2);
+    advanceTo(1000);
+    mThread->sendMessage(mA, 3);
+    advanceTo(2000);
+    // What was due when the loop was told to end still ran in its last turn.
+    EXPECT_EQ(mLines, (Lines{"50 a2"}));
+    EXPECT_FALSE(mThread->isRunning());
+}
+
+TEST(SensorHandlerThreadInstanceTest, IsTheSameForAllThreadsThatAskFirst) {
+    std::vector<SensorHandlerThread*> instances(4);
+    std::vector<std::thread> threads;
+    threads.reserve(instances.size());
+    for (SensorHandlerThread*& instance : instances) {
+        threads.emplace_back([&instance] { instance = SensorHandlerThread::getInstance(); });
+    }
+    for (std::thread& thread : threads) thread.join();
+    EXPECT_EQ(instances, std::vector(4, SensorHandlerThread::getInstance()));
+    EXPECT_TRUE(instances[0]->isRunning());
+}
+
+}  // namespace
+}  // namespace android

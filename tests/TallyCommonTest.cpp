@@ -1,0 +1,85 @@
+#include "core/TallyCommon.h"
+
+#include <limits>
+#include <utility>
+
+#include <unistd.h>
+
+#include "core/Log.h"
+#include "platform/PropertyService.h"
+#include "tests/LibraryTest.h"
+
+namespace {
+
+/** How often the library napped; the boot animation ends during the third nap. */
+int naps = 0;
+
+}  // namespace
+
+/** The library's only sleep: it wakes at once here, so that no test waits. */
+extern "C" int usleep(useconds_t us) {
+    EXPECT_EQ(us, 200'000u);
+    constexpr const char* kStates[] = {"0", "unkown", "1"};
+    platform::setDeviceProperty("service.bootanim.exit", kStates[naps++]);
+    return 0;
+}
+
+namespace android {
+namespace {
+
+class TallyCommonTest : public LibraryTest {
+protected:
+    TallyCommon* const mTally = TallyCommon::getInstance();
+};
+
+TEST_F(TallyCommonTest, SendsPairsInBytewiseOrderOfTheirKeysUnescaped) {
+    mTally->trackEvent("N273|10013", {{"a", "1:2&3"}, {"Z", ""}, {"9", "nine"}, {"10", "ten"}});
+    mTally->trackEvent("N273|10009", {{"count", "3"}});
+    EXPECT_EQ(taken(), (Lines{"0 N273|10013 10:ten&9:nine&Z:&a:1:2&3", "0 N273|10009 count:3"}));
+    EXPECT_EQ(mTally->convertMapToTally({}), "");
+}
+
+TEST_F(TallyCommonTest, LogsTheEventIdWhileDetailedLoggingIsOn) {
+    mLogSwitch = 1;
+    mTally->setTally({"N273|10010", "a:1"});
+    EXPECT_EQ(taken(), (Lines{"0 log 6 SDC Event = N273|10010", "0 N273|10010 a:1"}));
+}
+
+TEST_F(TallyCommonTest, CutsATextAtItsDelimiterAndKeepsEmptyPieces) {
+    const std::vector<std::tuple<std::string, std::string, Lines>> cases{
+            {"1_2__3", "_", {"1", "2", "", "3"}},
+            {"1_2_", "_", {"1", "2", ""}},
+            {"_", "_", {"", ""}},
+            {"", "_", {""}},
+            {"abc", "_", {"abc"}},
+            {"a_b", "", {"a_b"}},
+            // A delimiter of several characters is looked for by any of them the first time.
+            {"a-b<->c", "<->", {"a", "->c"}},
+            {"a>", "<->", {"a", ""}},
+    };
+    for (const auto& [text, delimiter, expected] : cases) {
+        Lines pieces{"old"};
+        mTally->splitStr(text, delimiter, pieces);
+        EXPECT_EQ(pieces, expected) << '"' << text << "\" at \"" << delimiter << '"';
+    }
+    Lines pieces{"1_2"};
+    mTally->splitStr(pieces[0], "_", pieces);
+    EXPECT_EQ(pieces, (Lines{"1", "2"}));
+}
+
+TEST_F(TallyCommonTest, WritesNumbersInDecimal) {
+    EXPECT_EQ(mTally->intToStr(std::numeric_limits<int>::min()), "-2147483648");
+    EXPECT_EQ(mTally->longToStr(0), "0");
+    EXPECT_EQ(mTally->longToStr(2147483647L), "2147483647");
+}
+
+TEST_F(TallyCommonTest, WaitsForTheEndOfTheBootAnimationOnce) {
+    mTally->BootNotFinish();
+    EXPECT_EQ(naps, 3);
+    setProperty("service.bootanim.exit", "0");
+    mTally->BootNotFinish();
+    EXPECT_EQ(naps, 3);
+}
+
+}  // namespace
+}  // namespace android
