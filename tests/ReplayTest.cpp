@@ -1,0 +1,222 @@
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "tests/ReplayTool.h"
+
+namespace {
+
+using Lines = std::vector<std::string>;
+
+const std::string kCount = "persist.zuno.rgb.shot.count";
+
+/** The output line of the count's save. */
+std::string saved(const std::string& at, int count) {
+    return R"({"at": )" + at + R"(, "property": {"name": ")" + kCount + R"(", "value": ")" +
+           std::to_string(count) + R"("}})";
+}
+
+/** The output line of the count's report. */
+std::string reported(const std::string& at, int count) {
+    return R"({"at": )" + at +
+           R"(, "event": {"module": "N273", "id": "N273|10009", "payload": "count:)" +
+           std::to_string(count) + R"("}})";
+}
+
+/** A trace's line that counts a sample, or reports the count. */
+std::string sample(const std::string& at) {
+    return R"({"at": )" + at +
+           R"(, "call": "SDCImpl.setRgbShotCount"})"
+           "\n";
+}
+
+std::string report(const std::string& at) {
+    return R"({"at": )" + at +
+           R"(, "call": "SDCImpl.putRgbShotTally", "args": [7]})"
+           "\n";
+}
+
+class ReplayTest : public ReplayToolTest {};
+
+TEST_F(ReplayTest, RunsWhatIsDueBeforeALineAndHoldsTheWorkerWithinAMoment) {
+    // The load is due at 2000, the save at 2500; the report at 2500 finds the saved count, and its
+    // reset comes before a save of the same moment's sample.
+    const Played played = play(sample("0") + sample("2000") + report("2500") + sample("2500") +
+                               report("2500") + R"({"at": 9000})");
+    EXPECT_EQ(happened(played), (Lines{saved("500", 1), saved("2500", 2), reported("2500", 2),
+                                       reported("2500", 1), saved("3000", 0)}));
+    EXPECT_EQ(played.status, 0);
+}
+
+TEST_F(ReplayTest, EndsAtTheLastLineWithWhatIsDueAtThatMoment) {
+    EXPECT_EQ(happened(play(sample("0") + R"({"at": 500})")), (Lines{saved("500", 1)}));
+    EXPECT_EQ(happened(play(sample("0") + R"({"at": 499.999999})")), (Lines{}));
+}
+
+TEST_F(ReplayTest, WritesFractionsOfMillisecondsAsTheyAre) {
+    EXPECT_EQ(happened(play(report("0.1") + report("8999999999999.5"))),
+              (Lines{reported("0.1", 0), reported("8999999999999.5", 0)}));
+    EXPECT_EQ(happened(play(report("0.000001") + report("1e3") + report("86400000000.123456"))),
+              (Lines{reported("0.000001", 0), reported("1000", 0),
+                     reported("86400000000.123456", 0)}));
+}
+
+TEST_F(ReplayTest, AProcessBootKeepsTheClockAndThePropertiesADeviceBootOnlyWhatPersists) {
+    const std::string properties =
+            R"({"at": 0, "property": {"persist.zuno.rgb.shot.count": "7", "sys.x": "1"}})"
+            "\n";
+    const Played played = play(properties + sample("1000") +
+                               R"({"at": 1500, "boot": "process"})"
+                               "\n" +
+                               sample("1500") +
+                               R"({"at": 1500, "boot": "process"})"
+                               "\n" +
+                               R"({"at": 1500, "call": "SDCImpl.getInstance"})"
+                               "\n" +
+                               report("3500") + sample("3600") +
+                               R"({"at": 7, "boot": "device"})"
+                               "\n" +
+                               report("8"));
+    // What was due at 1500 ran before the boot line; what the process posted at 1500 is lost with
+    // it.
+    EXPECT_EQ(played.out, R"({"at": 0, "boot": "device"})"
+                          "\n" + saved("1500", 1) +
+                                  "\n" +
+                                  R"({"at": 1500, "boot": "process"})"
+                                  "\n" +
+                                  R"({"at": 1500, "boot": "process"})"
+                                  "\n" +
+                                  reported("3500", 1) + "\n" +
+                                  R"({"at": 7, "boot": "device"})"
+                                  "\n" +
+                                  reported("8", 0) + "\n");
+}
+
+TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
+    write("one", sample("100") + R"({"at": 700})");
+    write("two", "# nothing\n");
+    write("three", R"({"at": 5, "call": "SDCImpl.getInstance"})"
+                   "\n" + report("2005"));
+    const std::string expected = R"({"at": 100, "boot": "device"})"
+                                 "\n" +
+                                 saved("600", 1) + "\n" +
+                                 R"({"at": 5, "boot": "device"})"
+                                 "\n" +
+                                 reported("2005", 1) + "\n";
+    EXPECT_EQ(run("--json one two three").out, expected);
+    EXPECT_EQ(run("--json one - three", "\n").out, expected);
+    EXPECT_EQ(run("--json --properties store one").status, 0);
+    EXPECT_EQ(run("--json --properties store three").out, R"({"at": 5, "boot": "device"})"
+                                                          "\n" + reported("2005", 1) +
+                                                                  "\n");
+}
+
+TEST_F(ReplayTest, SetsVariablesAndPrintsTheLog) {
+    const Played played = play(R"({"at": 0, "set": {"mLogSwitch": 1}})"
+                               "\n" +
+                               report("0"));
+    EXPECT_EQ(happened(played).at(0), R"({"at": 0, "log": {"level": 6, "tag": "_Z_ZSensorFusion", )"
+                                      R"("text": "SDC Event = N273|10009"}})");
+}
+
+TEST_F(ReplayTest, LaysOutLinesForAPerson) {
+    write("trace", sample("86400000") + report("86410000.5"));
+    EXPECT_EQ(run("trace").out,
+              "day 2 00:00:00.000  boot      device\n"
+              "day 2 00:00:00.500  property  persist.zuno.rgb.shot.count = 1\n"
+              "day 2 00:00:10.000500000  event     N273|10009  count:1\n");
+}
+
+TEST_F(ReplayTest, JudgesEachLineAndKeepsWhatWasDoneBeforeABadOne) {
+    const std::vector<std::pair<std::string, std::string>> cases{
+            {"nonsense", "not valid JSON"},
+            {"[1]", "not a JSON object"},
+            {R"({"at": 1} {"at": 2})", "not valid JSON"},
+            {"{\"at\": 1, \"property\": {\"\xff\": \"\"}}", "not valid JSON"},
+            {R"({"call": "SDCImpl.getInstance"})", R"("at" is missing)"},
+            {R"({"at": "1"})", R"("at" must be)"},
+            {R"({"at": -1})", R"("at" must be)"},
+            {R"({"at": 1.0000001})", R"("at" must be)"},
+            {R"({"at": 9000000000001})", R"("at" must be)"},
+            {R"({"at": 0})", R"("at" goes back, from 1 to 0)"},
+            {R"({"at": 0, "boot": "process"})", R"("at" goes back, from 1 to 0)"},
+            {R"({"at": 1, "at": 2})", R"(the key "at" twice)"},
+            {R"({"at": 1, "what": 1})", R"(unknown key "what")"},
+            {R"({"at": 1, "boot": "device", "set": {}})", "more than one action"},
+            {R"({"at": 1, "boot": "cold"})", R"("boot" must be)"},
+            {R"({"at": 1, "args": []})", R"("args" without a call)"},
+            {R"({"at": 1, "call": "SDCImpl.nothing"})", R"(unknown call "SDCImpl.nothing")"},
+            {R"({"at": 1, "call": 1})", R"("call" must be a text)"},
+            {R"({"at": 1, "call": "SDCImpl.getInstance", "args": [1]})",
+             "takes 0 arguments, not 1"},
+            {R"({"at": 1, "call": "SDCImpl.putRgbShotTally"})", "takes 1 arguments, not 0"},
+            {R"({"at": 1, "call": "SDCImpl.putRgbShotTally", "args": 7})", "must be an array"},
+            {R"({"at": 1, "call": "SDCImpl.putRgbShotTally", "args": [7.0]})",
+             "integer of 32 bits"},
+            {R"({"at": 1, "call": "SDCImpl.putRgbShotTally", "args": [2147483648]})",
+             "argument 1 of SDCImpl.putRgbShotTally must be an integer of 32 bits"},
+            {R"({"args": [1, 1, "a", "b", 1], "at": 1, "call": "SDCImpl.enableSuccess"})",
+             "argument 1 of SDCImpl.enableSuccess must be true or false"},
+            {R"({"at": 1, "call": "SDCImpl.enableSuccess", "args": [true, 1, "a\u0000", "b", 1]})",
+             "argument 3 of SDCImpl.enableSuccess must be a text without NUL"},
+            {R"({"at": 1, "call": "SDCImpl.enableSuccess",)"
+             R"( "args": [true, 1, "a", "b", 9223372036854775808]})",
+             "argument 5 of SDCImpl.enableSuccess must be an integer of 64 bits"},
+            {R"({"at": 1, "call": "SDCImpl.setNotification", "args": [[1, true]]})",
+             "each element must be an integer of 32 bits"},
+            {R"({"at": 1, "set": {"mLogSwitch": true}})", R"("mLogSwitch" must be an integer)"},
+            {R"({"at": 1, "set": {"nothing": 1}})", R"(unknown variable "nothing")"},
+            {R"({"at": 1, "property": {"a": 1}})", R"("a" must be a text or null)"},
+            {R"({"at": 1, "property": {"": "1"}})", "needs a name"},
+            {R"({"at": 1, "property": {"a": ")" + std::string(92, 'v') + R"("}})",
+             "at most 91 bytes"},
+    };
+    for (const auto& [line, what] : cases) {
+        const Played played = play("# first\n" + report("1") + line + "\n" + report("1"));
+        EXPECT_EQ(played.status, 2) << line;
+        EXPECT_EQ(played.err.find("trace:3: "), 0u) << line << '\n' << played.err;
+        EXPECT_NE(played.err.find(what), std::string::npos) << line << '\n' << played.err;
+        EXPECT_EQ(played.err.find('\n'), played.err.size() - 1) << played.err;
+        EXPECT_EQ(happened(played), (Lines{reported("1", 0)})) << line;
+    }
+}
+
+TEST_F(ReplayTest, ABadLineKeepsEvenWhatIsDueFromRunningAndABadFirstOneStartsNothing) {
+    EXPECT_EQ(happened(play(sample("0") + R"({"at": 500, "x": 1})")), (Lines{}));
+    const Played played = play("\n{}\n" + report("0"));
+    EXPECT_EQ(played.out, "");
+    EXPECT_EQ(played.err, "trace:2: \"at\" is missing\n");
+}
+
+TEST_F(ReplayTest, NamesFilesThatItCannotUse) {
+    write("trace", report("0"));
+    write("broken", "not a database, and long enough to be told from one that is empty");
+    for (const auto& [arguments, what] : std::vector<std::pair<std::string, std::string>>{
+                 {"missing", "missing: cannot open: No such file or directory\n"},
+                 {".", ".:1: cannot read: Is a directory\n"},
+                 {"--properties broken trace", "broken: cannot keep properties in this file: "},
+                 {"--properties no/where trace", "no/where: cannot keep properties in this file: "},
+                 {"--print-trace trace", "trace: not a device capture\n"},
+                 {"", "FILE is required"}}) {
+        const Played played = run(arguments);
+        EXPECT_EQ(played.status, 2) << arguments;
+        EXPECT_EQ(played.out, "") << arguments;
+        EXPECT_NE(played.err.find(what), std::string::npos) << played.err;
+    }
+    EXPECT_EQ(run("--json trace missing").out.empty(), false);
+}
+
+TEST_F(ReplayTest, ReadsLinesLongerThanABlock) {
+    const std::string blanks(600'000, ' ');
+    EXPECT_EQ(happened(play(blanks + report("0") + "{" + blanks + report("1").substr(1))),
+              (Lines{reported("0", 0), reported("1", 0)}));
+}
+
+TEST_F(ReplayTest, ExplainsItself) {
+    const Played played = run("--help");
+    EXPECT_EQ(played.status, 0);
+    EXPECT_EQ(played.out.find("Examples:"), 0u);
+    EXPECT_NE(played.out.find("Exit status:"), std::string::npos);
+}
+
+}  // namespace

@@ -1,0 +1,36 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+/** What a run of sensor-replay left. */
+struct Played {
+    int status;       // of its exit
+    std::string out;  // standard output
+    std::string err;  // standard error
+};
+
+/** Runs the built sensor-replay on files of a folder of its own, which is the current one. */
+class ReplayToolTest : public ::testing::Test {
+protected:
+    ReplayToolTest();
+    ~ReplayToolTest() override;
+
+    /** Writes a file into the folder. */
+    void write(const std::string& name, const std::string& text) const;
+
+    /** `arguments` as a shell takes them; `input` is its standard input. */
+    Played run(const std::string& arguments, const std::string& input = "") const;
+
+    /** Plays the text as "trace", as JSON Lines. */
+    Played play(const std::string& trace) const;
+
+    /** The lines of a JSON output but for boots. */
+    static std::vector<std::string> happened(const Played& played);
+
+private:
+    std::filesystem::path mFolder;
+};
