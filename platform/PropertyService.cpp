@@ -207,6 +207,12 @@ std::optional<std::string> openProperties(const std::string& path) {
     return std::nullopt;
 }
 
+void closeProperties() {
+    Service& service = Service::get();
+    const std::lock_guard lock(service.mutex);
+    service.store = std::make_unique<Store>(":memory:");
+}
+
 std::optional<std::string> propertyFileError() {
     Service& service = Service::get();
     const std::lock_guard lock(service.mutex);

@@ -26,6 +26,9 @@ namespace platform {
  */
 std::optional<std::string> openProperties(const std::string& path);
 
+/** Lets go of the file, which then is complete by itself; the properties in memory are none. */
+void closeProperties();
+
 /** What went wrong with the file since it was opened (one line that names it), if anything. */
 std::optional<std::string> propertyFileError();
 

@@ -161,13 +161,17 @@ private:
         if (!mFailure) next = play(boot, first, mName, mReader.get(), &mOutput, &mFailure);
         mOutput.flush();
         if (const auto error = platform::propertyFileError(); error && !mFailure) fail(*error);
+        std::vector<unsigned char> properties;
+        if (mOptions.properties) {
+            platform::closeProperties();
+        } else {
+            properties = platform::saveProperties();
+        }
         if (mFailure) {
             std::fprintf(stderr, "%s\n", mFailure->text.c_str());
             return mFailure->status;
         }
         const Report report{next.has_value(), next.value_or(Boot{})};
-        std::vector<unsigned char> properties;
-        if (!mOptions.properties) properties = platform::saveProperties();
         const bool told = writeAll(reportFd, &report, sizeof(report)) &&
                           writeAll(reportFd, properties.data(), properties.size());
         return told ? 0 : kStatusFailed;
