@@ -7,6 +7,7 @@
 #include <json/json.h>
 #include <unistd.h>
 
+#include "replay/FileIo.h"
 #include "replay/VirtualClock.h"
 
 namespace replay {
@@ -98,15 +99,9 @@ void Output::line(std::string_view json, std::string_view kind, std::string_view
 }
 
 void Output::flush() {
-    std::string_view rest = mGathered;
-    while (!rest.empty()) {
-        const ssize_t count = write(STDOUT_FILENO, rest.data(), rest.size());
-        if (count < 0 && errno == EINTR) continue;
-        if (count < 0) {
-            std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
-            _exit(1);
-        }
-        rest.remove_prefix(static_cast<size_t>(count));
+    if (!writeAll(STDOUT_FILENO, mGathered.data(), mGathered.size())) {
+        std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
+        _exit(1);
     }
     mGathered.clear();
 }

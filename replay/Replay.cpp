@@ -14,6 +14,7 @@
 
 #include "platform/PropertyService.h"
 #include "replay/CaptureImport.h"
+#include "replay/FileIo.h"
 #include "replay/LineReader.h"
 #include "replay/Player.h"
 #include "replay/TraceLine.h"
@@ -27,29 +28,6 @@ struct Report {
     bool boots;  // by a boot line: `next`
     Boot next;
 };
-
-bool writeAll(int fd, const void* data, size_t size) {
-    const char* next = static_cast<const char*>(data);
-    while (size > 0) {
-        const ssize_t count = write(fd, next, size);
-        if (count < 0 && errno == EINTR) continue;
-        if (count < 0) return false;
-        next += count;
-        size -= static_cast<size_t>(count);
-    }
-    return true;
-}
-
-std::vector<unsigned char> readAll(int fd) {
-    std::vector<unsigned char> bytes;
-    unsigned char block[4096];
-    for (;;) {
-        const ssize_t count = read(fd, block, sizeof(block));
-        if (count < 0 && errno == EINTR) continue;
-        if (count <= 0) return bytes;
-        bytes.insert(bytes.end(), block, block + count);
-    }
-}
 
 /** Plays files; between two boots it only keeps what outlives a process. */
 class Replay {

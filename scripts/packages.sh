@@ -5,4 +5,5 @@ BUILD_PACKAGES='g++ cmake ninja-build pkg-config android-libutils-dev android-li
     android-libcutils-dev libjsoncpp-dev libsqlite3-dev libsimdjson-dev libcli11-dev libpng-dev'
 
 # To test them as well.
-TEST_PACKAGES='clang-14 libclang-rt-14-dev clang-format-14 clang-tidy-14 libgtest-dev'
+TEST_PACKAGES='clang-14 libclang-rt-14-dev clang-format-14 clang-tidy-14 libgtest-dev
+    g++-arm-linux-gnueabihf'
