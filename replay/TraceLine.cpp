@@ -7,6 +7,7 @@
 
 #include "platform/PropertyService.h"
 #include "replay/LineReader.h"
+#include "replay/Output.h"
 
 namespace replay {
 
@@ -21,10 +22,6 @@ using Error = std::optional<std::string>;
 constexpr int64_t kMaxTimeMs = 9'000'000'000'000;
 constexpr int64_t kNsPerMs = 1'000'000;
 constexpr size_t kMaxDecimals = 6;
-
-std::string quoted(std::string_view text) {
-    return '"' + std::string(text) + '"';
-}
 
 // One reader for each kind of argument.
 
@@ -160,7 +157,7 @@ std::optional<size_t> indexOf(const Entry (&table)[Size], std::string_view name)
 Error checkKeys(object json) {
     for (auto field = json.begin(); field != json.end(); ++field) {
         for (auto other = json.begin(); other != field; ++other) {
-            if (field.key() == other.key()) return "the key " + quoted(field.key()) + " twice";
+            if (field.key() == other.key()) return "the key " + toJson(field.key()) + " twice";
         }
     }
     return {};
@@ -189,7 +186,7 @@ Error readCall(element json, TraceLine* line) {
     std::string_view name;
     if (json.get(name) != simdjson::SUCCESS) return R"("call" must be a text)";
     const std::optional<size_t> index = indexOf(kCalls, name);
-    if (!index) return "unknown call " + quoted(name);
+    if (!index) return "unknown call " + toJson(name);
     line->action = TraceLine::Action::kCall;
     line->call = *index;
     return {};
@@ -226,10 +223,10 @@ Error readVariables(element json, TraceLine* line) {
     if (Error error = checkKeys(values)) return error;
     for (const auto [name, value] : values) {
         const std::optional<size_t> index = indexOf(kVariables, name);
-        if (!index) return "unknown variable " + quoted(name);
+        if (!index) return "unknown variable " + toJson(name);
         auto& variable = line->variables.emplace_back(*index, 0);
         if (Error error = kVariables[*index].readValue(value, &variable.second)) {
-            return quoted(name) + ' ' + *error;
+            return toJson(name) + ' ' + *error;
         }
     }
     return {};
@@ -246,11 +243,11 @@ Error readProperties(element json, TraceLine* line) {
         if (name.find('\0') != std::string_view::npos) return "a property's name holds a NUL";
         if (!value.is_null()) {
             if (Error error = read(value, &property.second.emplace())) {
-                return quoted(name) + ' ' + *error + " or null";
+                return toJson(name) + ' ' + *error + " or null";
             }
         }
         if (Error error = platform::refuseProperty(property.first, property.second.value_or(""))) {
-            return quoted(name) + ": " + *error;
+            return toJson(name) + ": " + *error;
         }
     }
     return {};
@@ -307,7 +304,7 @@ std::optional<std::string> TraceParser::parse(std::string_view text, TraceLine* 
             } else if (key == "boot") {
                 error = readBoot(value, line);
             } else {
-                error = "unknown key " + quoted(key);
+                error = "unknown key " + toJson(key);
             }
         }
         if (error) return error;

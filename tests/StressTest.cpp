@@ -1,0 +1,94 @@
+/**
+ * Calls everything that a trace can call, at random and from eight threads at once, in real time:
+ * food for the sanitizers. The argument is the number of calls of each thread.
+ */
+
+#include <cstdio>
+#include <cstdlib>
+#include <random>
+#include <thread>
+
+#include <android/log.h>
+
+#include "platform/Telemetry.h"
+#include "replay/Library.h"
+
+extern "C" const replay::Library* sensor_replay_library();
+
+namespace replay {
+namespace {
+
+constexpr int kThreads = 8;
+
+using Random = std::mt19937;
+
+int32_t pick(Random& random, std::initializer_list<int32_t> values) {
+    return values.begin()[random() % values.size()];
+}
+
+template <typename T>
+T make(Random& random) {
+    if constexpr (std::is_same_v<T, std::string>) {
+        constexpr const char* kNames[] = {"", "com.example.a", "com.example.b", "com.tencent.mm",
+                                          "com.android.server.display.DisplayPowerController"};
+        return kNames[random() % std::size(kNames)];
+    } else if constexpr (std::is_same_v<T, IntList>) {
+        IntList list(random() % 14);
+        for (int32_t& value : list) value = pick(random, {0, 1, 2, 3, 7, 10});
+        return list;
+    } else if constexpr (std::is_same_v<T, sensors_event_t>) {
+        sensors_event_t event{};
+        event.type = pick(random, {1, 5, 8});
+        for (float& value : event.data) value = static_cast<float>(pick(random, {0, 5, 301, 302}));
+        return event;
+    } else if constexpr (std::is_same_v<T, bool>) {
+        return random() % 2 != 0;
+    } else {
+        // Sensor types, hours, message codes, states, rates: small numbers do for all of them.
+        return static_cast<T>(random() % 37);
+    }
+}
+
+template <typename... Types>
+std::vector<Argument> makeAll(Random& random, std::tuple<Types...>*) {
+    return {Argument(make<Types>(random))...};
+}
+
+template <typename Operation>
+std::vector<Argument> makeArguments(Random& random) {
+    return makeAll(random, static_cast<typename ArgumentsOf<Operation>::type*>(nullptr));
+}
+
+constexpr std::vector<Argument> (*kArguments[])(Random&) = {
+#define CALL(Class, operation) makeArguments<decltype(&android::Class::operation)>,
+#define VARIABLE(name)
+#include "replay/library.inc"
+#undef CALL
+#undef VARIABLE
+};
+
+void run(unsigned seed, int calls) {
+    Random random(seed);
+    const Library* library = sensor_replay_library();
+    for (int i = 0; i < calls; ++i) {
+        const size_t index = random() % std::size(kArguments);
+        library->call(index, kArguments[index](random));
+    }
+}
+
+}  // namespace
+}  // namespace replay
+
+int main(int argc, char** argv) {
+    const int calls = argc > 1 ? std::atoi(argv[1]) : 10'000;
+    __android_log_set_logger([](const __android_logger_data*, const char*) {});
+    platform::observeEvents([](const char*, const char*, const char*) {});
+    mLogSwitch = 1;
+    std::vector<std::thread> threads;
+    for (unsigned seed = 0; seed < replay::kThreads; ++seed) {
+        threads.emplace_back(replay::run, seed, calls);
+    }
+    for (std::thread& thread : threads) thread.join();
+    std::printf("%d threads made %d calls each\n", replay::kThreads, calls);
+    return 0;
+}
