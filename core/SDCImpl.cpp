@@ -1,5 +1,7 @@
 #include "core/SDCImpl.h"
 
+#include "exception/FlowingDataException.h"
+#include "exception/UltraException.h"
 #include "rgb/RgbShot.h"
 #include "usage/RegisterInfo.h"
 
@@ -14,7 +16,10 @@ SDCImpl* SDCImpl::getInstance() {
     return mSDC;
 }
 
-SDCImpl::SDCImpl() : mRgbShot(RgbShot::getInstance()), mRegisterInfo(RegisterInfo::getInstance()) {}
+SDCImpl::SDCImpl()
+      : mRgbShot(RgbShot::getInstance()),
+        mFlowingDataException(FlowingDataException::getInstance()),
+        mRegisterInfo(RegisterInfo::getInstance()) {}
 
 void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
                             const std::string& opPkg, long long rate) {
@@ -33,6 +38,9 @@ void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long lo
         case 35:
             mRegisterInfo->handleEnable(type, pkg, opPkg, rate);
             break;
+        case 8:
+            mFlowingDataException->setProxEnable(pkg, opPkg);
+            break;
     }
 }
 
@@ -43,6 +51,9 @@ void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
         case 16:
         case 35:
             mRegisterInfo->handleDisable(type, pkg, opPkg);
+            break;
+        case 8:
+            mFlowingDataException->setProxDisable(pkg, opPkg);
             break;
     }
 }
@@ -64,10 +75,12 @@ void SDCImpl::setRgbShotCount() {
 }
 
 void SDCImpl::notifySdcClock(int hour) {
+    if (hour == 8) mFlowingDataException->putDetectTally();
     if (hour == 23) mRegisterInfo->notifyDayNight();
 }
 
 void SDCImpl::notifySdcReset(int hour) {
+    if (hour == 8) mFlowingDataException->notifyFlowReset();
     if (hour == 23) mRegisterInfo->notifyRegisterInfoReset();
 }
 
@@ -77,6 +90,14 @@ void SDCImpl::putRgbShotTally(int hour) {
 
 void SDCImpl::notifyRgbShotReset(int hour) {
     if (hour == 7) mRgbShot->notifyRgbShotReset();
+}
+
+void SDCImpl::putPhoneOpenUltraTally(int hour) {
+    if (hour == 7) UltraException::getInstance()->putPhoneOpenUltraTally();
+}
+
+void SDCImpl::notifyUltraReset(int hour) {
+    if (hour == 7) UltraException::getInstance()->notifyUltraReset();
 }
 
 }  // namespace android

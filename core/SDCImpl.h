@@ -10,6 +10,7 @@
 
 namespace android {
 
+class FlowingDataException;
 class RegisterInfo;
 class RgbShot;
 
@@ -56,10 +57,10 @@ public:
     // or two hours each and ignore the rest. Reports come before the resets of the same hour
     // because the host calls them in that order; nothing here enforces it.
 
-    /** 23: the daily reports. */
+    /** 8: the daily report of sensor exceptions. 23: the daily reports. */
     void notifySdcClock(int hour);
 
-    /** 23: the daily resets. */
+    /** 8: the daily reset of sensor exceptions. 23: the daily resets. */
     void notifySdcReset(int hour);
 
     /** 7: the daily report of screen samples. */
@@ -68,9 +69,16 @@ public:
     /** 7: the daily reset of screen samples. */
     void notifyRgbShotReset(int hour);
 
+    /** 7: the daily report of the ultrasonic proximity sensor. */
+    void putPhoneOpenUltraTally(int hour);
+
+    /** 7: the daily reset of the ultrasonic proximity sensor. */
+    void notifyUltraReset(int hour);
+
 private:
     // Constant after construction.
     RgbShot* const mRgbShot;
+    FlowingDataException* const mFlowingDataException;
     RegisterInfo* const mRegisterInfo;
 
     static Mutex sLock;

@@ -13,6 +13,8 @@
 
 #include "core/Log.h"
 #include "core/SDCImpl.h"
+#include "exception/FlowingDataException.h"
+#include "exception/UltraException.h"
 
 /**
  * The library as a trace sees it: calls and variables by their place in library.inc. The tool
@@ -24,7 +26,8 @@ namespace replay {
 using IntList = std::vector<int32_t>;
 
 /** One argument of a call, as a trace gives it. */
-using Argument = std::variant<bool, int32_t, int64_t, std::string, IntList, sensors_event_t>;
+using Argument = std::variant<bool, int32_t, int64_t, std::string, IntList, sensors_event_t,
+                              android::UltraExceptionInfo>;
 
 /** What a trace has to give for a parameter of type `T`. */
 template <typename T>

@@ -23,6 +23,16 @@ constexpr int64_t kMaxTimeMs = 9'000'000'000'000;
 constexpr int64_t kNsPerMs = 1'000'000;
 constexpr size_t kMaxDecimals = 6;
 
+/** A key that stands twice means two things at once. */
+Error checkKeys(object json) {
+    for (auto field = json.begin(); field != json.end(); ++field) {
+        for (auto other = json.begin(); other != field; ++other) {
+            if (field.key() == other.key()) return "the key " + toJson(field.key()) + " twice";
+        }
+    }
+    return {};
+}
+
 // One reader for each kind of argument.
 
 Error read(element json, bool* value) {
@@ -59,7 +69,7 @@ Error read(element json, IntList* value) {
     return {};
 }
 
-[[maybe_unused]] Error read(element json, sensors_event_t* event) {
+Error read(element json, sensors_event_t* event) {
     object fields;
     if (json.get(fields) != simdjson::SUCCESS) return "must be an event";
     element type;
@@ -78,6 +88,19 @@ Error read(element json, IntList* value) {
         double number = 0;
         if (item.get(number) != simdjson::SUCCESS) return R"("data" must hold numbers)";
         *next++ = static_cast<float>(number);
+    }
+    return {};
+}
+
+Error read(element json, android::UltraExceptionInfo* info) {
+    object fields;
+    if (json.get(fields) != simdjson::SUCCESS) return "must be an object";
+    if (Error error = checkKeys(fields)) return "has " + *error;
+    for (const auto [key, value] : fields) {
+        Error error = "is unknown";
+        if (key == "packageName") error = read(value, &info->packageName);
+        if (key == "phoneState") error = read(value, &info->phoneState);
+        if (error) return toJson(key) + ' ' + *error;
     }
     return {};
 }
@@ -151,16 +174,6 @@ std::optional<size_t> indexOf(const Entry (&table)[Size], std::string_view name)
                                      [&](const Entry& entry) { return entry.name == name; });
     if (found == std::end(table)) return std::nullopt;
     return static_cast<size_t>(found - table);
-}
-
-/** A key that stands twice means two things at once. */
-Error checkKeys(object json) {
-    for (auto field = json.begin(); field != json.end(); ++field) {
-        for (auto other = json.begin(); other != field; ++other) {
-            if (field.key() == other.key()) return "the key " + toJson(field.key()) + " twice";
-        }
-    }
-    return {};
 }
 
 /** The JSON number `digits`, of that value, as milliseconds: in nanoseconds, if they are whole. */

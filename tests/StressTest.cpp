@@ -41,6 +41,8 @@ T make(Random& random) {
         event.type = pick(random, {1, 5, 8});
         for (float& value : event.data) value = static_cast<float>(pick(random, {0, 5, 301, 302}));
         return event;
+    } else if constexpr (std::is_same_v<T, android::UltraExceptionInfo>) {
+        return {make<std::string>(random), pick(random, {0, 1})};
     } else if constexpr (std::is_same_v<T, bool>) {
         return random() % 2 != 0;
     } else {

@@ -1,0 +1,235 @@
+#include "exception/FlowingDataException.h"
+
+#include <algorithm>
+#include <cstring>
+#include <iterator>
+#include <utility>
+
+#include <cutils/properties.h>
+#include <strings.h>
+#include <utils/Timers.h>
+
+#include "core/Arithmetic.h"
+#include "core/CounterProperty.h"
+#include "core/Log.h"
+#include "core/SensorHandlerThread.h"
+#include "core/TallyCommon.h"
+
+namespace android {
+
+namespace {
+
+enum : int {
+    MSG_LOAD = 1,
+    MSG_COUNT = 2,    // plus the slot
+    MSG_REPORT = 10,  // plus the slot
+    MSG_RESET = 16,
+};
+
+/** By slot; the first type stands for the family in reports, 0 is none. */
+constexpr struct {
+    int sensorTypes[4];
+    const char* eventId;
+} kFamilyTable[] = {
+        {{1, 9, 10, 35}, "N273|10003"},  // accelerometer, gravity, linear acceleration
+        {{4, 16}, "N273|10004"},         // gyroscope
+        {{2, 14}, "N273|10005"},         // magnetic field
+        {{5}, "N273|10006"},             // light
+        {{3}, "N273|10007"},             // orientation
+        {{11}, "N273|10008"},            // rotation vector
+};
+constexpr int kNoSlot = -1;
+
+constexpr int kCountDelayMs = 11'000;
+constexpr int kResetDelayMs = 2000;
+constexpr int32_t kLastCounted = 2147483645;
+
+constexpr char kRecordProperty[] = "persist.zuno.flow.detect.count";
+constexpr char kNoRecord[] = "unknown";
+constexpr size_t kRecordLimit = 90;  // what fits a property's value
+
+constexpr int32_t kReportedSeconds = 1800;
+constexpr const char* kSystemPackages[] = {"com.android.incallui", "com.android.mms",
+                                           "com.android.systemui", "com.android.server",
+                                           "com.zuno"};
+
+int slotOfType(int sensorType) {
+    if (sensorType <= 0) return kNoSlot;
+    for (size_t slot = 0; slot < std::size(kFamilyTable); ++slot) {
+        const auto& types = kFamilyTable[slot].sensorTypes;
+        if (std::find(std::begin(types), std::end(types), sensorType) != std::end(types)) {
+            return static_cast<int>(slot);
+        }
+    }
+    return kNoSlot;
+}
+
+/** The slot that `code` means where slot 0 has the code `first`. */
+int slotOfCode(int code, int first) {
+    const int end = first + static_cast<int>(std::size(kFamilyTable));
+    return code >= first && code < end ? code - first : kNoSlot;
+}
+
+bool contains(const std::string& text, const char* part) {
+    return text.find(part) != std::string::npos;
+}
+
+}  // namespace
+
+class SENSOR_PRIV_HIDDEN FlowingDataException::SensorDetectHandler : public MessageHandler {
+public:
+    void handleMessage(const Message& message) override {
+        if (message.what == MSG_LOAD) {
+            getInstance()->initDetectCount();
+        } else if (message.what == MSG_RESET) {
+            getInstance()->resetDetectCount();
+        } else if (const int slot = slotOfCode(message.what, MSG_REPORT); slot != kNoSlot) {
+            getInstance()->putFamilyTally(slot);
+        } else {
+            getInstance()->updateDetectCountByType(message.what);
+        }
+    }
+};
+
+Mutex FlowingDataException::sLock;
+FlowingDataException* FlowingDataException::mFlowingDataException = nullptr;
+
+FlowingDataException* FlowingDataException::getInstance() {
+    Mutex::Autolock lock(sLock);
+    if (mFlowingDataException == nullptr) mFlowingDataException = new FlowingDataException;
+    return mFlowingDataException;
+}
+
+FlowingDataException::FlowingDataException() : mHandler(new SensorDetectHandler), mDetectCount{} {
+    static_assert(std::size(kFamilyTable) == kFamilies);
+}
+
+void FlowingDataException::notifyBootCompleted() {
+    SensorHandlerThread::getInstance()->sendMessage(mHandler, MSG_LOAD);
+}
+
+void FlowingDataException::notifyUpdateDetectCount(int sensorType) {
+    const int slot = slotOfType(sensorType);
+    if (slot == kNoSlot) return;
+    SensorHandlerThread* thread = SensorHandlerThread::getInstance();
+    thread->removeMessage(mHandler, MSG_COUNT + slot);
+    thread->sendMessageDelayed(mHandler, MSG_COUNT + slot, kCountDelayMs);
+}
+
+void FlowingDataException::putDetectTally() {
+    SensorHandlerThread* thread = SensorHandlerThread::getInstance();
+    for (int slot = 0; slot < kFamilies; ++slot) thread->sendMessage(mHandler, MSG_REPORT + slot);
+    thread->sendMessage(mHandler, MSG_RESET);
+    thread->sendMessageDelayed(mHandler, MSG_RESET, kResetDelayMs);
+}
+
+void FlowingDataException::notifyFlowReset() {
+    SensorHandlerThread* thread = SensorHandlerThread::getInstance();
+    thread->removeMessage(mHandler, MSG_RESET);
+    thread->sendMessageDelayed(mHandler, MSG_RESET, kResetDelayMs);
+}
+
+void FlowingDataException::notifyPutTally(int code) {
+    const int slot = slotOfCode(code, MSG_REPORT);
+    if (slot != kNoSlot) putFamilyTally(slot);
+}
+
+void FlowingDataException::putFamilyTally(int slot) {
+    setSensorException(kFamilyTable[slot].sensorTypes[0], mDetectCount[slot]);
+}
+
+void FlowingDataException::initDetectCount() {
+    char text[PROP_VALUE_MAX] = {};
+    property_get(kRecordProperty, text, kNoRecord);
+    if (strncasecmp(text, kNoRecord, std::strlen(kNoRecord)) == 0) {
+        resetDetectCount();
+        return;
+    }
+    int fields = 0;
+    char* rest = nullptr;
+    for (char* field = strtok_r(text, ",", &rest); field != nullptr;
+         field = strtok_r(nullptr, ",", &rest)) {
+        if (fields < kFamilies) {
+            mDetectCount[fields] = 0;
+            parseInt32(field, &mDetectCount[fields]);
+        }
+        ++fields;
+    }
+    if (fields != kFamilies) resetDetectCount();
+}
+
+void FlowingDataException::updateDetectCountByType(int code) {
+    const int slot = slotOfCode(code, MSG_COUNT);
+    if (slot == kNoSlot || mDetectCount[slot] > kLastCounted) return;
+    ++mDetectCount[slot];
+    storeDetectCount();
+}
+
+void FlowingDataException::resetDetectCount() {
+    SENSOR_PRIV_LOGD("sd resetDetectCount");
+    std::fill(std::begin(mDetectCount), std::end(mDetectCount), 0);
+    storeDetectCount();
+}
+
+void FlowingDataException::storeDetectCount() {
+    std::string record;
+    for (const int32_t count : mDetectCount) {
+        if (!record.empty()) record += ',';
+        record += std::to_string(count);
+    }
+    if (record.size() < kRecordLimit) property_set(kRecordProperty, record.c_str());
+}
+
+void FlowingDataException::setSensorException(int sensorType, int count) {
+    const int slot = slotOfType(sensorType);
+    if (slot == kNoSlot || count == 0) return;
+    TallyCommon::getInstance()->trackEvent(kFamilyTable[slot].eventId,
+                                           {{"reason", convertIntToString(count)}});
+}
+
+std::string FlowingDataException::getEventID(int sensorType) {
+    const int slot = slotOfType(sensorType);
+    return slot == kNoSlot ? "-1" : kFamilyTable[slot].eventId;
+}
+
+std::string FlowingDataException::convertIntToString(int value) {
+    return TallyCommon::getInstance()->intToStr(value);
+}
+
+void FlowingDataException::setProxEnable(std::string pkg, std::string opPkg) {
+    const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
+    Mutex::Autolock lock(mProxLock);
+    ProxInfo& info = mProxInfoMap[pkg + "/" + opPkg];
+    if (info.startTime != 0) {
+        info.duration = addWrapped(info.duration, secondsBetween(info.startTime, now));
+    }
+    info.startTime = now;
+    info.count = addWrapped(std::max(info.count, 0), 1);
+}
+
+void FlowingDataException::setProxDisable(std::string pkg, std::string opPkg) {
+    const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
+    int32_t seconds = 0;
+    {
+        Mutex::Autolock lock(mProxLock);
+        const auto it = mProxInfoMap.find(pkg + "/" + opPkg);
+        if (it == mProxInfoMap.end()) return;
+        ProxInfo& info = it->second;
+        info.count = addWrapped(info.count, -1);
+        if (info.count != 0) return;
+        seconds = addWrapped(info.duration, secondsBetween(info.startTime, now));
+        mProxInfoMap.erase(it);
+    }
+    if (seconds > kReportedSeconds) setProxTally(std::move(pkg), std::move(opPkg), seconds);
+}
+
+void FlowingDataException::setProxTally(std::string pkg, std::string opPkg, int seconds) {
+    for (const char* name : kSystemPackages) {
+        if (contains(pkg, name) || contains(opPkg, name)) return;
+    }
+    TallyCommon* tally = TallyCommon::getInstance();
+    tally->trackEvent("N273|10010",
+                      {{"pkg", pkg + "/" + opPkg}, {"time", tally->intToStr(seconds)}});
+}
+
+}  // namespace android

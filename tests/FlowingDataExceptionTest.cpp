@@ -1,0 +1,144 @@
+#include "exception/FlowingDataException.h"
+
+#include <limits>
+#include <utility>
+
+#include "platform/Telemetry.h"
+#include "tests/LibraryTest.h"
+
+namespace android {
+namespace {
+
+constexpr char kRecord[] = "persist.zuno.flow.detect.count";
+
+class FlowingDataExceptionTest : public LibraryTest {
+protected:
+    void load(const std::string& record) {
+        setProperty(kRecord, record);
+        flow->initDetectCount();
+    }
+
+    /** A session of a/b that begins now and lasts so long. */
+    Lines playSession(double seconds) {
+        flow->setProxEnable("a", "b");
+        advanceTo(mNow += seconds * 1000);
+        flow->setProxDisable("a", "b");
+        return taken();
+    }
+
+    FlowingDataException* const flow = FlowingDataException::getInstance();
+    double mNow = 0;
+};
+
+TEST_F(FlowingDataExceptionTest, EachSensorTypeCountsForItsFamilyOnly) {
+    const std::vector<int> families[] = {{1, 9, 10, 35}, {4, 16}, {2, 14}, {5}, {3}, {11}};
+    std::string expected[40];
+    for (int slot = 0; slot < 6; ++slot) {
+        for (const int type : families[slot]) expected[type] = std::to_string(slot);
+    }
+    for (int type = -1; type < 40; ++type) {
+        SCOPED_TRACE(type);
+        load("0,0,0,0,0,0");
+        flow->notifyUpdateDetectCount(type);
+        advanceTo(mNow += 11'000);
+        std::string record = "0,0,0,0,0,0";
+        std::string eventId = "-1";
+        if (type >= 0 && !expected[type].empty()) {
+            const int slot = std::stoi(expected[type]);
+            record[2 * slot] = '1';
+            eventId = "N273|1000" + std::to_string(slot + 3);
+        }
+        EXPECT_EQ(property(kRecord), record);
+        EXPECT_EQ(flow->getEventID(type), eventId);
+    }
+}
+
+TEST_F(FlowingDataExceptionTest, ARunOfNotificationsEndsAfterElevenQuietSeconds) {
+    for (const double at : {0, 5000, 15'999, 26'999}) {
+        advanceTo(at);
+        flow->notifyUpdateDetectCount(1);
+    }
+    advanceTo(100'000);
+    EXPECT_EQ(taken(), (Lines{"26999 persist.zuno.flow.detect.count=1,0,0,0,0,0",
+                              "37999 persist.zuno.flow.detect.count=2,0,0,0,0,0"}));
+}
+
+TEST_F(FlowingDataExceptionTest, OnlyARecordOfSixFieldsIsLoaded) {
+    const Lines reset{"0 log 3 sd resetDetectCount",
+                      "0 persist.zuno.flow.detect.count=0,0,0,0,0,0"};
+    const std::tuple<const char*, const char*, Lines> cases[] = {
+            {"1,2,3,4,5,6", "1,3,3,4,5,6", {}},
+            {",1,,2,3,4,5,6,", "1,3,3,4,5,6", {}},
+            {"x, -7y,+3,99999999999,-99999999999,0x6", "0,-6,3,2147483647,-2147483648,0", {}},
+            {"1,2,3", "0,1,0,0,0,0", reset},
+            {"1,2,3,4,5,6,7", "0,1,0,0,0,0", reset},
+            {",,", "0,1,0,0,0,0", reset},
+            {"", "0,1,0,0,0,0", reset},
+            {"UnknowN,2,3,4,5,6", "0,1,0,0,0,0", reset},
+    };
+    for (const auto& [stored, counted, lines] : cases) {
+        SCOPED_TRACE(stored);
+        load("9,9,9,9,9,9");
+        taken();
+        load(stored);
+        EXPECT_EQ(taken(), lines);
+        flow->updateDetectCountByType(3);
+        EXPECT_EQ(property(kRecord), counted);
+    }
+}
+
+TEST_F(FlowingDataExceptionTest, CodesOfNoFamilyDoNothing) {
+    load("1,2,3,0,5,6");
+    constexpr int kMin = std::numeric_limits<int>::min();
+    constexpr int kMax = std::numeric_limits<int>::max();
+    for (const int code : {kMin, -1, 1, 8, 9, 16, kMax}) {
+        flow->updateDetectCountByType(code);
+        flow->notifyPutTally(code);
+    }
+    EXPECT_EQ(taken(), Lines{});
+    for (int code = 10; code < 16; ++code) flow->notifyPutTally(code);
+    flow->setSensorException(8, 5);
+    flow->setSensorException(35, -1);
+    EXPECT_EQ(taken(),
+              (Lines{"0 N273|10003 reason:1", "0 N273|10004 reason:2", "0 N273|10005 reason:3",
+                     "0 N273|10007 reason:5", "0 N273|10008 reason:6", "0 N273|10003 reason:-1"}));
+}
+
+TEST_F(FlowingDataExceptionTest, ASessionsSecondsWrapAt32Bits) {
+    advanceTo(mNow = 1000);
+    EXPECT_EQ(playSession(1800.999), Lines{});
+    EXPECT_EQ(playSession(1801).size(), 1u);
+    EXPECT_EQ(playSession(2147483648.0), Lines{});
+    const Lines lines = playSession(4294967296.0 + 1801.5);
+    ASSERT_EQ(lines.size(), 1u);
+    EXPECT_NE(lines[0].find(" N273|10010 pkg:a/b&time:1801"), std::string::npos);
+}
+
+TEST_F(FlowingDataExceptionTest, SessionsOfSystemPackagesAreNotReported) {
+    for (const char* name : {"com.android.incallui", "com.android.mms", "com.android.systemui",
+                             "com.android.server.telecom", "my.com.zunophone"}) {
+        flow->setProxTally(name, "b", 5);
+        flow->setProxTally("a", name, 5);
+    }
+    EXPECT_EQ(taken(), Lines{});
+    flow->setProxTally("com.android.mm", "com.Zuno", 5);
+    EXPECT_EQ(taken(), (Lines{"0 N273|10010 pkg:com.android.mm/com.Zuno&time:5"}));
+}
+
+TEST_F(FlowingDataExceptionTest, AClientIsFreeToCallWhileItsSessionIsReported) {
+    static FlowingDataException* const module = flow;
+    static int reports = 0;
+    flow->setProxEnable("a/b", "c");
+    advanceTo(1'801'000);
+    platform::observeEvents([](auto...) {
+        ++reports;
+        module->setProxEnable("a", "b/c");
+    });
+    flow->setProxDisable("a", "b/c");  // joined, the names are the same
+    advanceTo(3'602'000);
+    flow->setProxDisable("a/b", "c");
+    EXPECT_EQ(reports, 2);
+}
+
+}  // namespace
+}  // namespace android
