@@ -1,6 +1,8 @@
 #include "core/SDCImpl.h"
 
+#include "exception/WechatProxException.h"
 #include "rgb/RgbShot.h"
+#include "usage/MagneticUseIf.h"
 #include "usage/RegisterInfo.h"
 
 namespace android {
@@ -14,7 +16,11 @@ SDCImpl* SDCImpl::getInstance() {
     return mSDC;
 }
 
-SDCImpl::SDCImpl() : mRgbShot(RgbShot::getInstance()), mRegisterInfo(RegisterInfo::getInstance()) {}
+SDCImpl::SDCImpl()
+      : mRgbShot(RgbShot::getInstance()),
+        mWechatProxException(WechatProxException::getInstance()),
+        mMagneticUseIf(MagneticUseIf::getInstance()),
+        mRegisterInfo(RegisterInfo::getInstance()) {}
 
 void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
                             const std::string& opPkg, long long rate) {
@@ -23,6 +29,7 @@ void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
     } else {
         handleDisable(type, pkg, opPkg);
     }
+    mWechatProxException->enableSuccess(enabled, type, pkg, opPkg);
 }
 
 void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long long rate) {
@@ -32,6 +39,10 @@ void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long lo
         case 16:
         case 35:
             mRegisterInfo->handleEnable(type, pkg, opPkg, rate);
+            break;
+        case 3:
+        case 11:
+            mMagneticUseIf->setOrientationEnable(pkg, opPkg);
             break;
     }
 }
@@ -44,19 +55,41 @@ void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
         case 35:
             mRegisterInfo->handleDisable(type, pkg, opPkg);
             break;
+        case 3:
+        case 11:
+            mMagneticUseIf->setOrientationDisable(pkg, opPkg);
+            break;
     }
 }
 
 void SDCImpl::cleanupConnection(const String8& pkg, const String8& opPkg, int type) {
     if (pkg.string() != nullptr) handleCleanupConnection(type, pkg.string(), opPkg.string());
+    mWechatProxException->enableSuccess(false, type, pkg.string(), opPkg.string());
 }
 
 void SDCImpl::handleCleanupConnection(int type, std::string pkg, std::string opPkg) {
     handleDisable(type, pkg, opPkg);
 }
 
+void SDCImpl::process(const sensors_event_t& event) {
+    mWechatProxException->process(event);
+}
+
 void SDCImpl::setNotification(const Vector<int>& notification) {
+    mWechatProxException->setNotification(notification);
     mRegisterInfo->setNotification(notification);
+}
+
+void SDCImpl::sendChargeState(int state) {
+    mMagneticUseIf->sendChargeState(state);
+}
+
+void SDCImpl::sendBootShutdownRebootState(int state) {
+    mMagneticUseIf->sendBootShutdownRebootState(state);
+}
+
+void SDCImpl::sendUsedTime(int uds) {
+    mMagneticUseIf->sendUsedTime(uds);
 }
 
 void SDCImpl::setRgbShotCount() {
@@ -64,11 +97,19 @@ void SDCImpl::setRgbShotCount() {
 }
 
 void SDCImpl::notifySdcClock(int hour) {
-    if (hour == 23) mRegisterInfo->notifyDayNight();
+    if (hour == 23) {
+        mMagneticUseIf->notifyDayNight();
+        mWechatProxException->notifyDayNight();
+        mRegisterInfo->notifyDayNight();
+    }
 }
 
 void SDCImpl::notifySdcReset(int hour) {
-    if (hour == 23) mRegisterInfo->notifyRegisterInfoReset();
+    if (hour == 23) {
+        mMagneticUseIf->notifyMagReset();
+        mWechatProxException->resetWechatCount();
+        mRegisterInfo->notifyRegisterInfoReset();
+    }
 }
 
 void SDCImpl::putRgbShotTally(int hour) {

@@ -62,7 +62,7 @@ Error read(element json, IntList* value) {
     return {};
 }
 
-[[maybe_unused]] Error read(element json, sensors_event_t* event) {
+Error read(element json, sensors_event_t* event) {
     object fields;
     if (json.get(fields) != simdjson::SUCCESS) return "must be an event";
     element type;
