@@ -3,9 +3,6 @@
 #include <regex>
 #include <sstream>
 
-#include "core/Log.h"
-#include "core/SDCImpl.h"
-#include "exception/WechatProxException.h"
 #include "tests/LibraryTest.h"
 
 namespace android {
@@ -177,83 +174,6 @@ TEST_F(MagneticUseIfTest, ReportsTheFiftyLongestByNameAmongEqualsAndDropsTheOthe
     play("7030 -lost");
     EXPECT_EQ(reported(), (Lines{}));
     EXPECT_EQ(totals(), "0 0 0 0 230 0 ");  // these are not reset
-}
-
-TEST_F(MagneticUseIfTest, LogsEveryStepWhileTheSwitchIsOn) {
-    mLogSwitch = 1;
-    play("0 c2 0 +a 0 d3 5 -a");
-    mUse->getPersistStatistics();
-    mUse->sendBootShutdownRebootState(9);
-    mUse->setPersistStatistics();
-    std::string log;
-    for (const std::string& line : taken()) {
-        if (line.find("persist.") == std::string::npos)
-            log += line.substr(line.find(' ') + 1) + '\n';
-    }
-    EXPECT_EQ(log,
-              "log 3 currentPCState = 2 ,mLastPCState = 0 \n"
-              "log 3 mIsChargeState=1, mEnableNumbers=0, mBeginCountTime=0\n"
-              "log 3 Enable mEnableNumbers = 1\n"
-              "log 3 mIsChargeState=1, mEnableNumbers=1, mBeginCountTime=0\n"
-              "log 3 dealWithOrientationTotalTime mEnableNumbers = 1, mTotalBeginCountTime = 0\n"
-              "log 3 uds = 3\n"
-              "log 3 Disable mEnableNumbers = 0\n"
-              "log 3 mIsChargeState=1, mEnableNumbers=0, mBeginCountTime=1\n"
-              "log 3 tt = 5, type = 2\n"
-              "log 3 dealWithOrientationTotalTime mEnableNumbers = 0, mTotalBeginCountTime = 1\n"
-              "log 3 mUD=3, mLastUD=3, mLastRUD=0\n"
-              "log 6 SDC Event = N273|10012\n"
-              "N273|10012 days:3&fastChargeTime:0&otherChargeTime:0&pkg:a&shockAndChargeTime:0&"
-              "totalTime:5&usbChargeTime:5\n"
-              "log 3 oritt == 5\n"
-              "log 3 get mZunoFastChargeUT=0, mUsbChargeUT=0, mOtherChargeUT=0, "
-              "mShockAndChargeUT=0, mTotalOrientationUT=0, mTotalD=0\n"
-              "log 3 boot state = 9\n"
-              "log 3 set mZunoFastChargeUT=0, mUsbChargeUT=0, mOtherChargeUT=0, "
-              "mShockAndChargeUT=0, mTotalOrientationUT=0, mTotalD=0\n");
-}
-
-TEST_F(MagneticUseIfTest, TheFacadeRoutesTwoTypesAndReportsBeforeTheOthersAtTwentyThree) {
-    SDCImpl* const sdc = SDCImpl::getInstance();
-    WechatProxException::getInstance()->setVoiceMode(1);
-    sdc->sendChargeState(1);
-    advanceTo(3000);
-    for (int type : {3, 11, 2, 8, 1}) sdc->enableSuccess(true, type, "a", "com.tencent.mm", 5);
-    sensors_event_t near{};
-    near.type = 8;
-    sdc->process(near);
-    advanceTo(3050);
-    near.data[0] = 5;
-    sdc->process(near);
-    advanceTo(13000);
-    for (int type : {3, 11, 8, 1}) {
-        sdc->cleanupConnection(String8("a"), String8("com.tencent.mm"), type);
-    }
-    advanceTo(13000);
-    EXPECT_EQ(taken(), (Lines{"13000 persist.zuno.wechat.count.info=1_0_0_1"}));
-
-    for (int hour = 0; hour < 24; ++hour) sdc->notifySdcClock(hour);
-    for (int hour = 0; hour < 23; ++hour) sdc->notifySdcReset(hour);
-    advanceTo(14000);
-    EXPECT_EQ(
-            taken(),
-            (Lines{"13000 N273|10012 info:{\t\"list\" : \t[\t\t{\t\t\t\"fastChargeTime\" : \"10\","
-                   "\t\t\t\"otherChargeTime\" : \"0\",\t\t\t\"pkg\" : \"a/com.tencent.mm\","
-                   "\t\t\t\"totalTime\" : \"10\",\t\t\t\"usbChargeTime\" : \"0\"\t\t}\t]}",
-                   "13000 N273|10013 invalid:0&status:{\t\"lock\" : \"0\",\t\"near\" : \"1\"}&"
-                   "total:1",
-                   "13000 N273|10003 app_list:{\t\"list\" : \t[\t\t{\t\t\t\"ontime\" : \"0\","
-                   "\t\t\t\"pkg\" : \"a/com.tencent.mm\",\t\t\t\"rate\" : \"5\","
-                   "\t\t\t\"time\" : \"10\"\t\t}\t]}"}));
-    sdc->notifySdcReset(23);
-    sdc->sendUsedTime(1);
-    sdc->sendBootShutdownRebootState(1);
-    sdc->sendBootShutdownRebootState(0);
-    advanceTo(14000);
-    Lines lines = taken();
-    ASSERT_EQ(lines.size(), 7U);
-    EXPECT_EQ(lines[0], "14000 persist.zuno.wechat.count.info=0_0_0_0");
-    EXPECT_EQ(lines[6], "14000 persist.sys.ds_oriut=0");  // the load came between
 }
 
 }  // namespace
