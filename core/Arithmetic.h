@@ -15,6 +15,11 @@ constexpr int64_t secondsBetween(int64_t begin, int64_t end) {
     return (end - begin) / 1'000'000'000;
 }
 
+/** Adds the whole seconds from `begin` to `end`, in nanoseconds, to a 32-bit count of seconds. */
+constexpr void addSeconds(int32_t* seconds, int64_t begin, int64_t end) {
+    *seconds = addWrapped(*seconds, secondsBetween(begin, end));
+}
+
 /**
  * `value` truncated toward zero. What does not fit 32 bits gives the nearest number that does, a
  * NaN 0, as the device's processor has it.

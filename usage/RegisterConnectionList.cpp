@@ -7,6 +7,7 @@
 #include <utils/Timers.h>
 
 #include "core/Arithmetic.h"
+#include "core/RankedList.h"
 
 namespace android {
 
@@ -14,11 +15,6 @@ namespace {
 
 constexpr int64_t kNoRate = -1;
 constexpr int kDisplayOn = 2;
-constexpr size_t kMaxReported = 50;
-
-void credit(int32_t* seconds, int64_t begin, int64_t end) {
-    *seconds = addWrapped(*seconds, secondsBetween(begin, end));
-}
 
 }  // namespace
 
@@ -45,8 +41,9 @@ void RegisterConnectionList::handleEnable(const std::string& pkg, const std::str
     for (auto& [key, info] : mConnections) {
         if (info.beginTime == 0) continue;
         if (!credited && info.rate == mCurrentRate) {
-            credit(&info.time, info.beginTime, now);
-            if (isDisplayOn() && info.onBeginTime != 0) credit(&info.ontime, info.onBeginTime, now);
+            addSeconds(&info.time, info.beginTime, now);
+            if (isDisplayOn() && info.onBeginTime != 0)
+                addSeconds(&info.ontime, info.onBeginTime, now);
             credited = true;
         }
         info.beginTime = now;
@@ -78,9 +75,9 @@ void RegisterConnectionList::handleDisable(const std::string& pkg, const std::st
         ended.onBeginTime = 0;
         return;
     }
-    credit(&ended.time, ended.beginTime, now);
+    addSeconds(&ended.time, ended.beginTime, now);
     ended.beginTime = 0;
-    if (isDisplayOn()) credit(&ended.ontime, ended.onBeginTime, now);
+    if (isDisplayOn()) addSeconds(&ended.ontime, ended.onBeginTime, now);
     ended.onBeginTime = 0;
 
     mCurrentRate = kNoRate;
@@ -112,7 +109,7 @@ void RegisterConnectionList::handleDisplayStateChanged() {
     for (auto& [key, info] : mConnections) {
         if (!credited && info.rate == mCurrentRate && info.beginTime != 0 &&
             info.onBeginTime != 0) {
-            credit(&info.ontime, info.onBeginTime, now);
+            addSeconds(&info.ontime, info.onBeginTime, now);
             credited = true;
         }
         info.onBeginTime = 0;
@@ -123,35 +120,15 @@ std::string RegisterConnectionList::getRegisterConnectionInfo() {
     std::vector<std::pair<std::string, PkgRegInfo>> ended;
     {
         Mutex::Autolock lock(mLock);
-        for (auto it = mConnections.begin(); it != mConnections.end();) {
-            if (it->second.beginTime == 0 && it->second.time != 0) {
-                ended.emplace_back(*it);
-                it = mConnections.erase(it);
-            } else {
-                ++it;
-            }
-        }
+        ended = takeOut(&mConnections, [](const PkgRegInfo& info) {
+            return info.beginTime == 0 && info.time != 0;
+        });
     }
-    // By key first, so that equal times come out alike on every platform.
-    std::sort(ended.begin(), ended.end(),
-              [](const auto& a, const auto& b) { return a.first < b.first; });
-    std::stable_sort(ended.begin(), ended.end(), comp);
-
-    Json::Value root;
-    for (size_t i = 0; i < std::min(ended.size(), kMaxReported); ++i) {
-        const auto& [key, info] = ended[i];
-        Json::Value entry;
-        entry["pkg"] = key;
-        entry["rate"] = std::to_string(static_cast<int32_t>(info.rate));  // the low 32 bits
-        entry["time"] = std::to_string(info.time);
-        entry["ontime"] = std::to_string(info.ontime);
-        root["list"].append(entry);
-    }
-    if (root.isNull()) return {};
-    std::string text = root.toStyledString();
-    text.erase(std::remove(text.begin(), text.end(), '\n'), text.end());
-    text.erase(std::remove(text.begin(), text.end(), '\r'), text.end());
-    return text;
+    return rankedList(std::move(ended), comp, [](const PkgRegInfo& info, Json::Value* entry) {
+        (*entry)["rate"] = std::to_string(static_cast<int32_t>(info.rate));  // the low 32 bits
+        (*entry)["time"] = std::to_string(info.time);
+        (*entry)["ontime"] = std::to_string(info.ontime);
+    });
 }
 
 bool RegisterConnectionList::comp(const std::pair<std::string, PkgRegInfo>& a,
