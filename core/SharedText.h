@@ -4,13 +4,14 @@
 
 namespace android {
 
-/**
- * Prepares a text that threads write and read without a lock: it keeps its storage for as long as
- * names in it are no longer than the platform allows, 255 bytes. A race may then mix two names, but
- * never touches freed memory. Assign copies to it; a move would swap the storage.
- */
-inline void keepStorage(std::string* text) {
-    text->reserve(255);
-}
+// Names that threads write and read without a lock. A race may mix two names; it must not touch
+// freed memory, so such a text never outgrows its first storage as long as names are no longer than
+// the platform allows, 255 bytes.
+
+/** Gives `text`, which nobody else knows yet, its storage and its first value. */
+void initSharedText(std::string* text, const char* value);
+
+/** Copies `value` into the storage of `text`. */
+void setSharedText(std::string* text, const std::string& value);
 
 }  // namespace android

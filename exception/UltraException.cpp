@@ -92,8 +92,7 @@ UltraException* UltraException::getInstance() {
 }
 
 UltraException::UltraException() : mHandler(new UltraExceptionHandler) {
-    keepStorage(&mPackageName);
-    mPackageName = kUnknownPackage;
+    initSharedText(&mPackageName, kUnknownPackage);
     if (isOverseas) return;
     SensorHandlerThread::getInstance()->sendMessageDelayed(mHandler, MSG_LOAD, kLoadDelayMs);
 }
@@ -111,7 +110,7 @@ void UltraException::doAction(int code, const UltraExceptionInfo& info) {
     if (code == MSG_PHONE_STATE) {
         mPhoneState = info.phoneState;
     } else if (code == MSG_ENABLED) {
-        mPackageName = info.packageName;
+        setSharedText(&mPackageName, info.packageName);
     }
     SensorHandlerThread* thread = SensorHandlerThread::getInstance();
     thread->removeMessage(mHandler, code);
@@ -134,7 +133,7 @@ void UltraException::setUltraEnergy(const sensors_event_t& event) {
 void UltraException::resetUltraStatus() {
     mFluctuantEnergy = 0;
     mBackgroundEnergy = 0;
-    mPackageName = kUnknownPackage;
+    setSharedText(&mPackageName, kUnknownPackage);
 }
 
 void UltraException::putPhoneOpenUltraTally() {

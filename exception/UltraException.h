@@ -163,7 +163,7 @@ private:
     int32_t mRxCloseCount = 0;
     int32_t mFluctuantEnergy = 0;
     int32_t mBackgroundEnergy = 0;
-    std::string mPackageName;            // of the latest enable; "unknown": none
+    std::string mPackageName;            // of the latest enable, "unknown": none; a shared text
     int32_t mPhoneState = 0;             // 0: no phone call
     bool mUltraOpenedInCall = false;     // the present call uses the sensor
     bool mInvalidCountedInCall = false;  // the present call has been counted as failed

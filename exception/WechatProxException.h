@@ -86,8 +86,8 @@ public:
     void resetWechatCount();
 
     /**
-     * Keeps the first three values of an accelerometer event, unless the phone is near, or the last
-     * reading was kept less than 20000001 ns ago.
+     * Keeps the first three values of an accelerometer event as the newest reading and counts it,
+     * unless the phone is near or the last reading was kept less than 20000001 ns ago.
      */
     void getAccData(const sensors_event_t& event);
 
@@ -128,9 +128,10 @@ public:
      * The spread of the kept readings `from` to `to` - 1, 0 being the newest: the population
      * standard deviation of each axis, over `to` - `from` readings, into `sx`, `sy` and `sz`.
      * Returns them as text, six decimals each, joined by "/". There are 20 readings; what lies
-     * outside them adds nothing. No readings (`from` = `to`) have a spread of 0.
+     * outside them adds nothing. No readings have a spread of 0, of -0 if `to` is below `from`.
      *
-     * All is computed in `float`, so that it comes out alike on every platform.
+     * All is computed in `float`, in the order of the readings, so that it comes out alike on
+     * every platform; a NaN is printed without a sign.
      */
     std::string getVariance(int from, int to, float& sx, float& sy, float& sz);
 

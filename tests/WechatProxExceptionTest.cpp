@@ -17,8 +17,8 @@ protected:
     /**
      * Plays pairs of a time in milliseconds and what the host does then: "+" and "-" begin and end
      * the chat application's hold of the proximity sensor, "D" and "d" the display controller's,
-     * "r" its hold of the accelerometer; "v1" is a voice mode, "s1" a camera state, "p5" a distance
-     * and "a2.5" a reading of x.
+     * "r" and "R" the chat application's of the accelerometer; "v1" is a voice mode, "s1" a camera
+     * state, "p5" a distance and "a2.5" a reading of x.
      */
     void play(const std::string& steps) {
         std::istringstream stream(steps);
@@ -31,7 +31,7 @@ protected:
             if (what == "D" || what == "d") {
                 enable(what == "D", 8, "com.android.server.display.DisplayPowerController$3", "os");
             }
-            if (what == "r") enable(true, 1, "call", "com.tencent.mm");
+            if (what == "r" || what == "R") enable(what == "r", 1, "call", "com.tencent.mm");
             if (what[0] == 'v') mMonitor->setVoiceMode(static_cast<int>(value));
             if (what[0] == 's') mMonitor->setCameraState(static_cast<int>(value));
             if (what[0] == 'p') dispatch(8, {value});
@@ -128,7 +128,9 @@ const Call kCalls[] = {
         {"0 v1 2100 + 2200 a1 2300 a3 2400 - 2400 + 2500 a3 3000 p0 5000 -",
          {"3500 0.000000"},
          "1_1_0_1"},
-        {"0 v1 100 + 200 a1 300 a1 400 r 500 a2 1000 p0 3000 -", {"1500 0.942809"}, "1_1_0_1"},
+        {"0 v1 100 + 200 a1 300 a1 400 r 500 a2 600 R 1000 p0 3000 -",
+         {"1500 0.942809"},
+         "1_1_0_1"},
 };
 
 INSTANTIATE_TEST_SUITE_P(Steps, CallTest, ::testing::ValuesIn(kCalls));

@@ -67,8 +67,7 @@ MagneticUseIf* MagneticUseIf::getInstance() {
 }
 
 MagneticUseIf::MagneticUseIf() : mHandler(new MagneticUseIfHandler) {
-    keepStorage(&mLastPkg);
-    mLastPkg = "unknow";
+    initSharedText(&mLastPkg, "unknow");
 }
 
 void MagneticUseIf::sendChargeState(int state) {
@@ -117,7 +116,7 @@ void MagneticUseIf::setOrientationEnable(std::string pkg, std::string opPkg) {
 }
 
 void MagneticUseIf::setOrientationDisable(std::string pkg, std::string opPkg) {
-    if (mEnableNumbers == 1 && !pkg.empty()) mLastPkg = pkg;
+    if (mEnableNumbers == 1 && !pkg.empty()) setSharedText(&mLastPkg, pkg);
     mEnableNumbers = addWrapped(mEnableNumbers, -1);
     if (mLogSwitch != 0) SENSOR_PRIV_LOGD("Disable mEnableNumbers = %d", mEnableNumbers);
     dealWithOrientationEnableDisable(std::move(pkg), std::move(opPkg), false);

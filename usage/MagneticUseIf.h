@@ -131,7 +131,10 @@ public:
      */
     void recordTime();
 
-    /** Reports the totals if the day counter is past the one of the last report. */
+    /**
+     * If the day counter is past its value at the last report: brings the days of the totals to it,
+     * back too if the counter went back, and reports the totals.
+     */
     void calCurretTime(std::string pkg);
 
     /** Sends the report of the totals, which names `pkg`, and posts their store. */
@@ -193,7 +196,7 @@ private:
     int64_t mBeginTime = 0;
     int64_t mEndTime = 0;
 
-    std::string mLastPkg;
+    std::string mLastPkg;  // what the report names; a shared text without a lock
 
     // The enabled span; times are monotonic ns, 0 while there is none.
     bool mTotalBeginCountTime = false;  // it is open
