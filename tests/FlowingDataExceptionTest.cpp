@@ -44,7 +44,7 @@ TEST_F(FlowingDataExceptionTest, EachSensorTypeCountsForItsFamilyOnly) {
         std::string record = "0,0,0,0,0,0";
         std::string eventId = "-1";
         if (type >= 0 && !expected[type].empty()) {
-            const int slot = std::stoi(expected[type]);
+            const size_t slot = std::stoul(expected[type]);
             record[2 * slot] = '1';
             eventId = "N273|1000" + std::to_string(slot + 3);
         }
