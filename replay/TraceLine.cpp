@@ -184,15 +184,26 @@ std::optional<int64_t> toNanoseconds(std::string_view digits, double value) {
         return time == std::floor(time) ? std::optional(static_cast<int64_t>(time)) : std::nullopt;
     }
     // Read digit by digit: a double does not hold the nanoseconds of a year.
+    if (digits.front() == '-') digits.remove_prefix(1);  // of a zero
     const size_t point = digits.find('.');
     const size_t end = digits.find_last_of(".123456789") + 1;
     if (end - point - 1 > kMaxDecimals) return std::nullopt;
     int64_t time = 0;
     for (size_t i = 0; i < point + 1 + kMaxDecimals; ++i) {
-        if (i == point || digits[i] == '-') continue;
-        time = time * 10 + (i < end ? digits[i] - '0' : 0);
+        if (i != point) time = time * 10 + (i < end ? digits[i] - '0' : 0);
     }
     return time;
+}
+
+/** The number that stands behind "at" in `text`, a valid JSON object, as it is written there. */
+std::string_view atToken(simdjson::ondemand::parser* parser, std::string_view text) {
+    auto document = parser->iterate(text.data(), text.size(), text.size() + LineReader::kPadding);
+    for (auto field : document.get_object()) {
+        std::string_view key;
+        if (field.unescaped_key().get(key) != simdjson::SUCCESS) break;
+        if (key == "at") return field.value().raw_json_token();
+    }
+    return {};
 }
 
 Error readCall(element json, TraceLine* line) {
@@ -330,14 +341,7 @@ std::optional<std::string> TraceParser::parse(std::string_view text, TraceLine* 
         if (ms >= 0 && ms <= kMaxTimeMs) time = ms * kNsPerMs;
     } else if (at->is_number()) {
         // The document tree rounds fractions to double; the text has them exactly.
-        auto number =
-                mNumberParser.iterate(text.data(), text.size(), text.size() + LineReader::kPadding);
-        std::string_view digits;
-        double value = 0;
-        if (number["at"].raw_json_token().get(digits) == simdjson::SUCCESS &&
-            at->get(value) == simdjson::SUCCESS) {
-            time = toNanoseconds(digits, value);
-        }
+        time = toNanoseconds(atToken(&mNumberParser, text), at->get_double());
     }
     if (!time) return R"("at" must be a number of at most six decimals, from 0 to 9e12)";
     line->at = *time;

@@ -61,6 +61,18 @@ TEST_F(ReplayTest, WritesFractionsOfMillisecondsAsTheyAre) {
                      reported("86400000000.123456", 0)}));
 }
 
+TEST_F(ReplayTest, ReadsATimeWhereverItStandsAndWhateverFollowsIt) {
+    const std::string call = R"("call": "SDCImpl.putRgbShotTally", "args": [7])";
+    EXPECT_EQ(happened(play("{" + call +
+                            R"(, "at": 1.5})"
+                            "\n#-9-9-9\n" +
+                            "{" + call +
+                            R"(, "\u0061t" : 2.250 })"
+                            "\n" +
+                            R"({"at": -0.0, "boot": "device"})")),
+              (Lines{reported("1.5", 0), reported("2.25", 0)}));
+}
+
 TEST_F(ReplayTest, AProcessBootKeepsTheClockAndThePropertiesADeviceBootOnlyWhatPersists) {
     const std::string properties =
             R"({"at": 0, "property": {"persist.zuno.rgb.shot.count": "7", "sys.x": "1"}})"
