@@ -12,6 +12,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "platform/Display.h"
 #include "platform/PropertyService.h"
 #include "replay/CaptureImport.h"
 #include "replay/LineReader.h"
@@ -54,7 +55,9 @@ std::vector<unsigned char> readAll(int fd) {
 /** Plays files; between two boots it only keeps what outlives a process. */
 class Replay {
 public:
-    explicit Replay(const Options& options) : mOptions(options), mOutput(options.format) {}
+    explicit Replay(const Options& options) : mOptions(options), mOutput(options.format) {
+        platform::shareDisplay();
+    }
 
     int run() {
         for (const std::string& file : mOptions.files) {
@@ -88,7 +91,7 @@ private:
             fail(mName + ": not a device capture");
         } else if (text) {
             TraceLine first;
-            if (const auto error = mParser.parse(*text, &first)) {
+            if (const auto error = mParser.parse(*text, mName, &first)) {
                 fail(mName + ':' + std::to_string(mReader->lineNumber()) + ": " + *error);
             } else {
                 runTrace(first);
