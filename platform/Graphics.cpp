@@ -1,9 +1,11 @@
 /** The platform's graphics calls, on the display of platform/Display.h. */
 
+#include <cerrno>
 #include <condition_variable>
 #include <cstdlib>
 #include <cstring>
 #include <deque>
+#include <memory>
 #include <mutex>
 #include <thread>
 #include <utility>
@@ -97,34 +99,47 @@ private:
         return request;
     }
 
-    static void complete(const Request& request) {
-        android::gui::ScreenCaptureResults results;
-        if (request.fault == DisplayFault::kResults) {
-            results.result = UNKNOWN_ERROR;
+    static void complete(Request request) {
+        const auto signal = std::make_shared<Fence::Signal>();
+        sp<GraphicBuffer> buffer;
+        {
+            android::gui::ScreenCaptureResults results;
+            results.fence = new Fence(signal);
+            results.capturedSecureLayers = request.secure;
+            if (request.fault == DisplayFault::kResults) {
+                results.result = UNKNOWN_ERROR;
+            } else if (buffer = makeBuffer(request); buffer == nullptr) {
+                results.result = NO_MEMORY;
+            }
+            results.buffer = buffer;
             request.listener->onScreenCaptureCompleted(results);
-            return;
         }
+        if (buffer != nullptr) fill(buffer.get(), request);
+        // Nothing of the capture is held any more when the one who waits goes on.
+        buffer = nullptr;
+        request.listener = nullptr;
+        const std::lock_guard lock(signal->mutex);
+        signal->isGiven = true;
+        signal->given.notify_all();
+    }
+
+    static sp<GraphicBuffer> makeBuffer(const Request& request) {
         const auto width = static_cast<uint32_t>(request.area.getWidth());
         const auto height = static_cast<uint32_t>(request.area.getHeight());
         const sp<GraphicBuffer> buffer = new GraphicBuffer(
                 width, height, width + request.rowPadding, request.fault != DisplayFault::kLock);
-        if (buffer->mPixels == nullptr) {
-            results.result = NO_MEMORY;
-            request.listener->onScreenCaptureCompleted(results);
-            return;
-        }
-        const sp<Fence> fence = new Fence(/*valid=*/true);
-        results.buffer = buffer;
-        results.fence = fence;
-        results.capturedSecureLayers = request.secure;
-        request.listener->onScreenCaptureCompleted(results);
-        if (request.secure) copyDisplay(request.area, buffer->mPixels.get(), buffer->rowBytes());
-        for (uint32_t row = 0; row < height && request.rowPadding > 0; ++row) {
+        return buffer->mPixels == nullptr ? nullptr : buffer;
+    }
+
+    static void fill(GraphicBuffer* buffer, const Request& request) {
+        uint8_t* const pixels = buffer->mPixels.get();
+        if (request.secure) copyDisplay(request.area, pixels, buffer->rowBytes());
+        if (request.rowPadding == 0) return;
+        for (size_t row = 0; row < buffer->getHeight(); ++row) {
             // What nobody should look at is not black.
-            std::memset(buffer->mPixels.get() + row * buffer->rowBytes() + size_t{4} * width, 0xff,
+            std::memset(pixels + row * buffer->rowBytes() + size_t{4} * buffer->getWidth(), 0xff,
                         size_t{4} * request.rowPadding);
         }
-        fence->signal();
     }
 
     std::mutex mMutex;
@@ -159,21 +174,15 @@ uint32_t bytesPerPixel(PixelFormat format) {
 const sp<Fence> Fence::NO_FENCE(new Fence);
 
 status_t Fence::wait(int timeoutMs) {
-    if (!mValid) return OK;
-    std::unique_lock lock(mMutex);
-    if (timeoutMs == 0) return mSignalled ? OK : -ETIME;
-    mSignal.wait(lock, [this] { return mSignalled; });
+    if (!isValid()) return OK;
+    std::unique_lock lock(mSignal->mutex);
+    if (timeoutMs == 0) return mSignal->isGiven ? OK : -ETIME;
+    mSignal->given.wait(lock, [this] { return mSignal->isGiven; });
     return OK;
 }
 
 status_t Fence::waitForever(const char*) {
     return wait(-1);
-}
-
-void Fence::signal() {
-    const std::lock_guard lock(mMutex);
-    mSignalled = true;
-    mSignal.notify_all();
 }
 
 GraphicBuffer::GraphicBuffer(uint32_t width, uint32_t height, uint32_t stride, bool lockable)

@@ -4,6 +4,11 @@
 #include <cstddef>
 #include <cstring>
 
+// Where the processor may have wider registers than the compiler may count on.
+#if defined(__x86_64__) && !defined(SENSOR_PRIV_BASELINE)
+#define SENSOR_PRIV_AVX2
+#endif
+
 namespace android {
 
 namespace {
@@ -77,7 +82,7 @@ __attribute__((always_inline)) inline ColorAverage sumRows(const uint8_t* base, 
     return sum;
 }
 
-#ifdef __x86_64__
+#ifdef SENSOR_PRIV_AVX2
 __attribute__((target("avx2"))) ColorAverage sumRowsAvx2(const uint8_t* base, size_t steps,
                                                          size_t rows, size_t rowBytes) {
     return sumRows<32>(base, steps, rows, rowBytes);
@@ -85,7 +90,7 @@ __attribute__((target("avx2"))) ColorAverage sumRowsAvx2(const uint8_t* base, si
 #endif
 
 ColorAverage sumRows(const uint8_t* base, size_t steps, size_t rows, size_t rowBytes) {
-#ifdef __x86_64__
+#ifdef SENSOR_PRIV_AVX2
     if (__builtin_cpu_supports("avx2")) return sumRowsAvx2(base, steps, rows, rowBytes);
 #endif
     return sumRows<16>(base, steps, rows, rowBytes);

@@ -1,7 +1,9 @@
 #pragma once
 
 #include <condition_variable>
+#include <memory>
 #include <mutex>
+#include <utility>
 
 #include <utils/Errors.h>
 #include <utils/LightRefBase.h>
@@ -25,7 +27,7 @@ public:
     Fence(const Fence&) = delete;
     Fence& operator=(const Fence&) = delete;
 
-    bool isValid() const { return mValid; }
+    bool isValid() const { return mSignal != nullptr; }
 
     /**
      * Waits for the signal; with 0, only looks, and answers -ETIME if it has not come. The clock
@@ -38,16 +40,17 @@ private:
     friend class LightRefBase<Fence>;
     friend class platform::CaptureThread;
 
-    explicit Fence(bool valid) : mValid(valid) {}
+    struct Signal {
+        std::mutex mutex;
+        std::condition_variable given;
+        bool isGiven = false;  // guarded by mutex
+    };
+
+    explicit Fence(std::shared_ptr<Signal> signal) : mSignal(std::move(signal)) {}
     ~Fence() = default;
 
-    void signal();
-
-    const bool mValid = false;
-
-    std::mutex mMutex;
-    std::condition_variable mSignal;
-    bool mSignalled = false;  // guarded by mMutex
+    // Whoever gives the signal does so without a reference to the fence.
+    const std::shared_ptr<Signal> mSignal;
 };
 
 }  // namespace android
