@@ -41,6 +41,21 @@ std::optional<std::string> call(Result (Class::*operation)(Parameters...),
     }
 }
 
+/** A sample: the averages come back through the caller's memory. */
+template <typename Class>
+std::optional<std::string> call(int (Class::*operation)(int*, int*),
+                                const std::vector<Argument>& arguments, std::index_sequence<0>) {
+    auto rect = std::get<Rectangle>(arguments[0]);
+    int rgb[3] = {};
+    const int status = (Class::getInstance()->*operation)(rgb, rect.data());
+    std::string json = R"({"status": )" + std::to_string(status);
+    if (status != 0) {
+        json += R"(, "rgb": [)" + std::to_string(rgb[0]) + ", " + std::to_string(rgb[1]) + ", " +
+                std::to_string(rgb[2]) + ']';
+    }
+    return json + '}';
+}
+
 /** `Operation` is a member of a singleton, or `getInstance` itself. */
 template <auto Operation>
 std::optional<std::string> call(const std::vector<Argument>& arguments) {

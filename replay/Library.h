@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -15,6 +16,8 @@
 #include "core/SDCImpl.h"
 #include "exception/FlowingDataException.h"
 #include "exception/UltraException.h"
+#include "rgb/LightSensorState.h"
+#include "rgb/RgbShotManager.h"
 
 /**
  * The library as a trace sees it: calls and variables by their place in library.inc. The tool
@@ -24,10 +27,11 @@
 namespace replay {
 
 using IntList = std::vector<int32_t>;
+using Rectangle = std::array<int32_t, 4>;  // left, top, right, bottom
 
 /** One argument of a call, as a trace gives it. */
-using Argument = std::variant<bool, int32_t, int64_t, std::string, IntList, sensors_event_t,
-                              android::UltraExceptionInfo>;
+using Argument = std::variant<bool, int32_t, int64_t, std::string, IntList, Rectangle,
+                              sensors_event_t, android::UltraExceptionInfo>;
 
 /** What a trace has to give for a parameter of type `T`. */
 template <typename T>
@@ -53,6 +57,10 @@ struct ArgumentsOf;
 template <typename Class, typename Result, typename... Parameters>
 struct ArgumentsOf<Result (Class::*)(Parameters...)> {
     using type = std::tuple<typename ArgumentFor<std::decay_t<Parameters>>::type...>;
+};
+template <typename Class>
+struct ArgumentsOf<int (Class::*)(int* rgbOut, int* rect)> {
+    using type = std::tuple<Rectangle>;
 };
 template <typename Result>
 struct ArgumentsOf<Result (*)()> {

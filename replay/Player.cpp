@@ -5,6 +5,7 @@
 #include <android/log.h>
 #include <dlfcn.h>
 
+#include "platform/Display.h"
 #include "platform/PropertyService.h"
 #include "platform/Telemetry.h"
 #include "replay/VirtualClock.h"
@@ -116,6 +117,9 @@ private:
                     platform::setDeviceProperty(name, value);
                 }
                 break;
+            case TraceLine::Action::kDisplay:
+                platform::changeDisplay(mLine.display);
+                break;
             case TraceLine::Action::kNone:
             case TraceLine::Action::kBoot:
                 break;
@@ -154,7 +158,7 @@ bool readLine(const std::string& name, LineReader* reader, TraceParser* parser, 
     };
     while (const auto text = reader->next()) {
         if (isSkipped(*text)) continue;
-        if (const auto error = parser->parse(*text, line)) return fail(*error);
+        if (const auto error = parser->parse(*text, name, line)) return fail(*error);
         return true;
     }
     return reader->error() ? fail(*reader->error()) : false;

@@ -12,6 +12,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "platform/Display.h"
 #include "platform/PropertyService.h"
 #include "replay/CaptureImport.h"
 #include "replay/FileIo.h"
@@ -32,7 +33,9 @@ struct Report {
 /** Plays files; between two boots it only keeps what outlives a process. */
 class Replay {
 public:
-    explicit Replay(const Options& options) : mOptions(options), mOutput(options.format) {}
+    explicit Replay(const Options& options) : mOptions(options), mOutput(options.format) {
+        platform::shareDisplay();
+    }
 
     int run() {
         for (const std::string& file : mOptions.files) {
@@ -66,7 +69,7 @@ private:
             fail(mName + ": not a device capture");
         } else if (text) {
             TraceLine first;
-            if (const auto error = mParser.parse(*text, &first)) {
+            if (const auto error = mParser.parse(*text, mName, &first)) {
                 fail(mName + ':' + std::to_string(mReader->lineNumber()) + ": " + *error);
             } else {
                 runTrace(first);

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <filesystem>
+#include <limits>
 #include <type_traits>
 
 #include "platform/PropertyService.h"
@@ -57,6 +59,19 @@ Error read(element json, std::string* value) {
     if (json.get(text) != simdjson::SUCCESS) return "must be a text";
     if (text.find('\0') != std::string_view::npos) return "must be a text without NUL";
     value->assign(text);
+    return {};
+}
+
+template <size_t Size>
+Error read(element json, std::array<int32_t, Size>* value) {
+    array list;
+    if (json.get(list) != simdjson::SUCCESS || list.size() != Size) {
+        return "must be an array of " + std::to_string(Size) + " integers";
+    }
+    int32_t* next = value->data();
+    for (const element item : list) {
+        if (Error error = read(item, next++)) return "each element " + *error;
+    }
     return {};
 }
 
@@ -277,6 +292,97 @@ Error readProperties(element json, TraceLine* line) {
     return {};
 }
 
+template <size_t Size>
+Error checkRange(const std::array<int32_t, Size>& values, int32_t min, int32_t max) {
+    for (const int32_t value : values) {
+        if (value < min || value > max) {
+            return "must lie from " + std::to_string(min) + " to " + std::to_string(max);
+        }
+    }
+    return {};
+}
+
+Error readSize(element json, platform::DisplaySize* size) {
+    std::array<int32_t, 2> sides{};
+    if (Error error = read(json, &sides)) return error;
+    *size = {static_cast<uint32_t>(sides[0]), static_cast<uint32_t>(sides[1])};
+    return checkRange(sides, 1, std::numeric_limits<int32_t>::max());
+}
+
+Error readColor(element json, platform::Color* color) {
+    std::array<int32_t, 3> rgb{};
+    if (Error error = read(json, &rgb)) return error;
+    *color = {static_cast<uint8_t>(rgb[0]), static_cast<uint8_t>(rgb[1]),
+              static_cast<uint8_t>(rgb[2])};
+    return checkRange(rgb, 0, 255);
+}
+
+Error readRowPadding(element json, uint32_t* pixels) {
+    std::array<int32_t, 1> value{};
+    if (Error error = read(json, value.data())) return error;
+    *pixels = static_cast<uint32_t>(value[0]);
+    return checkRange(value, 0, platform::Picture::kMaxSide);
+}
+
+Error readPicture(element json, const std::string& trace, platform::Picture* picture) {
+    std::string path;
+    if (Error error = read(json, &path)) return error;
+    // An absolute path stands for itself; standard input, "-", is beside the current directory.
+    const auto file = std::filesystem::path(trace).parent_path() / path;
+    if (Error error = platform::readPng(file, picture))
+        return toJson(std::string_view(path)) + ": " + *error;
+    return {};
+}
+
+Error readFault(element json, platform::DisplayFault* fault) {
+    constexpr std::pair<std::string_view, platform::DisplayFault> kFaults[] = {
+            {"token", platform::DisplayFault::kToken},
+            {"capture", platform::DisplayFault::kCapture},
+            {"results", platform::DisplayFault::kResults},
+            {"lock", platform::DisplayFault::kLock},
+    };
+    *fault = platform::DisplayFault::kNone;
+    if (json.is_null()) return {};
+    std::string_view name;
+    if (json.get(name) == simdjson::SUCCESS) {
+        for (const auto& [known, value] : kFaults) {
+            if (name == known) *fault = value;
+        }
+    }
+    if (*fault != platform::DisplayFault::kNone) return {};
+    return R"(must be "token", "capture", "results", "lock" or null)";
+}
+
+Error readDisplay(element json, const std::string& trace, TraceLine* line) {
+    line->action = TraceLine::Action::kDisplay;
+    platform::DisplayChange& change = line->display;
+    change = {};
+    object values;
+    if (json.get(values) != simdjson::SUCCESS) return R"("display" must be an object)";
+    if (Error error = checkKeys(values)) return error;
+    for (const auto [key, value] : values) {
+        Error error;
+        if (key == "size") {
+            error = readSize(value, &change.size.emplace());
+        } else if (key == "color") {
+            error = readColor(value, &change.color.emplace());
+        } else if (key == "png") {
+            error = readPicture(value, trace, &change.picture.emplace());
+        } else if (key == "rowPadding") {
+            error = readRowPadding(value, &change.rowPadding.emplace());
+        } else if (key == "fault") {
+            error = readFault(value, &change.fault.emplace());
+        } else {
+            return "unknown key " + toJson(key);
+        }
+        if (error) return toJson(key) + ' ' + *error;
+    }
+    if (change.picture && (change.size || change.color)) {
+        return R"("png" together with "size" or "color")";
+    }
+    return {};
+}
+
 Error readBoot(element json, TraceLine* line) {
     line->action = TraceLine::Action::kBoot;
     std::string_view kind;
@@ -296,7 +402,8 @@ std::string_view callName(size_t index) {
     return kCalls[index].name;
 }
 
-std::optional<std::string> TraceParser::parse(std::string_view text, TraceLine* line) {
+std::optional<std::string> TraceParser::parse(std::string_view text, const std::string& trace,
+                                              TraceLine* line) {
     static_assert(LineReader::kPadding >= simdjson::SIMDJSON_PADDING);
     element document;
     object fields;
@@ -325,6 +432,8 @@ std::optional<std::string> TraceParser::parse(std::string_view text, TraceLine* 
                 error = readVariables(value, line);
             } else if (key == "property") {
                 error = readProperties(value, line);
+            } else if (key == "display") {
+                error = readDisplay(value, trace, line);
             } else if (key == "boot") {
                 error = readBoot(value, line);
             } else {

@@ -10,6 +10,7 @@
 
 #include <simdjson.h>
 
+#include "platform/Display.h"
 #include "replay/Library.h"
 
 namespace replay {
@@ -18,7 +19,7 @@ enum class BootKind { kDevice, kProcess };
 
 /** One line of a trace, judged: its action is known to be in order and can be carried out. */
 struct TraceLine {
-    enum class Action { kNone, kCall, kSet, kProperty, kBoot };
+    enum class Action { kNone, kCall, kSet, kProperty, kDisplay, kBoot };
 
     int64_t at = 0;  // nanoseconds of the monotonic clock
     Action action = Action::kNone;
@@ -33,6 +34,9 @@ struct TraceLine {
     // kProperty: no value deletes
     std::vector<std::pair<std::string, std::optional<std::string>>> properties;
 
+    // kDisplay: a picture has been read already
+    platform::DisplayChange display;
+
     // kBoot
     BootKind boot = BootKind::kDevice;
 };
@@ -40,14 +44,16 @@ struct TraceLine {
 /** The name of a call, as a trace writes it. */
 std::string_view callName(size_t index);
 
-/** Judges lines by their text alone; whether times go back is the caller's business. */
+/** Judges lines one by one; whether times go back is the caller's business. */
 class TraceParser {
 public:
     /**
      * Parses `text`, behind which `LineReader::kPadding` bytes must be readable, into `*line`.
-     * Returns nothing, or what is wrong with it; `*line` is then not to be used.
+     * Pictures are looked for beside the file `trace`. Returns nothing, or what is wrong with the
+     * line; `*line` is then not to be used.
      */
-    std::optional<std::string> parse(std::string_view text, TraceLine* line);
+    std::optional<std::string> parse(std::string_view text, const std::string& trace,
+                                     TraceLine* line);
 
 private:
     simdjson::dom::parser mParser;

@@ -7,3 +7,6 @@ BUILD_PACKAGES='g++ cmake ninja-build pkg-config android-libutils-dev android-li
 # To test them as well.
 TEST_PACKAGES='clang-14 libclang-rt-14-dev clang-format-14 clang-tidy-14 libgtest-dev
     g++-arm-linux-gnueabihf'
+
+# To measure them.
+BENCH_PACKAGES='libbenchmark-dev'

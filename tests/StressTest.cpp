@@ -37,6 +37,8 @@ T make(Random& random) {
         IntList list(random() % 14);
         for (int32_t& value : list) value = pick(random, {0, 1, 2, 3, 7, 10});
         return list;
+    } else if constexpr (std::is_same_v<T, Rectangle>) {
+        return {0, 0, pick(random, {0, 3, 16}), pick(random, {0, 4, 16})};
     } else if constexpr (std::is_same_v<T, sensors_event_t>) {
         sensors_event_t event{};
         event.type = pick(random, {1, 5, 8});

@@ -1,0 +1,9 @@
+#pragma once
+
+#include <cstdint>
+
+#include "rgb/ColorAverage.h"
+
+/** `averageColor` of 4-byte pixels as one would write it down, compiled with -O2. */
+android::ColorAverage averagePlainly(const uint8_t* row, uint32_t width, uint32_t height,
+                                     uint32_t stride);

@@ -1,0 +1,79 @@
+#include "platform/Picture.h"
+
+#include <cerrno>
+#include <csetjmp>
+#include <cstddef>
+#include <cstdio>
+#include <cstring>
+#include <memory>
+
+#include <png.h>
+
+namespace platform {
+
+namespace {
+
+/** libpng's state for one file; what it complains about goes to `*error`. */
+class PngFile {
+public:
+    PngFile(std::FILE* file, std::string* error)
+          : mPng(png_create_read_struct(PNG_LIBPNG_VER_STRING, error, takeError, ignoreWarning)),
+            mInfo(png_create_info_struct(mPng)) {
+        png_init_io(mPng, file);
+    }
+
+    ~PngFile() { png_destroy_read_struct(&mPng, &mInfo, nullptr); }
+
+    PngFile(const PngFile&) = delete;
+    PngFile& operator=(const PngFile&) = delete;
+
+    /** libpng leaves this by a jump back on an error: it may hold nothing to be destroyed. */
+    bool read(Picture* picture) {
+        if (setjmp(png_jmpbuf(mPng)) != 0) return false;
+        png_read_info(mPng, mInfo);
+        picture->width = png_get_image_width(mPng, mInfo);
+        picture->height = png_get_image_height(mPng, mInfo);
+        if (picture->width > Picture::kMaxSide || picture->height > Picture::kMaxSide) {
+            png_error(mPng, "a side is longer than 16384 pixels");
+        }
+        png_set_expand(mPng);
+        png_set_scale_16(mPng);
+        png_set_gray_to_rgb(mPng);
+        png_set_add_alpha(mPng, 0xff, PNG_FILLER_AFTER);
+        const int passes = png_set_interlace_handling(mPng);
+        png_read_update_info(mPng, mInfo);
+        const size_t rowBytes = png_get_rowbytes(mPng, mInfo);
+        picture->pixels.resize(rowBytes * picture->height);
+        for (int pass = 0; pass < passes; ++pass) {
+            for (size_t row = 0; row < picture->height; ++row) {
+                png_read_row(mPng, picture->pixels.data() + row * rowBytes, nullptr);
+            }
+        }
+        png_read_end(mPng, nullptr);
+        return true;
+    }
+
+private:
+    [[noreturn]] static void takeError(png_structp png, png_const_charp message) {
+        static_cast<std::string*>(png_get_error_ptr(png))->assign(message);
+        png_longjmp(png, 1);
+    }
+
+    static void ignoreWarning(png_structp, png_const_charp) {}
+
+    png_structp mPng;
+    png_infop mInfo;
+};
+
+}  // namespace
+
+std::optional<std::string> readPng(const std::string& path, Picture* picture) {
+    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(std::fopen(path.c_str(), "rbe"),
+                                                               std::fclose);
+    if (file == nullptr) return std::string("cannot open: ") + std::strerror(errno);
+    std::string error;
+    if (PngFile(file.get(), &error).read(picture)) return std::nullopt;
+    return "not a sound PNG picture: " + error;
+}
+
+}  // namespace platform

@@ -1,0 +1,10 @@
+#pragma once
+
+#include <android/gui/IScreenCaptureListener.h>
+
+namespace android::gui {
+
+/** A listener that lives in this process. */
+class BnScreenCaptureListener : public IScreenCaptureListener {};
+
+}  // namespace android::gui

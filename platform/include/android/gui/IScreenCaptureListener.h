@@ -1,0 +1,16 @@
+#pragma once
+
+#include <binder/Status.h>
+#include <gui/ScreenCaptureResults.h>
+#include <utils/RefBase.h>
+
+namespace android::gui {
+
+/** Whoever is told that a capture is over. */
+class IScreenCaptureListener : public virtual RefBase {
+public:
+    virtual ::android::binder::Status onScreenCaptureCompleted(
+            const ::android::gui::ScreenCaptureResults& captureResults) = 0;
+};
+
+}  // namespace android::gui

@@ -1,0 +1,81 @@
+#include <algorithm>
+#include <cstdint>
+
+#include <binder/IBinder.h>
+#include <gui/ScreenCaptureResults.h>
+#include <gui/SurfaceComposerClient.h>
+#include <hardware/gralloc.h>
+#include <ui/GraphicBuffer.h>
+#include <ui/GraphicTypes.h>
+#include <ui/PixelFormat.h>
+#include <ui/Rect.h>
+#include <utils/Errors.h>
+#include <utils/StrongPointer.h>
+
+#include "core/Log.h"
+#include "core/SDCImpl.h"
+#include "rgb/ColorAverage.h"
+#include "rgb/RgbShotManager.h"
+#include "rgb/SyncScreenCaptureListener.h"
+
+namespace android {
+
+// What the operation holds it releases in the order: buffer, results, listener, request, token.
+int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
+    if (std::all_of(rect, rect + 4, [](int value) { return value == 0; })) {
+        SENSOR_PRIV_LOGD("ic scope is 0. not support pixcel");
+        return 0;
+    }
+    const sp<IBinder> token = SurfaceComposerClient::getInternalDisplayToken();
+    if (token == nullptr) {
+        SENSOR_PRIV_LOGE("Unable to get handle for display");
+        return 0;
+    }
+
+    DisplayCaptureArgs args;
+    args.pixelFormat = ui::PixelFormat::RGBA_8888;
+    args.sourceCrop = Rect(rect[0], rect[1], rect[2], rect[3]);
+    args.captureSecureLayers = true;
+    args.displayToken = token;
+    args.width = static_cast<uint32_t>(rect[2]) - static_cast<uint32_t>(rect[0]);
+    args.height = static_cast<uint32_t>(rect[3]) - static_cast<uint32_t>(rect[1]);
+    args.useIdentityTransform = true;
+
+    const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
+    if (ScreenshotClient::captureDisplay(args, listener) != OK) {
+        SENSOR_PRIV_LOGE("UL: captureDisplay failed!");
+        return 0;
+    }
+    const gui::ScreenCaptureResults results = listener->waitForResults();
+    if (results.result != OK) {
+        SENSOR_PRIV_LOGE("UL: captureResults failed!");
+        return 0;
+    }
+
+    const sp<GraphicBuffer> buffer = results.buffer;
+    void* base = nullptr;
+    if (buffer->lock(GRALLOC_USAGE_SW_READ_OFTEN, &base) != OK || base == nullptr) {
+        buffer->unlock();
+        SENSOR_PRIV_LOGE("UL: rgb update fail, base is NULL ");
+        return 0;
+    }
+    const uint32_t width = buffer->getWidth();
+    const uint32_t height = buffer->getHeight();
+    const uint32_t stride = buffer->getStride();
+    const PixelFormat format = buffer->getPixelFormat();
+    // The mapping outlives the lock: it goes with the buffer, which is held until the return.
+    buffer->unlock();
+    const ColorAverage average = averageColor(base, width, height, stride, format);
+    rgbOut[0] = static_cast<int>(average.red);
+    rgbOut[1] = static_cast<int>(average.green);
+    rgbOut[2] = static_cast<int>(average.blue);
+
+    SDCImpl::getInstance()->setRgbShotCount();
+    if (mLogSwitch != 0) {
+        SENSOR_PRIV_LOGD("UL: Pixcel changed: red = %d, green = %d, blue = %d", rgbOut[0],
+                         rgbOut[1], rgbOut[2]);
+    }
+    return 1;
+}
+
+}  // namespace android

@@ -1,0 +1,19 @@
+#include "rgb/SyncScreenCaptureListener.h"
+
+#include <ui/Fence.h>
+
+namespace android {
+
+binder::Status SyncScreenCaptureListener::onScreenCaptureCompleted(
+        const gui::ScreenCaptureResults& results) {
+    mResults.set_value(results);
+    return binder::Status::ok();
+}
+
+gui::ScreenCaptureResults SyncScreenCaptureListener::waitForResults() {
+    gui::ScreenCaptureResults results = mResults.get_future().get();
+    results.fence->waitForever("");
+    return results;
+}
+
+}  // namespace android

@@ -1,0 +1,32 @@
+#pragma once
+
+#include <future>
+
+#include <android/gui/BnScreenCaptureListener.h>
+#include <binder/Status.h>
+#include <gui/ScreenCaptureResults.h>
+
+#include "core/Export.h"
+
+namespace android {
+
+/** Lets one thread wait for one capture, which the platform completes on another. */
+class SENSOR_PRIV_HIDDEN SyncScreenCaptureListener : public gui::BnScreenCaptureListener {
+public:
+    /**
+     * Takes the results and lets the waiting thread go on. The platform calls it once, on a binder
+     * thread; a second call ends the process.
+     */
+    binder::Status onScreenCaptureCompleted(const gui::ScreenCaptureResults& results) override;
+
+    /**
+     * Blocks until the results are there and their buffer's contents are complete, without a
+     * time-out. To be called once; a second call ends the process.
+     */
+    gui::ScreenCaptureResults waitForResults();
+
+private:
+    std::promise<gui::ScreenCaptureResults> mResults;
+};
+
+}  // namespace android

@@ -1,0 +1,238 @@
+#include <algorithm>
+#include <array>
+#include <cstdio>
+#include <random>
+#include <thread>
+
+#include <binder/Status.h>
+#include <gui/SurfaceComposerClient.h>
+#include <png.h>
+
+#include "core/Log.h"
+#include "platform/Display.h"
+#include "rgb/RgbShotManager.h"
+#include "rgb/SyncScreenCaptureListener.h"
+#include "tests/LibraryTest.h"
+
+namespace android {
+namespace {
+
+using platform::changeDisplay;
+using platform::DisplayChange;
+using platform::DisplayFault;
+using platform::Picture;
+
+using Rgb = std::array<int, 3>;
+using Rectangle = std::array<int, 4>;
+
+constexpr char kCount[] = "persist.zuno.rgb.shot.count";
+constexpr Rgb kUntouched = {-1, -2, -3};
+
+/** `kUntouched` if the sample fails. */
+Rgb sample(Rectangle rect) {
+    Rgb rgb = kUntouched;
+    const int status = RgbShotManager::getInstance()->getScreenPixcel(rgb.data(), rect.data());
+    EXPECT_EQ(status, rgb != kUntouched);
+    return rgb;
+}
+
+Picture randomPicture(uint32_t width, uint32_t height, unsigned seed) {
+    std::mt19937 random(seed);
+    Picture picture{width, height, std::vector<uint8_t>(size_t{4} * width * height)};
+    for (uint8_t& byte : picture.pixels) byte = static_cast<uint8_t>(random());
+    return picture;
+}
+
+Rgb averageOf(const Picture& picture, const Rectangle& rect) {
+    const auto [left, top, right, bottom] = rect;
+    std::array<int64_t, 3> sums{};
+    for (int y = std::max(top, 0); y < std::min<int>(bottom, picture.height); ++y) {
+        for (int x = std::max(left, 0); x < std::min<int>(right, picture.width); ++x) {
+            for (size_t i = 0; i < 3; ++i) {
+                sums[i] += picture.pixels[4 * (size_t{picture.width} * y + x) + i];
+            }
+        }
+    }
+    const int64_t count = int64_t{right - left} * (bottom - top);
+    return {static_cast<int>(sums[0] / count), static_cast<int>(sums[1] / count),
+            static_cast<int>(sums[2] / count)};
+}
+
+class ScreenCaptureTest : public LibraryTest {
+protected:
+    /** Leaves the lines of the start behind. */
+    ScreenCaptureTest() {
+        RgbShotManager::getInstance();
+        taken();
+    }
+};
+
+TEST_F(ScreenCaptureTest, AveragesAnyRectangleOfAPicture) {
+    DisplayChange change;
+    change.picture = randomPicture(70, 150, 1);
+    std::mt19937 random(2);
+    for (int round = 0; round < 300; ++round) {
+        change.rowPadding = round % 3 == 0 ? random() % 70 : 0;
+        changeDisplay(change);
+        const int left = static_cast<int>(random() % 100) - 20;
+        const int top = static_cast<int>(random() % 180) - 20;
+        const Rectangle rect = {left, top, left + 1 + static_cast<int>(random() % 120),
+                                top + 1 + static_cast<int>(random() % 170)};
+        ASSERT_EQ(sample(rect), averageOf(*change.picture, rect)) << ::testing::PrintToString(rect);
+    }
+}
+
+TEST_F(ScreenCaptureTest, CountsAndLogsASample) {
+    DisplayChange change;
+    change.color = {200, 100, 50};
+    changeDisplay(change);
+    advanceTo(5000);
+    EXPECT_EQ(sample({0, 0, 10, 10}), (Rgb{200, 100, 50}));
+    EXPECT_EQ(taken(), Lines{});
+    mLogSwitch = 1;
+    EXPECT_EQ(sample({1079, 2399, 1081, 2400}), (Rgb{100, 50, 25})) << "half of it is outside";
+    advanceTo(8000);
+    EXPECT_EQ(taken(), (Lines{"5000 log 3 UL: Pixcel changed: red = 100, green = 50, blue = 25",
+                              "5500 persist.zuno.rgb.shot.count=2"}));
+}
+
+TEST_F(ScreenCaptureTest, AFailureIsLoggedLeavesTheOutputAndCountsNothing) {
+    constexpr char kNoScope[] = "0 log 3 ic scope is 0. not support pixcel";
+    constexpr char kNoToken[] = "0 log 6 Unable to get handle for display";
+    constexpr char kNoCapture[] = "0 log 6 UL: captureDisplay failed!";
+    constexpr char kNoResults[] = "0 log 6 UL: captureResults failed!";
+    constexpr char kNoBase[] = "0 log 6 UL: rgb update fail, base is NULL ";
+    constexpr int kMin = std::numeric_limits<int>::min();
+    constexpr int kMax = std::numeric_limits<int>::max();
+    const struct {
+        DisplayFault fault;
+        Rectangle rect;
+        const char* log;
+    } kCases[] = {
+            {DisplayFault::kToken, {0, 0, 0, 0}, kNoScope},
+            {DisplayFault::kToken, {0, 0, 10, 10}, kNoToken},
+            {DisplayFault::kCapture, {0, 0, 10, 10}, kNoCapture},
+            {DisplayFault::kResults, {0, 0, 10, 10}, kNoResults},
+            {DisplayFault::kLock, {0, 0, 10, 10}, kNoBase},
+            {DisplayFault::kNone, {0, 0, 0, 10}, kNoCapture},
+            {DisplayFault::kNone, {5, 0, 4, 10}, kNoCapture},
+            {DisplayFault::kNone, {0, 0, 10, 16385}, kNoCapture},
+            {DisplayFault::kNone, {kMin, kMin, kMax, kMax}, kNoCapture},
+            {DisplayFault::kNone, {kMax, 0, kMin, 1}, kNoCapture},
+    };
+    for (const auto& [fault, rect, log] : kCases) {
+        DisplayChange change;
+        change.fault = fault;
+        changeDisplay(change);
+        EXPECT_EQ(sample(rect), kUntouched);
+        EXPECT_EQ(taken(), Lines{log});
+    }
+    advanceTo(1000);
+    EXPECT_EQ(property(kCount), "");
+
+    DisplayChange change;
+    change.fault = DisplayFault::kNone;
+    changeDisplay(change);
+    EXPECT_EQ(sample({0, 0, 10, 10}), Rgb{});
+    advanceTo(1500);
+    EXPECT_EQ(property(kCount), "1");
+}
+
+TEST_F(ScreenCaptureTest, SamplesOfSeveralThreadsDoNotTouchEachOther) {
+    DisplayChange change;
+    change.picture = randomPicture(64, 64, 3);
+    changeDisplay(change);
+    std::vector<std::thread> threads;
+    for (int i = 0; i < 4; ++i) {
+        threads.emplace_back([&, rect = Rectangle{i, i, 16 * (i + 1), 64}] {
+            const Rgb expected = averageOf(*change.picture, rect);
+            for (int round = 0; round < 50; ++round) EXPECT_EQ(sample(rect), expected);
+        });
+    }
+    for (std::thread& thread : threads) thread.join();
+    advanceTo(500);
+    EXPECT_EQ(property(kCount), "200");
+}
+
+TEST_F(ScreenCaptureTest, AListenerServesOneCapture) {
+    const auto useTwice = [](auto use) noexcept {
+        const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
+        EXPECT_TRUE(listener->onScreenCaptureCompleted({}).isOk());
+        EXPECT_EQ(listener->waitForResults().result, OK);
+        use(listener);
+    };
+    EXPECT_DEATH(useTwice([](const auto& l) { l->onScreenCaptureCompleted({}); }), "");
+    EXPECT_DEATH(useTwice([](const auto& l) { l->waitForResults(); }), "");
+}
+
+TEST_F(ScreenCaptureTest, APictureGivesTheDisplayItsSizeUntilAColorOrASizeEndsIt) {
+    DisplayChange change;
+    change.color = {10, 20, 30};
+    change.picture = Picture{1, 2, {1, 2, 3, 0, 5, 6, 7, 255}};
+    changeDisplay(change);
+    EXPECT_EQ(sample({0, 0, 1, 2}), (Rgb{3, 4, 5}));
+    change = {};
+    change.rowPadding = 3;
+    changeDisplay(change);
+    EXPECT_EQ(sample({0, 1, 2, 2}), (Rgb{2, 3, 3})) << "half of it is outside";
+    change = {};
+    change.size = {1, 1};
+    changeDisplay(change);
+    EXPECT_EQ(sample({0, 0, 1, 2}), (Rgb{5, 10, 15}));
+}
+
+/** Writes `pixels` as a picture of 3 x 1 that libpng's `format` describes. */
+std::string writePng(const char* name, uint32_t format, const std::vector<uint8_t>& pixels) {
+    std::string path = ::testing::TempDir() + name;
+    png_image image{};
+    image.version = PNG_IMAGE_VERSION;
+    image.width = 3;
+    image.height = 1;
+    image.format = format;
+    EXPECT_NE(png_image_write_to_file(&image, path.c_str(), 0, pixels.data(), 0, nullptr), 0);
+    return path;
+}
+
+TEST(PictureTest, PixelsAreTakenAsTheyAreStored) {
+    const struct {
+        uint32_t format;
+        std::vector<uint8_t> stored;
+        std::vector<uint8_t> taken;
+    } kCases[] = {
+            {PNG_FORMAT_RGBA,
+             {9, 8, 7, 1, 200, 3, 4, 0, 5, 6, 7, 255},
+             {9, 8, 7, 1, 200, 3, 4, 0, 5, 6, 7, 255}},
+            {PNG_FORMAT_RGB,
+             {9, 8, 7, 200, 3, 4, 5, 6, 7},
+             {9, 8, 7, 255, 200, 3, 4, 255, 5, 6, 7, 255}},
+            {PNG_FORMAT_GA, {9, 1, 200, 0, 5, 255}, {9, 9, 9, 1, 200, 200, 200, 0, 5, 5, 5, 255}},
+    };
+    for (const auto& [format, stored, expected] : kCases) {
+        const std::string path = writePng("stored.png", format, stored);
+        Picture picture;
+        EXPECT_EQ(platform::readPng(path, &picture), std::nullopt);
+        EXPECT_EQ(picture.width, 3u);
+        EXPECT_EQ(picture.pixels, expected);
+        std::remove(path.c_str());
+    }
+}
+
+TEST(PictureTest, EveryCutOfAFileIsRefused) {
+    const std::string path = writePng("cut.png", PNG_FORMAT_RGB, {1, 2, 3, 4, 5, 6, 7, 8, 9});
+    std::FILE* file = std::fopen(path.c_str(), "rb");
+    std::vector<char> bytes(1000);
+    bytes.resize(std::fread(bytes.data(), 1, bytes.size(), file));
+    std::fclose(file);
+    Picture picture;
+    for (size_t size = 0; size < bytes.size(); size += 3) {
+        file = std::fopen(path.c_str(), "wb");
+        std::fwrite(bytes.data(), 1, size, file);
+        std::fclose(file);
+        EXPECT_NE(platform::readPng(path, &picture), std::nullopt) << size;
+    }
+    std::remove(path.c_str());
+    EXPECT_EQ(platform::readPng(path, &picture), "cannot open: No such file or directory");
+}
+
+}  // namespace
+}  // namespace android
