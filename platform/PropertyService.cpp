@@ -1,6 +1,8 @@
 #include "platform/PropertyService.h"
 
+#include <algorithm>
 #include <cstring>
+#include <filesystem>
 #include <memory>
 #include <mutex>
 #include <string_view>
@@ -25,26 +27,18 @@ bool startsWith(std::string_view text, std::string_view prefix) {
     return text.substr(0, prefix.size()) == prefix;
 }
 
+/** How long a process waits for others at a file. */
+constexpr int kBusyMs = 10'000;
+
 /** One open database with its statements; what fails is remembered, the first failure only. */
 class Store {
 public:
-    explicit Store(const std::string& path) : mPath(path) {
-        check(sqlite3_open(path.c_str(), &mDb));
-        sqlite3_busy_timeout(mDb, 10'000);
-        // A write-ahead log makes each write one append. The kernel keeps what a killed process
-        // has written, so nothing has to be synced: only a power cut could lose a write.
-        run("PRAGMA journal_mode = WAL");
-        run("PRAGMA synchronous = OFF");
-        checkPages();
-        run(kSchema);
-        mGet = prepare("SELECT value FROM properties WHERE name = ?1");
-        mSet =
-                prepare("INSERT INTO properties VALUES (?1, ?2)"
-                        " ON CONFLICT (name) DO UPDATE SET value = excluded.value");
-        mErase = prepare("DELETE FROM properties WHERE name = ?1");
-        // Tells at once whether the file can be written.
-        run("BEGIN IMMEDIATE; PRAGMA user_version = 1; COMMIT");
-    }
+    /** In memory. */
+    Store() : Store("memory", ":memory:") {}
+
+    /** In a file. Its path is made absolute: SQLite has a meaning of its own for some names. */
+    explicit Store(const std::string& path)
+          : Store(path, path.empty() ? "/" : std::filesystem::absolute(path).string()) {}
 
     ~Store() {
         for (sqlite3_stmt* statement : {mGet, mSet, mErase}) sqlite3_finalize(statement);
@@ -62,8 +56,10 @@ public:
         bind(mGet, 1, name);
         const int status = sqlite3_step(mGet);
         if (status == SQLITE_ROW) {
-            value.emplace(reinterpret_cast<const char*>(sqlite3_column_text(mGet, 0)),
-                          static_cast<size_t>(sqlite3_column_bytes(mGet, 0)));
+            // Whoever else writes the file may have put longer values there.
+            const unsigned char* text = sqlite3_column_text(mGet, 0);
+            const auto size = static_cast<size_t>(sqlite3_column_bytes(mGet, 0));
+            value.emplace(reinterpret_cast<const char*>(text), std::min(size, kMaxValue));
         } else if (status != SQLITE_DONE) {
             check(status);
         }
@@ -100,9 +96,38 @@ public:
     }
 
 private:
+    Store(const std::string& name, const std::string& path) : mName(name) {
+        check(sqlite3_open_v2(path.c_str(), &mDb, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE,
+                              nullptr));
+        sqlite3_busy_timeout(mDb, kBusyMs);
+        // A write-ahead log makes each write one append. The kernel keeps what a killed process
+        // has written, so nothing has to be synced: only a power cut could lose a write.
+        switchToLog();
+        run("PRAGMA synchronous = OFF");
+        checkPages();
+        run(kSchema);
+        mGet = prepare("SELECT value FROM properties WHERE name = ?1");
+        mSet =
+                prepare("INSERT INTO properties VALUES (?1, ?2)"
+                        " ON CONFLICT (name) DO UPDATE SET value = excluded.value");
+        mErase = prepare("DELETE FROM properties WHERE name = ?1");
+        // Tells at once whether the file can be written.
+        run("BEGIN IMMEDIATE; PRAGMA user_version = 1; COMMIT");
+    }
+
+    /** Does not wait by itself while another process does the same. */
+    void switchToLog() {
+        int status = SQLITE_BUSY;
+        for (int waited = 0; status == SQLITE_BUSY && waited < kBusyMs; ++waited) {
+            if (waited > 0) sqlite3_sleep(1);
+            status = sqlite3_exec(mDb, "PRAGMA journal_mode = WAL", nullptr, nullptr, nullptr);
+        }
+        check(status);
+    }
+
     void check(int status) {
         if (status == SQLITE_OK || mError) return;
-        mError = mPath + ": cannot keep properties in this file: " + sqlite3_errstr(status);
+        mError = mName + ": cannot keep properties in this file: " + sqlite3_errstr(status);
     }
 
     /** A damaged page would otherwise show only when it is read. */
@@ -139,7 +164,7 @@ private:
         return changed;
     }
 
-    const std::string mPath;
+    const std::string mName;
     sqlite3* mDb = nullptr;
     sqlite3_stmt* mGet = nullptr;
     sqlite3_stmt* mSet = nullptr;
@@ -150,7 +175,7 @@ private:
 /** Never destroyed: the library's worker may write until the process is gone. */
 struct Service {
     std::mutex mutex;
-    std::unique_ptr<Store> store = std::make_unique<Store>(":memory:");
+    std::unique_ptr<Store> store = std::make_unique<Store>();
     std::function<void(const char*, const char*)> observer;
 
     static Service& get() {
@@ -210,7 +235,7 @@ std::optional<std::string> openProperties(const std::string& path) {
 void closeProperties() {
     Service& service = Service::get();
     const std::lock_guard lock(service.mutex);
-    service.store = std::make_unique<Store>(":memory:");
+    service.store = std::make_unique<Store>();
 }
 
 std::optional<std::string> propertyFileError() {

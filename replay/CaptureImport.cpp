@@ -20,6 +20,8 @@ constexpr int64_t kStartLead = 10 * kMsPerSecond;   // from the start to the old
 constexpr int64_t kResetDelay = 10 * kMsPerSecond;  // from an hour's reports to its resets
 constexpr int64_t kEndOfDay = 23 * kMsPerHour + 20 * kMsPerSecond;
 
+constexpr int64_t kMaxPeriodUs = 9'000'000'000'000'000;  // fits 64 bits in nanoseconds
+
 constexpr int kSystemUid = 1000;
 
 /** One line of the list of previous registrations. */
@@ -121,7 +123,7 @@ std::optional<Registration> parseRegistration(std::string_view text, int64_t lin
         auto period = valueOf(text, "samplingPeriod=");
         if (!period) period = valueOf(text, "samplingRate=");
         const auto number = parseNumber<int64_t>(period.value_or(""));
-        if (!number) return std::nullopt;
+        if (!number || *number < -kMaxPeriodUs || *number > kMaxPeriodUs) return std::nullopt;
         registration.periodUs = *number;
     }
     return registration;

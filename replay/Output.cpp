@@ -30,12 +30,18 @@ std::string formatClock(int64_t ns) {
     return std::string(text, length);
 }
 
-/** `text` with every run of blanks and tabs as one blank: lists are indented for a page. */
-std::string squeezed(std::string_view text) {
+/**
+ * `text` on one line: every run of blanks and tabs as one blank, since lists are indented for a
+ * page, and other control characters, which might move the terminal's cursor, as "?".
+ */
+std::string printable(std::string_view text) {
     std::string result;
     for (const char c : text) {
         const bool blank = c == ' ' || c == '\t';
-        if (!blank || result.empty() || result.back() != ' ') result += blank ? ' ' : c;
+        const bool control = static_cast<unsigned char>(c) < ' ' || c == '\x7f';
+        if (!blank || result.empty() || result.back() != ' ') {
+            result += blank ? ' ' : control ? '?' : c;
+        }
     }
     return result;
 }
@@ -67,7 +73,7 @@ void Output::boot(std::string_view kind) {
 void Output::event(std::string_view module, std::string_view id, std::string_view payload) {
     line(R"("event": {"module": )" + toJson(module) + R"(, "id": )" + toJson(id) +
                  R"(, "payload": )" + toJson(payload) + '}',
-         "event", std::string(id) + "  " + squeezed(payload));
+         "event", std::string(id) + " " + std::string(payload));
 }
 
 void Output::property(std::string_view name, std::string_view value) {
@@ -78,7 +84,7 @@ void Output::property(std::string_view name, std::string_view value) {
 void Output::log(int level, std::string_view tag, std::string_view text) {
     line(R"("log": {"level": )" + std::to_string(level) + R"(, "tag": )" + toJson(tag) +
                  R"(, "text": )" + toJson(text) + '}',
-         "log", std::string(1, levelLetter(level)) + "  " + std::string(text));
+         "log", std::string(1, levelLetter(level)) + " " + std::string(text));
 }
 
 void Output::result(std::string_view call, std::string_view json) {
@@ -93,7 +99,7 @@ void Output::line(std::string_view json, std::string_view kind, std::string_view
         mGathered.append(json).append("}\n");
     } else {
         mGathered += formatClock(now) + "  ";
-        mGathered.append(kind).append(10 - kind.size(), ' ').append(text).append("\n");
+        mGathered.append(kind).append(10 - kind.size(), ' ').append(printable(text)).append("\n");
     }
     if (mGathered.size() >= kFlushSize) flush();
 }

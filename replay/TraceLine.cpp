@@ -2,7 +2,8 @@
 
 #include <algorithm>
 #include <array>
-#include <cmath>
+#include <cstdlib>
+#include <cstring>
 #include <filesystem>
 #include <limits>
 #include <type_traits>
@@ -23,7 +24,8 @@ using Error = std::optional<std::string>;
 /** 285 years; the clock and every wait that the Looper can ask for still fit 63 bits. */
 constexpr int64_t kMaxTimeMs = 9'000'000'000'000;
 constexpr int64_t kNsPerMs = 1'000'000;
-constexpr size_t kMaxDecimals = 6;
+constexpr int64_t kDecimals = 6;    // of a millisecond
+constexpr int64_t kMaxDigits = 19;  // of a time in nanoseconds
 
 /** A key that stands twice means two things at once. */
 Error checkKeys(object json) {
@@ -191,23 +193,28 @@ std::optional<size_t> indexOf(const Entry (&table)[Size], std::string_view name)
     return static_cast<size_t>(found - table);
 }
 
-/** The JSON number `digits`, of that value, as milliseconds: in nanoseconds, if they are whole. */
-std::optional<int64_t> toNanoseconds(std::string_view digits, double value) {
-    if (value < 0 || value > static_cast<double>(kMaxTimeMs)) return std::nullopt;
-    if (digits.find_first_of("eE") != std::string_view::npos) {
-        const double time = value * kNsPerMs;
-        return time == std::floor(time) ? std::optional(static_cast<int64_t>(time)) : std::nullopt;
+/** The JSON number `token`, in milliseconds, as nanoseconds; nothing if it has none. */
+std::optional<int64_t> toNanoseconds(std::string_view token) {
+    // Digit by digit: a double does not hold the nanoseconds of a year.
+    std::string digits;
+    int64_t exponent = kDecimals;  // the time is `digits` times ten to this
+    size_t i = 0;
+    for (bool fraction = false; i < token.size() && std::strchr("-.0123456789", token[i]); ++i) {
+        if (token[i] == '.') fraction = true;
+        if (token[i] < '0') continue;
+        if (token[i] != '0' || !digits.empty()) digits += token[i];
+        if (fraction) --exponent;
     }
-    // Read digit by digit: a double does not hold the nanoseconds of a year.
-    if (digits.front() == '-') digits.remove_prefix(1);  // of a zero
-    const size_t point = digits.find('.');
-    const size_t end = digits.find_last_of(".123456789") + 1;
-    if (end - point - 1 > kMaxDecimals) return std::nullopt;
-    int64_t time = 0;
-    for (size_t i = 0; i < point + 1 + kMaxDecimals; ++i) {
-        if (i != point) time = time * 10 + (i < end ? digits[i] - '0' : 0);
-    }
-    return time;
+    if (digits.empty()) return 0;
+    if (token.front() == '-') return std::nullopt;
+    if (i < token.size())
+        exponent += std::strtol(std::string(token.substr(i + 1)).c_str(), nullptr, 10);
+    for (; digits.back() == '0'; ++exponent) digits.pop_back();
+    if (exponent < 0 || static_cast<int64_t>(digits.size()) + exponent > kMaxDigits)
+        return std::nullopt;
+    digits.append(static_cast<size_t>(exponent), '0');
+    const int64_t time = std::strtoll(digits.c_str(), nullptr, 10);
+    return time <= kMaxTimeMs * kNsPerMs ? std::optional(time) : std::nullopt;
 }
 
 /** The number that stands behind "at" in `text`, a valid JSON object, as it is written there. */
@@ -450,7 +457,7 @@ std::optional<std::string> TraceParser::parse(std::string_view text, const std::
         if (ms >= 0 && ms <= kMaxTimeMs) time = ms * kNsPerMs;
     } else if (at->is_number()) {
         // The document tree rounds fractions to double; the text has them exactly.
-        time = toNanoseconds(atToken(&mNumberParser, text), at->get_double());
+        time = toNanoseconds(atToken(&mNumberParser, text));
     }
     if (!time) return R"("at" must be a number of at most six decimals, from 0 to 9e12)";
     line->at = *time;

@@ -89,7 +89,8 @@ TEST_F(PropertyServiceTest, NamesAFileThatCannotKeepProperties) {
     std::fstream(file("torn"), std::ios::in | std::ios::out).seekp(size / 2)
             << std::string(size / 2, 'x');
 
-    for (const std::string& path : {file("text"), file("torn"), file("missing/store"), file("")}) {
+    for (const std::string& path :
+         {file("text"), file("torn"), file("missing/store"), file(""), std::string()}) {
         const auto error = platform::openProperties(path);
         ASSERT_TRUE(error) << path;
         EXPECT_EQ(error->find(path + ": "), 0u) << *error;
