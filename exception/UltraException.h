@@ -124,8 +124,8 @@ public:
     void resetPhoneOpenUltraCount();
 
     /**
-     * Worker thread: counts a failed call, at most once for each call, and stores the count. Only
-     * if the package's name contains that of the in-call screen, "com.android.incallui".
+     * Worker thread: counts a failed call and stores the count, at most once until a call ends.
+     * Only if the package's name contains that of the in-call screen, "com.android.incallui".
      */
     void updateUltraInvalid();
 

@@ -1,6 +1,8 @@
 #include "exception/FlowingDataException.h"
 
 #include <limits>
+#include <map>
+#include <tuple>
 #include <utility>
 
 #include "platform/Telemetry.h"
@@ -31,11 +33,8 @@ protected:
 };
 
 TEST_F(FlowingDataExceptionTest, EachSensorTypeCountsForItsFamilyOnly) {
-    const std::vector<int> families[] = {{1, 9, 10, 35}, {4, 16}, {2, 14}, {5}, {3}, {11}};
-    std::string expected[40];
-    for (int slot = 0; slot < 6; ++slot) {
-        for (const int type : families[slot]) expected[type] = std::to_string(slot);
-    }
+    const std::map<int, size_t> slots{{1, 0}, {9, 0},  {10, 0}, {35, 0}, {4, 1}, {16, 1},
+                                      {2, 2}, {14, 2}, {5, 3},  {3, 4},  {11, 5}};
     for (int type = -1; type < 40; ++type) {
         SCOPED_TRACE(type);
         load("0,0,0,0,0,0");
@@ -43,10 +42,9 @@ TEST_F(FlowingDataExceptionTest, EachSensorTypeCountsForItsFamilyOnly) {
         advanceTo(mNow += 11'000);
         std::string record = "0,0,0,0,0,0";
         std::string eventId = "-1";
-        if (type >= 0 && !expected[type].empty()) {
-            const size_t slot = std::stoul(expected[type]);
-            record[2 * slot] = '1';
-            eventId = "N273|1000" + std::to_string(slot + 3);
+        if (const auto found = slots.find(type); found != slots.end()) {
+            record[2 * found->second] = '1';
+            eventId = "N273|1000" + std::to_string(found->second + 3);
         }
         EXPECT_EQ(property(kRecord), record);
         EXPECT_EQ(flow->getEventID(type), eventId);

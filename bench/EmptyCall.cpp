@@ -1,0 +1,9 @@
+#include "bench/EmptyCall.h"
+
+EmptyCall* EmptyCall::create() {
+    return new EmptyCall;
+}
+
+EmptyCall::~EmptyCall() = default;
+
+void EmptyCall::process(const sensors_event_t&) {}
