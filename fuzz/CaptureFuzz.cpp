@@ -1,0 +1,33 @@
+/** Imports any text as a capture: a trace that comes of it must be in order. */
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+
+#include "fuzz/FuzzInput.h"
+#include "replay/CaptureImport.h"
+#include "replay/LineReader.h"
+#include "replay/TraceLine.h"
+
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+    replay::LineReader reader(fuzz::readable(data, size));
+    const auto first = reader.next();
+    if (!first) return 0;
+    const replay::ImportedCapture capture = replay::importCapture("capture", *first, &reader);
+    const auto* trace = reinterpret_cast<const uint8_t*>(capture.trace.data());
+    replay::LineReader lines(fuzz::readable(trace, capture.trace.size()));
+    static replay::TraceParser parser;
+    replay::TraceLine line;
+    int64_t last = 0;
+    while (const auto text = lines.next()) {
+        const auto error = parser.parse(*text, "capture", &line);
+        if (error || line.at < last) {
+            std::fprintf(stderr, "%s: %.*s\n", error.value_or("goes back").c_str(),
+                         static_cast<int>(text->size()), text->data());
+            std::abort();
+        }
+        last = line.at;
+    }
+    return 0;
+}
