@@ -67,16 +67,6 @@ TEST_F(PropertyServiceTest, AFileKeepsWhatSurvivesABoot) {
     EXPECT_EQ(property("sys.c") + property("persistent"), "");
 }
 
-TEST_F(PropertyServiceTest, HandsItsPropertiesToAnotherProcess) {
-    property_set("a", "1");
-    const std::vector<unsigned char> bytes = platform::saveProperties();
-    property_set("a", "2");
-    platform::restoreProperties(bytes);
-    EXPECT_EQ(property("a"), "1");
-    EXPECT_EQ(property_set("a", "3"), 0);
-    EXPECT_EQ(property("a"), "3");
-}
-
 TEST_F(PropertyServiceTest, NamesAFileThatCannotKeepProperties) {
     ASSERT_EQ(platform::openProperties(file("store")), std::nullopt);
     property_set("persist.a", "1");

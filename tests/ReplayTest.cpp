@@ -124,14 +124,6 @@ TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
                                                                   "\n");
 }
 
-TEST_F(ReplayTest, SetsVariablesAndPrintsTheLog) {
-    const Played played = play(R"({"at": 0, "set": {"mLogSwitch": 1}})"
-                               "\n" +
-                               report("0"));
-    EXPECT_EQ(happened(played).at(0), R"({"at": 0, "log": {"level": 6, "tag": "_Z_ZSensorFusion", )"
-                                      R"("text": "SDC Event = N273|10009"}})");
-}
-
 TEST_F(ReplayTest, LaysOutLinesForAPerson) {
     write("trace", sample("86400000") + report("86410000.5"));
     EXPECT_EQ(run("trace").out,

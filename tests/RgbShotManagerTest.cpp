@@ -70,14 +70,6 @@ TEST_F(RgbShotManagerTest, ATriggerAllowsItsSamplesAtOnceAndAfterItsDelay) {
     }
 }
 
-TEST_F(RgbShotManagerTest, ARaiseKeepsALargerBudget) {
-    RgbShotManager& manager = newManager();
-    manager.setRgbShot(5);
-    manager.colorChange();
-    EXPECT_FALSE(manager.stopRgbThread());
-    EXPECT_EQ(allowedAt(0, &manager), 5);
-}
-
 TEST_F(RgbShotManagerTest, WhileBlockedTheBudgetAndTheQueueStandStill) {
     RgbShotManager& manager = newManager();
     manager.colorChange();
@@ -92,30 +84,6 @@ TEST_F(RgbShotManagerTest, WhileBlockedTheBudgetAndTheQueueStandStill) {
     manager.onTransitionStatusChange(1);
     EXPECT_FALSE(manager.skipLux());
     EXPECT_EQ(allowedAt(2000, &manager), 5) << "3 were left; the queued 5 are due";
-}
-
-TEST_F(RgbShotManagerTest, AnEntryWaitsBehindThePendingOneEvenIfItIsDueEarlier) {
-    RgbShotManager& manager = newManager();
-    manager.setRgbShotDelay(2, 8000);
-    EXPECT_EQ(allowedAt(0, &manager), 0);
-    manager.policyChange();
-    EXPECT_EQ(allowedAt(8000, &manager), 0);
-    // The turn that grants the pending entry leaves the queued one to the next.
-    advanceTo(8001);
-    manager.isTimeToShot();
-    EXPECT_FALSE(manager.isEmpty());
-    EXPECT_EQ(allowedAt(8001, &manager), 5);
-}
-
-TEST_F(RgbShotManagerTest, OfEqualTimesTheSmallestRaiseComesFirstAndEachTurnTakesOne) {
-    RgbShotManager& manager = newManager();
-    for (const int shots : {5, 1, 5}) manager.setRgbShotDelay(shots, 10);
-    advanceTo(11);
-    manager.isTimeToShot();
-    EXPECT_TRUE(manager.allowRgbShot());  // takes the next: 5, of which 4 are left
-    EXPECT_FALSE(manager.isEmpty());
-    EXPECT_EQ(allowedAt(11, &manager), 5);
-    EXPECT_TRUE(manager.isEmpty());
 }
 
 TEST_F(RgbShotManagerTest, ClearingTheQueueLeavesThePendingEntry) {

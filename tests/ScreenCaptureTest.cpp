@@ -2,7 +2,6 @@
 #include <array>
 #include <cstdio>
 #include <random>
-#include <thread>
 
 #include <binder/Status.h>
 #include <gui/SurfaceComposerClient.h>
@@ -136,22 +135,6 @@ TEST_F(ScreenCaptureTest, AFailureIsLoggedLeavesTheOutputAndCountsNothing) {
     EXPECT_EQ(sample({0, 0, 10, 10}), Rgb{});
     advanceTo(1500);
     EXPECT_EQ(property(kCount), "1");
-}
-
-TEST_F(ScreenCaptureTest, SamplesOfSeveralThreadsDoNotTouchEachOther) {
-    DisplayChange change;
-    change.picture = randomPicture(64, 64, 3);
-    changeDisplay(change);
-    std::vector<std::thread> threads;
-    for (int i = 0; i < 4; ++i) {
-        threads.emplace_back([&, rect = Rectangle{i, i, 16 * (i + 1), 64}] {
-            const Rgb expected = averageOf(*change.picture, rect);
-            for (int round = 0; round < 50; ++round) EXPECT_EQ(sample(rect), expected);
-        });
-    }
-    for (std::thread& thread : threads) thread.join();
-    advanceTo(500);
-    EXPECT_EQ(property(kCount), "200");
 }
 
 TEST_F(ScreenCaptureTest, AListenerServesOneCapture) {

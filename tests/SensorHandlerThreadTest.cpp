@@ -1,10 +1,7 @@
 #include "core/SensorHandlerThread.h"
 
-#include <functional>
 #include <limits>
-#include <thread>
 #include <utility>
-#include <vector>
 
 #include "replay/VirtualClock.h"
 #include "tests/LibraryTest.h"
@@ -20,10 +17,7 @@ public:
     void handleMessage(const Message& message) override {
         mLines->push_back(std::to_string(virtual_clock::now() / 1'000'000) + ' ' + mName +
                           std::to_string(message.what));
-        if (onMessage) onMessage(message.what);
     }
-
-    std::function<void(int)> onMessage;
 
 private:
     const std::string mName;
@@ -76,15 +70,6 @@ TEST_F(SensorHandlerThreadTest, RemovesAllMessagesOfACodeOrOfAHandlerAndNoOthers
     EXPECT_EQ(mLines.back(), "20 b1");
 }
 
-TEST_F(SensorHandlerThreadTest, AHandlerMayPostAgainFromTheWorker) {
-    mA->onMessage = [this](int what) {
-        if (what < 3) mThread->sendMessageDelayed(mA, what + 1, 100);
-    };
-    mThread->sendMessageDelayed(mA, 1, 50);
-    advanceTo(1000);
-    EXPECT_EQ(mLines, (Lines{"50 a1", "150 a2", "250 a3"}));
-}
-
 TEST_F(SensorHandlerThreadTest, FractionsWaitForWholeMillisecondsFromTheStartOfTheWait) {
     mThread->sendMessageDelayed(mA, 1, 100);
     advanceTo(0.25);
@@ -107,18 +92,6 @@ TEST_F(SensorHandlerThreadTest, AfterQuittingNothingIsDelivered) {
     // What was due when the loop was told to end still ran in its last turn.
     EXPECT_EQ(mLines, (Lines{"50 a2"}));
     EXPECT_FALSE(mThread->isRunning());
-}
-
-TEST(SensorHandlerThreadInstanceTest, IsTheSameForAllThreadsThatAskFirst) {
-    std::vector<SensorHandlerThread*> instances(4);
-    std::vector<std::thread> threads;
-    threads.reserve(instances.size());
-    for (SensorHandlerThread*& instance : instances) {
-        threads.emplace_back([&instance] { instance = SensorHandlerThread::getInstance(); });
-    }
-    for (std::thread& thread : threads) thread.join();
-    EXPECT_EQ(instances, std::vector(4, SensorHandlerThread::getInstance()));
-    EXPECT_TRUE(instances[0]->isRunning());
 }
 
 }  // namespace

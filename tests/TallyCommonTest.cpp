@@ -67,12 +67,6 @@ TEST_F(TallyCommonTest, CutsATextAtItsDelimiterAndKeepsEmptyPieces) {
     EXPECT_EQ(pieces, (Lines{"1", "2"}));
 }
 
-TEST_F(TallyCommonTest, WritesNumbersInDecimal) {
-    EXPECT_EQ(mTally->intToStr(std::numeric_limits<int>::min()), "-2147483648");
-    EXPECT_EQ(mTally->longToStr(0), "0");
-    EXPECT_EQ(mTally->longToStr(2147483647L), "2147483647");
-}
-
 TEST_F(TallyCommonTest, WaitsForTheEndOfTheBootAnimationOnce) {
     mTally->BootNotFinish();
     EXPECT_EQ(naps, 3);
