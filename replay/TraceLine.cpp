@@ -208,7 +208,8 @@ std::optional<int64_t> toNanoseconds(std::string_view token) {
     if (digits.empty()) return 0;
     if (token.front() == '-') return std::nullopt;
     if (i < token.size())
-        exponent += std::strtol(std::string(token.substr(i + 1)).c_str(), nullptr, 10);
+        exponent += std::clamp(std::strtol(std::string(token.substr(i + 1)).c_str(), nullptr, 10),
+                               -1000L, 1000L);
     for (; digits.back() == '0'; ++exponent) digits.pop_back();
     if (exponent < 0 || static_cast<int64_t>(digits.size()) + exponent > kMaxDigits)
         return std::nullopt;

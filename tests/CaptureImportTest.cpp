@@ -88,7 +88,7 @@ TEST_F(CaptureImportTest, FindsItsSectionInABugReportThatPassedThroughAChat) {
             other;
     std::string quoted = "\xEF\xBB\xBF";
     for (const char c : report) {
-        if (quoted.back() == '\n' || quoted.size() == 3) quoted += "> ";
+        if (quoted.back() == '\n' || quoted.size() == 3) quoted += "> > ";
         quoted += c == '\n' ? "\r\n" : std::string(1, c);
     }
     const Lines expected{enable(25'200'000, R"(true, 1, "yes", "yes", 1000)"),
@@ -129,7 +129,7 @@ TEST_F(CaptureImportTest, MakesTheCallsOfTheHostAroundTheRegistrations) {
 TEST_F(CaptureImportTest, PassesMidnightsAndWarnsOfAClockThatWasSetBack) {
     const Played played = import(kSensors +
                                  "Previous Registrations:\n"
-                                 "11:00:01 - 0x00000000 pid=1 uid=1 package=d\n"
+                                 "00:00:01 - 0x00000000 pid=1 uid=1 package=d\n"
                                  "12:00:00 - 0x00000000 pid=1 uid=1 package=c\n"
                                  "00:00:09 - 0x00000077 pid=1 uid=1 package=unknown\n"
                                  "12:00:10 - 0x00000000 pid=1 uid=1 package=b\n"

@@ -101,6 +101,15 @@ TEST_F(RegisterConnectionListTest, CountsTheTimeThatTheDisplayIsOn) {
     display(95, 0);
     disable(100, "b");
     EXPECT_EQ(reported(), (Lines{"a 70 s on 50 s at 20000", "b 10 s on 5 s at 5000"}));
+
+    display(100, 2);
+    enable(100, "fast", 5000);
+    enable(100, "slow", 20000);
+    display(110, 1);  // ends the slow one's span too, which earns nothing
+    disable(120, "fast");
+    display(130, 3);
+    disable(140, "slow");
+    EXPECT_EQ(reported(), (Lines{"fast 20 s on 10 s at 5000", "slow 20 s on 0 s at 20000"}));
 }
 
 TEST_F(RegisterConnectionListTest, TheResetKeepsTheCurrentRateThatNobodyHolds) {
@@ -148,6 +157,7 @@ TEST_F(SDCImplTest, RoutesFourSensorTypesToTwoDailyReports) {
 
 TEST_F(SDCImplTest, ACleanUpIsADisable) {
     connect(0, true, 1, "pkg");
+    mSdc->enableSuccess(true, 1, "slow", "op", (1LL << 32) + 1);  // in 32 bits it would be faster
     advanceTo(kStartMs + 5000);
     mSdc->cleanupConnection(String8("pkg"), String8("op"), 1);
     mSdc->notifySdcClock(23);
@@ -156,8 +166,8 @@ TEST_F(SDCImplTest, ACleanUpIsADisable) {
 }
 
 TEST_F(SDCImplTest, AResetThatFollowsItsTickAtOnceOvertakesTheReport) {
-    connect(0, true, 1, "pkg");
-    connect(10, false, 1, "pkg");
+    for (int type : {1, 4}) connect(0, true, type, "pkg");
+    for (int type : {1, 4}) connect(10, false, type, "pkg");
     mSdc->notifySdcReset(22);
     mSdc->notifySdcClock(23);
     mSdc->notifySdcReset(23);
@@ -171,7 +181,7 @@ TEST_F(SDCImplTest, TakesTheDisplayStateFromWholeNotificationsOfItsKind) {
         for (int value : values) list.add(value);
         mSdc->setNotification(list);
     };
-    connect(0, true, 1, "pkg");
+    for (int type : {1, 4}) connect(0, true, type, "pkg");
     notify({});
     notify({2, 0});
     notify({2, 0, 2});
@@ -179,10 +189,12 @@ TEST_F(SDCImplTest, TakesTheDisplayStateFromWholeNotificationsOfItsKind) {
     notify({3, 0, 1});
     advanceTo(kStartMs + 20'000);
     notify({2, 7, 1, 9});
-    connect(30, false, 1, "pkg");
+    for (int type : {1, 4}) connect(30, false, type, "pkg");
     mSdc->notifySdcClock(23);
     advanceTo(40'000);
-    EXPECT_NE(taken().at(0).find("\"ontime\" : \"20\""), std::string::npos);
+    for (const std::string& line : taken()) {
+        EXPECT_NE(line.find("\"ontime\" : \"20\""), std::string::npos) << line;
+    }
 }
 
 }  // namespace

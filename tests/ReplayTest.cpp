@@ -2,6 +2,9 @@
 #include <utility>
 #include <vector>
 
+#include <cutils/properties.h>
+
+#include "platform/PropertyService.h"
 #include "tests/ReplayTool.h"
 
 namespace {
@@ -34,6 +37,15 @@ std::string report(const std::string& at) {
     return R"({"at": )" + at +
            R"(, "call": "SDCImpl.putRgbShotTally", "args": [7]})"
            "\n";
+}
+
+/** A property that a file keeps. */
+std::string storedIn(const char* file, const char* name) {
+    EXPECT_EQ(platform::openProperties(file), std::nullopt);
+    char value[PROP_VALUE_MAX];
+    property_get(name, value, "");
+    platform::closeProperties();
+    return value;
 }
 
 class ReplayTest : public ReplayToolTest {};
@@ -106,7 +118,9 @@ TEST_F(ReplayTest, AProcessBootKeepsTheClockAndThePropertiesADeviceBootOnlyWhatP
 }
 
 TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
-    write("one", sample("100") + R"({"at": 700})");
+    write("one", R"({"at": 100, "property": {"sys.x": "1", "ro.x": "2"}})"
+                 "\n" + sample("100") +
+                         R"({"at": 700})");
     write("two", "# nothing\n");
     write("three", R"({"at": 5, "call": "SDCImpl.getInstance"})"
                    "\n" + report("2005"));
@@ -119,9 +133,9 @@ TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
     EXPECT_EQ(run("--json one two three").out, expected);
     EXPECT_EQ(run("--json one - three", "\n").out, expected);
     EXPECT_EQ(run("--json --properties store one").status, 0);
-    EXPECT_EQ(run("--json --properties store three").out, R"({"at": 5, "boot": "device"})"
-                                                          "\n" + reported("2005", 1) +
-                                                                  "\n");
+    EXPECT_EQ(storedIn("store", "sys.x") + storedIn("store", "ro.x"), "12");
+    EXPECT_EQ(happened(run("--json --properties store three")), (Lines{reported("2005", 1)}));
+    EXPECT_EQ(storedIn("store", "sys.x") + storedIn("store", "ro.x"), "2");
 }
 
 TEST_F(ReplayTest, LaysOutLinesForAPerson) {
@@ -145,6 +159,15 @@ TEST_F(ReplayTest, JudgesEachLineAndKeepsWhatWasDoneBeforeABadOne) {
             {R"({"at": 9000000000001})", R"("at" must be)"},
             {R"({"at": 1e-7})", R"("at" must be)"},
             {R"({"at": 1e300})", R"("at" must be)"},
+            {R"({"at": 1.5e-99999999999999999999})", R"("at" must be)"},
+            {R"({"at": 1, "call": "SDCImpl.process", "args": [{"type": 1, "data": [1,2,3,4,5,6,7,8,9,)"
+             R"(10,11,12,13,14,15,16,17]}]})",
+             "at most 16 numbers"},
+            {R"({"at": 1, "call": "SDCImpl.process", "args": [{"type": 1, "data": [], "x": 1}]})",
+             "must be an event"},
+            {R"({"at": 1, "call": "UltraException.doAction", "args": [6, {"phoneState": 1,)"
+             R"( "phoneState": 0}]})",
+             R"(the key "phoneState" twice)"},
             {R"({"at": 0})", R"("at" goes back, from 1 to 0)"},
             {R"({"at": 0, "boot": "process"})", R"("at" goes back, from 1 to 0)"},
             {R"({"at": 1, "at": 2})", R"(the key "at" twice)"},
@@ -189,7 +212,10 @@ TEST_F(ReplayTest, JudgesEachLineAndKeepsWhatWasDoneBeforeABadOne) {
 }
 
 TEST_F(ReplayTest, ABadLineKeepsEvenWhatIsDueFromRunningAndABadFirstOneStartsNothing) {
-    EXPECT_EQ(happened(play(sample("0") + R"({"at": 500, "x": 1})")), (Lines{}));
+    const std::string post = R"({"at": 0, "call": "SDCImpl.notifySdcReset", "args": [23]})"
+                             "\n";
+    EXPECT_EQ(happened(play(post)).size(), 1u);
+    EXPECT_EQ(happened(play(post + R"({"at": 0, "x": 1})")), (Lines{}));
     const Played played = play("\n{}\n" + report("0"));
     EXPECT_EQ(played.out, "");
     EXPECT_EQ(played.err, "trace:2: \"at\" is missing\n");

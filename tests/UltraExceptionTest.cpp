@@ -118,7 +118,7 @@ TEST_F(UltraExceptionTest, FullCountsStayButTheCallsWrap) {
         setProperty(std::string("persist.zuno.") + name + ".count", "2147483646");
     setProperty("persist.zuno.ultra.invalid.count", "2147483645");
     setProperty("persist.zuno.ultra.phone.enable.count", "2147483647");
-    loaded();
+    UltraException* ultra = loaded();
     for (int i = 0; i < 2; ++i) {
         act(PHONE_STATE, {"", 1});
         act(ENABLED, {kInCall, 0});
@@ -130,6 +130,12 @@ TEST_F(UltraExceptionTest, FullCountsStayButTheCallsWrap) {
                               "2000 persist.zuno.ultra.phone.enable.count=-2147483648",
                               "2000 persist.zuno.ultra.enable.count=2147483646",
                               "2000 persist.zuno.ultra.phone.enable.count=-2147483647"}));
+
+    // The reset lets failed calls be counted from 0 again.
+    ultra->notifyUltraReset();
+    act(ENABLED, {kInCall, 0});
+    act(ROUTE_INVALID);
+    EXPECT_EQ(property("persist.zuno.ultra.invalid.count"), "1");
 }
 
 }  // namespace
