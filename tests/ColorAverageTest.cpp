@@ -36,12 +36,13 @@ private:
     uint8_t* const mPages;
 };
 
-using Rgb = std::array<uint32_t, 3>;
+using Rgb = std::array<int32_t, 3>;
 
 Rgb average(const void* base, uint32_t width, uint32_t height, uint32_t stride,
             PixelFormat format) {
-    const ColorAverage result = averageColor(base, width, height, stride, format);
-    return {result.red, result.green, result.blue};
+    Rgb rgb;
+    averageColor(base, width, height, stride, format, rgb.data());
+    return rgb;
 }
 
 /** The walk, byte by byte. */
@@ -56,7 +57,9 @@ Rgb averagePlainly(const uint8_t* row, uint32_t width, uint32_t height, uint32_t
     }
     const uint32_t count = width * height;
     if (count == 0) return {};
-    return {sums[0] / count, sums[1] / count, sums[2] / count};
+    Rgb rgb{};
+    for (size_t i = 0; i < rgb.size(); ++i) rgb[i] = static_cast<int32_t>(sums[i] / count);
+    return rgb;
 }
 
 TEST(ColorAverageTest, AgreesWithThePlainWalkAndReadsNoByteThatItDoesNot) {
@@ -91,7 +94,7 @@ TEST(ColorAverageTest, SumsWrapAt32Bits) {
     // A stride of 0 shows the same row over and over.
     const std::vector<uint8_t> row(4 * 65536, 0xff);
     const uint32_t sum = 65536u * 300u * 255u;
-    const uint32_t mean = sum / (65536 * 300);
+    const auto mean = static_cast<int32_t>(sum / (65536 * 300));
     EXPECT_EQ(average(row.data(), 65536, 300, 0, PIXEL_FORMAT_RGBA_8888), (Rgb{mean, mean, mean}));
 }
 
