@@ -106,12 +106,13 @@ void averageColor(const void* base, uint32_t width, uint32_t height, uint32_t st
     const uint32_t count = width * height;
     const uint32_t pixelBytes = bytesPerPixel(format);
     const uint32_t length = pixelBytes * width;
+    const uint32_t rowBytes = pixelBytes * stride;
     if (count == 0 || length == 0 || length > INT32_MAX) {
         rgb[0] = rgb[1] = rgb[2] = 0;
         return;
     }
     Walk walk = {static_cast<const uint8_t*>(base), (size_t{length} + kStepBytes - 1) / kStepBytes,
-                 height, pixelBytes * stride, count};
+                 height, rowBytes, count};
     if (walk.steps * kStepBytes == walk.rowBytes) {  // rows without gaps are one row
         walk.steps *= walk.rows;
         walk.rows = 1;

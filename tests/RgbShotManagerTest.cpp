@@ -70,14 +70,6 @@ TEST_F(RgbShotManagerTest, ATriggerAllowsItsSamplesAtOnceAndAfterItsDelay) {
     }
 }
 
-TEST_F(RgbShotManagerTest, ARaiseKeepsALargerBudget) {
-    RgbShotManager& manager = newManager();
-    manager.setRgbShot(5);
-    manager.colorChange();
-    EXPECT_FALSE(manager.stopRgbThread());
-    EXPECT_EQ(allowedAt(0, &manager), 5);
-}
-
 TEST_F(RgbShotManagerTest, WhileBlockedTheBudgetAndTheQueueStandStill) {
     RgbShotManager& manager = newManager();
     manager.colorChange();
@@ -105,17 +97,6 @@ TEST_F(RgbShotManagerTest, AnEntryWaitsBehindThePendingOneEvenIfItIsDueEarlier) 
     manager.isTimeToShot();
     EXPECT_FALSE(manager.isEmpty());
     EXPECT_EQ(allowedAt(8001, &manager), 5);
-}
-
-TEST_F(RgbShotManagerTest, OfEqualTimesTheSmallestRaiseComesFirstAndEachTurnTakesOne) {
-    RgbShotManager& manager = newManager();
-    for (const int shots : {5, 1, 5}) manager.setRgbShotDelay(shots, 10);
-    advanceTo(11);
-    manager.isTimeToShot();
-    EXPECT_TRUE(manager.allowRgbShot());  // takes the next: 5, of which 4 are left
-    EXPECT_FALSE(manager.isEmpty());
-    EXPECT_EQ(allowedAt(11, &manager), 5);
-    EXPECT_TRUE(manager.isEmpty());
 }
 
 TEST_F(RgbShotManagerTest, ClearingTheQueueLeavesThePendingEntry) {
@@ -181,7 +162,7 @@ struct Model {
     int budget = 0;
 
     void schedule(long long ms, int delayMs, int shots) {
-        queue.emplace_back(static_cast<int32_t>(ms) + delayMs, shots);
+        queue.emplace_back(static_cast<long long>(static_cast<int32_t>(ms)) + delayMs, shots);
     }
 
     void raise(int shots) { budget = std::max(budget, shots); }
@@ -203,7 +184,8 @@ struct Model {
 TEST_F(RgbShotManagerTest, AgreesWithAPlainModelAlsoAcrossTheClocksWrap) {
     std::mt19937 random(1);
     const auto below = [&](unsigned limit) { return static_cast<int>(random() % limit); };
-    for (long long ms = 0; ms < 3LL << 31; ms += (1LL << 31) - 70'000) {
+    for (const long long wrap : {1LL << 31, 1LL << 32}) {
+        long long ms = wrap - 15'000;
         RgbShotManager& manager = newManager();
         Model model;
         for (int step = 0; step < 10'000; ++step) {

@@ -142,9 +142,9 @@ TEST_F(ScreenCaptureTest, SamplesOfSeveralThreadsDoNotTouchEachOther) {
     DisplayChange change;
     change.picture = randomPicture(64, 64, 3);
     changeDisplay(change);
-    std::vector<std::thread> threads;
+    std::array<std::thread, 4> threads;
     for (int i = 0; i < 4; ++i) {
-        threads.emplace_back([&, rect = Rectangle{i, i, 16 * (i + 1), 64}] {
+        threads[i] = std::thread([&, rect = Rectangle{i, i, 16 * (i + 1), 64}] {
             const Rgb expected = averageOf(*change.picture, rect);
             for (int round = 0; round < 50; ++round) EXPECT_EQ(sample(rect), expected);
         });
@@ -156,6 +156,7 @@ TEST_F(ScreenCaptureTest, SamplesOfSeveralThreadsDoNotTouchEachOther) {
 
 TEST_F(ScreenCaptureTest, AListenerServesOneCapture) {
     const auto useTwice = [](auto use) noexcept {
+        // NOLINTNEXTLINE(bugprone-unhandled-exception-at-new)
         const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
         EXPECT_TRUE(listener->onScreenCaptureCompleted({}).isOk());
         EXPECT_EQ(listener->waitForResults().result, OK);
