@@ -39,17 +39,19 @@ struct Buffer {
 void averageColor(benchmark::State& state) {
     const Buffer buffer(state);
     for (auto _ : state) {
-        benchmark::DoNotOptimize(android::averageColor(buffer.pixels, buffer.width, buffer.height,
-                                                       buffer.stride,
-                                                       android::PIXEL_FORMAT_RGBA_8888));
+        int32_t rgb[3];
+        android::averageColor(buffer.pixels, buffer.width, buffer.height, buffer.stride,
+                              android::PIXEL_FORMAT_RGBA_8888, rgb);
+        benchmark::DoNotOptimize(rgb);
     }
 }
 
 void plainLoop(benchmark::State& state) {
     const Buffer buffer(state);
     for (auto _ : state) {
-        benchmark::DoNotOptimize(
-                averagePlainly(buffer.pixels, buffer.width, buffer.height, buffer.stride));
+        int32_t rgb[3];
+        averagePlainly(buffer.pixels, buffer.width, buffer.height, buffer.stride, rgb);
+        benchmark::DoNotOptimize(rgb);
     }
 }
 

@@ -2,8 +2,6 @@
 
 #include <cstdint>
 
-#include "rgb/ColorAverage.h"
-
 /** `averageColor` of 4-byte pixels as one would write it down, compiled with -O2. */
-android::ColorAverage averagePlainly(const uint8_t* row, uint32_t width, uint32_t height,
-                                     uint32_t stride);
+void averagePlainly(const uint8_t* row, uint32_t width, uint32_t height, uint32_t stride,
+                    int32_t* rgb);

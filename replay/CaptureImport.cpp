@@ -278,8 +278,7 @@ private:
 std::string missing(const CaptureReader& capture) {
     if (!capture.hasService) return "no sensor service in the bug report";
     if (capture.hasNoSensors) return "no sensors on the device, so no registrations";
-    if (capture.registrations.empty()) return "no previous registrations";
-    return capture.types.empty() ? "no list of sensors" : "";
+    return capture.registrations.empty() ? "no previous registrations" : "";
 }
 
 void writeTrace(const std::string& name, const CaptureReader& capture, ImportedCapture* result) {

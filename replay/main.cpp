@@ -1,3 +1,5 @@
+#include <iostream>
+
 #include <CLI/CLI.hpp>
 
 #include "replay/Player.h"
@@ -42,7 +44,8 @@ int main(int argc, char** argv) {
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& error) {
-        return app.exit(error) == 0 ? 0 : replay::kStatusBadInput;
+        const int status = app.exit(error) == 0 ? 0 : replay::kStatusBadInput;
+        return std::cout.flush() ? status : replay::kStatusFailed;
     }
     if (json) options.format = replay::OutputFormat::kJson;
     return replay::replayFiles(options);

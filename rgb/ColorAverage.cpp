@@ -18,6 +18,15 @@ static_assert(__BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__, "a pixel's first byte i
 /** A step of the walk: the bytes of one pixel in the usual formats. */
 constexpr size_t kStepBytes = 4;
 
+/** What there is to average, none of it 0 but, perhaps, `rowBytes`. */
+struct Walk {
+    const uint8_t* base;
+    size_t steps;  // of each row
+    size_t rows;
+    size_t rowBytes;  // from one row's begin to the next one's
+    uint32_t count;   // of pixels, to divide by
+};
+
 /** A vector register of that many bytes, each 32-bit lane a pixel. */
 template <size_t Bytes>
 struct PixelVector {
@@ -25,29 +34,28 @@ struct PixelVector {
 };
 
 /**
- * Sums up `steps` (at least one) of each row; rows begin `rowBytes` apart.
- *
  * In each lane, `all` sums whole pixels and `redBlue` their even bytes. Both are 16-bit sums side
  * by side, so that the even bytes' sums can be read from `redBlue`, and the odd bytes' sums from
  * the difference. 256 pixels fit 16 bits: 256 * 255 < 2^16. What alpha adds leaves the lane at its
  * upper end. Two registers of each keep a processor's adders busy.
  */
 template <size_t VectorBytes>
-__attribute__((always_inline)) inline ColorAverage sumRows(const uint8_t* base, size_t steps,
-                                                           size_t rows, size_t rowBytes) {
+__attribute__((always_inline)) inline void average(const Walk& walk, int32_t* rgb) {
     using Vector = typename PixelVector<VectorBytes>::Type;
     constexpr size_t kVectors = 2;
     constexpr size_t kBlockSteps = kVectors * VectorBytes / kStepBytes;
     constexpr size_t kMaxBlocks = 256;
 
-    Vector red = {};
-    Vector green = {};
-    Vector blue = {};
-    ColorAverage sum = {};
-    for (size_t row = 0; row < rows; ++row) {
-        const uint8_t* next = base + row * rowBytes;
+    Vector reds = {};
+    Vector greens = {};
+    Vector blues = {};
+    uint32_t red = 0;
+    uint32_t green = 0;
+    uint32_t blue = 0;
+    for (size_t row = 0; row < walk.rows; ++row) {
+        const uint8_t* next = walk.base + row * walk.rowBytes;
         // The last step is none of a block's: its fourth byte may lie outside the buffer.
-        size_t blocks = (steps - 1) / kBlockSteps;
+        size_t blocks = (walk.steps - 1) / kBlockSteps;
         while (blocks > 0) {
             Vector all[kVectors] = {};
             Vector redBlue[kVectors] = {};
@@ -63,57 +71,56 @@ __attribute__((always_inline)) inline ColorAverage sumRows(const uint8_t* base, 
                 }
             }
             for (size_t i = 0; i < kVectors; ++i) {
-                red += redBlue[i] & 0xffff;
-                green += (all[i] - redBlue[i]) >> 8 & 0xffff;
-                blue += redBlue[i] >> 16;
+                reds += redBlue[i] & 0xffff;
+                greens += (all[i] - redBlue[i]) >> 8 & 0xffff;
+                blues += redBlue[i] >> 16;
             }
         }
-        for (size_t rest = (steps - 1) % kBlockSteps + 1; rest > 0; --rest, next += kStepBytes) {
-            sum.red += next[0];
-            sum.green += next[1];
-            sum.blue += next[2];
+        for (size_t rest = (walk.steps - 1) % kBlockSteps + 1; rest > 0; --rest) {
+            red += next[0];
+            green += next[1];
+            blue += next[2];
+            next += kStepBytes;
         }
     }
     for (size_t lane = 0; lane < VectorBytes / sizeof(uint32_t); ++lane) {
-        sum.red += red[lane];
-        sum.green += green[lane];
-        sum.blue += blue[lane];
+        red += reds[lane];
+        green += greens[lane];
+        blue += blues[lane];
     }
-    return sum;
+    rgb[0] = static_cast<int32_t>(red / walk.count);
+    rgb[1] = static_cast<int32_t>(green / walk.count);
+    rgb[2] = static_cast<int32_t>(blue / walk.count);
 }
 
 #ifdef SENSOR_PRIV_AVX2
-__attribute__((target("avx2"))) ColorAverage sumRowsAvx2(const uint8_t* base, size_t steps,
-                                                         size_t rows, size_t rowBytes) {
-    return sumRows<32>(base, steps, rows, rowBytes);
+__attribute__((target("avx2"))) void averageAvx2(const Walk& walk, int32_t* rgb) {
+    average<32>(walk, rgb);
 }
 #endif
-
-ColorAverage sumRows(const uint8_t* base, size_t steps, size_t rows, size_t rowBytes) {
-#ifdef SENSOR_PRIV_AVX2
-    if (__builtin_cpu_supports("avx2")) return sumRowsAvx2(base, steps, rows, rowBytes);
-#endif
-    return sumRows<16>(base, steps, rows, rowBytes);
-}
 
 }  // namespace
 
-ColorAverage averageColor(const void* base, uint32_t width, uint32_t height, uint32_t stride,
-                          PixelFormat format) {
+void averageColor(const void* base, uint32_t width, uint32_t height, uint32_t stride,
+                  PixelFormat format, int32_t* rgb) {
     const uint32_t count = width * height;
     const uint32_t pixelBytes = bytesPerPixel(format);
     const uint32_t length = pixelBytes * width;
-    if (count == 0 || length == 0 || length > INT32_MAX) return {};
-
-    size_t steps = (size_t{length} + kStepBytes - 1) / kStepBytes;
-    size_t rows = height;
-    const size_t rowBytes = pixelBytes * stride;
-    if (steps * kStepBytes == rowBytes) {  // rows without gaps are one row
-        steps *= rows;
-        rows = 1;
+    const uint32_t rowBytes = pixelBytes * stride;
+    if (count == 0 || length == 0 || length > INT32_MAX) {
+        rgb[0] = rgb[1] = rgb[2] = 0;
+        return;
     }
-    const ColorAverage sum = sumRows(static_cast<const uint8_t*>(base), steps, rows, rowBytes);
-    return {sum.red / count, sum.green / count, sum.blue / count};
+    Walk walk = {static_cast<const uint8_t*>(base), (size_t{length} + kStepBytes - 1) / kStepBytes,
+                 height, rowBytes, count};
+    if (walk.steps * kStepBytes == walk.rowBytes) {  // rows without gaps are one row
+        walk.steps *= walk.rows;
+        walk.rows = 1;
+    }
+#ifdef SENSOR_PRIV_AVX2
+    if (__builtin_cpu_supports("avx2")) return averageAvx2(walk, rgb);
+#endif
+    average<16>(walk, rgb);
 }
 
 }  // namespace android

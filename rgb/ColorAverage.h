@@ -6,16 +6,10 @@
 
 namespace android {
 
-/** The mean of each colour byte over an area, each 0 to 255. */
-struct ColorAverage {
-    uint32_t red;
-    uint32_t green;
-    uint32_t blue;
-};
-
 /**
- * Averages the first three bytes of each pixel of a buffer: `base` is its first byte, `width` and
- * `stride` are in pixels, and a row begins every `stride` pixels of `format`.
+ * Averages the first three bytes of each pixel of a buffer into `rgb`: red, green and blue. `base`
+ * is the buffer's first byte, `width` and `stride` are in pixels, and a row begins every `stride`
+ * pixels of `format`.
  *
  * A row is walked in steps of 4 bytes, whatever the format, up to its length of `width` pixels: a
  * format of another size is taken for bytes, and a last step that only begins within the row counts
@@ -26,7 +20,7 @@ struct ColorAverage {
  * Reads no byte behind the third one of any row's last step. May be called from any thread; takes
  * no lock and no memory.
  */
-ColorAverage averageColor(const void* base, uint32_t width, uint32_t height, uint32_t stride,
-                          PixelFormat format);
+void averageColor(const void* base, uint32_t width, uint32_t height, uint32_t stride,
+                  PixelFormat format, int32_t* rgb);
 
 }  // namespace android

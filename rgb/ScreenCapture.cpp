@@ -65,10 +65,7 @@ int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
     const PixelFormat format = buffer->getPixelFormat();
     // The mapping outlives the lock: it goes with the buffer, which is held until the return.
     buffer->unlock();
-    const ColorAverage average = averageColor(base, width, height, stride, format);
-    rgbOut[0] = static_cast<int>(average.red);
-    rgbOut[1] = static_cast<int>(average.green);
-    rgbOut[2] = static_cast<int>(average.blue);
+    averageColor(base, width, height, stride, format, rgbOut);
 
     SDCImpl::getInstance()->setRgbShotCount();
     if (mLogSwitch != 0) {

@@ -158,7 +158,6 @@ TEST_F(CaptureImportTest, SaysWhatIsMissing) {
                   "capture: no sensors on the device, so no registrations\n"},
                  {kSensors, "capture: no previous registrations\n"},
                  {kSensors + "Previous Registrations:\n\n", "capture: no previous registrations\n"},
-                 {one, "capture: no list of sensors\n"},
                  {"== dumpstate: x\nDUMP OF SERVICE display:\n" + kSensors + one,
                   "capture: no sensor service in the bug report\n"},
                  {"\n# x\nhello\n",

@@ -36,27 +36,31 @@ private:
     uint8_t* const mPages;
 };
 
-using Rgb = std::array<uint32_t, 3>;
+using Rgb = std::array<int32_t, 3>;
 
 Rgb average(const void* base, uint32_t width, uint32_t height, uint32_t stride,
             PixelFormat format) {
-    const ColorAverage result = averageColor(base, width, height, stride, format);
-    return {result.red, result.green, result.blue};
+    Rgb rgb;
+    averageColor(base, width, height, stride, format, rgb.data());
+    return rgb;
 }
 
 /** The walk, byte by byte. */
 Rgb averagePlainly(const uint8_t* row, uint32_t width, uint32_t height, uint32_t stride,
                    PixelFormat format) {
     uint32_t sums[3] = {};
+    const uint32_t rowBytes = bytesPerPixel(format) * stride;
     const auto length = static_cast<int32_t>(bytesPerPixel(format) * width);
-    for (uint32_t y = 0; y < height; ++y, row += bytesPerPixel(format) * stride) {
+    for (uint32_t y = 0; y < height; ++y, row += rowBytes) {
         for (int32_t offset = 0; offset < length; offset += 4) {
             for (int i = 0; i < 3; ++i) sums[i] += row[offset + i];
         }
     }
     const uint32_t count = width * height;
     if (count == 0) return {};
-    return {sums[0] / count, sums[1] / count, sums[2] / count};
+    Rgb rgb{};
+    for (size_t i = 0; i < rgb.size(); ++i) rgb[i] = static_cast<int32_t>(sums[i] / count);
+    return rgb;
 }
 
 TEST(ColorAverageTest, AgreesWithThePlainWalkAndReadsNoByteThatItDoesNot) {
@@ -77,7 +81,7 @@ TEST(ColorAverageTest, AgreesWithThePlainWalkAndReadsNoByteThatItDoesNot) {
         if (stride * height > 6400) continue;
         // All that the walk reads, up to the third byte of its last step.
         const size_t pixelBytes = bytesPerPixel(format);
-        const size_t last = (height - 1) * stride * pixelBytes + (width * pixelBytes + 3) / 4 * 4;
+        const size_t last = pixelBytes * (height - 1) * stride + (pixelBytes * width + 3) / 4 * 4;
         const uint8_t* const atEnd = memory.end() - (pixelBytes == 0 ? 0 : last - 1);
         for (const uint8_t* base : {atEnd, static_cast<const uint8_t*>(memory.begin())}) {
             ASSERT_EQ(average(base, width, height, stride, format),
@@ -89,9 +93,9 @@ TEST(ColorAverageTest, AgreesWithThePlainWalkAndReadsNoByteThatItDoesNot) {
 
 TEST(ColorAverageTest, SumsWrapAt32Bits) {
     // A stride of 0 shows the same row over and over.
-    const std::vector<uint8_t> row(4 * 65536, 0xff);
+    const std::vector<uint8_t> row(size_t{4} * 65536, 0xff);
     const uint32_t sum = 65536u * 300u * 255u;
-    const uint32_t mean = sum / (65536 * 300);
+    const auto mean = static_cast<int32_t>(sum / (65536 * 300));
     EXPECT_EQ(average(row.data(), 65536, 300, 0, PIXEL_FORMAT_RGBA_8888), (Rgb{mean, mean, mean}));
 }
 

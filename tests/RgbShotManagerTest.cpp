@@ -149,7 +149,7 @@ struct Model {
     int budget = 0;
 
     void schedule(long long ms, int delayMs, int shots) {
-        queue.emplace_back(static_cast<int32_t>(ms) + delayMs, shots);
+        queue.emplace_back(static_cast<long long>(static_cast<int32_t>(ms)) + delayMs, shots);
     }
 
     void raise(int shots) { budget = std::max(budget, shots); }
@@ -171,7 +171,8 @@ struct Model {
 TEST_F(RgbShotManagerTest, AgreesWithAPlainModelAlsoAcrossTheClocksWrap) {
     std::mt19937 random(1);
     const auto below = [&](unsigned limit) { return static_cast<int>(random() % limit); };
-    for (long long ms = 0; ms < 3LL << 31; ms += (1LL << 31) - 70'000) {
+    for (const long long wrap : {1LL << 31, 1LL << 32}) {
+        long long ms = wrap - 15'000;
         RgbShotManager& manager = newManager();
         Model model;
         for (int step = 0; step < 10'000; ++step) {

@@ -139,6 +139,7 @@ TEST_F(ScreenCaptureTest, AFailureIsLoggedLeavesTheOutputAndCountsNothing) {
 
 TEST_F(ScreenCaptureTest, AListenerServesOneCapture) {
     const auto useTwice = [](auto use) noexcept {
+        // NOLINTNEXTLINE(bugprone-unhandled-exception-at-new)
         const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
         EXPECT_TRUE(listener->onScreenCaptureCompleted({}).isOk());
         EXPECT_EQ(listener->waitForResults().result, OK);
