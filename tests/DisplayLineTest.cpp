@@ -18,18 +18,6 @@ std::string judge(const std::string& json, const std::string& trace, TraceLine* 
     return TraceParser().parse({text.data(), size}, trace, line).value_or("");
 }
 
-TEST(DisplayLineTest, OnlyWhatIsNamedChanges) {
-    TraceLine line;
-    EXPECT_EQ(judge(R"({"size": [1, 16384], "color": [0, 128, 255], "fault": null})", "", &line),
-              "");
-    EXPECT_EQ(line.display.size->height, 16384u);
-    EXPECT_EQ(line.display.color->green, 128);
-    EXPECT_EQ(line.display.fault, platform::DisplayFault::kNone);
-    EXPECT_EQ(judge(R"({"fault": "lock"})", "", &line), "");
-    EXPECT_EQ(line.display.fault, platform::DisplayFault::kLock);
-    EXPECT_FALSE(line.display.size.has_value());
-}
-
 TEST(DisplayLineTest, APictureIsFoundBesideItsTrace) {
     const std::string example =
             std::filesystem::path(__FILE__).parent_path() / "../examples/x.jsonl";

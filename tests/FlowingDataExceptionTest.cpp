@@ -85,33 +85,6 @@ TEST_F(FlowingDataExceptionTest, OnlyARecordOfSixFieldsIsLoaded) {
     }
 }
 
-TEST_F(FlowingDataExceptionTest, CodesOfNoFamilyDoNothing) {
-    load("1,2,3,0,5,6");
-    constexpr int kMin = std::numeric_limits<int>::min();
-    constexpr int kMax = std::numeric_limits<int>::max();
-    for (const int code : {kMin, -1, 1, 8, 9, 16, kMax}) {
-        flow->updateDetectCountByType(code);
-        flow->notifyPutTally(code);
-    }
-    EXPECT_EQ(taken(), Lines{});
-    for (int code = 10; code < 16; ++code) flow->notifyPutTally(code);
-    flow->setSensorException(8, 5);
-    flow->setSensorException(35, -1);
-    EXPECT_EQ(taken(),
-              (Lines{"0 N273|10003 reason:1", "0 N273|10004 reason:2", "0 N273|10005 reason:3",
-                     "0 N273|10007 reason:5", "0 N273|10008 reason:6", "0 N273|10003 reason:-1"}));
-}
-
-TEST_F(FlowingDataExceptionTest, ASessionsSecondsWrapAt32Bits) {
-    advanceTo(mNow = 1000);
-    EXPECT_EQ(playSession(1800.999), Lines{});
-    EXPECT_EQ(playSession(1801).size(), 1u);
-    EXPECT_EQ(playSession(2147483648.0), Lines{});
-    const Lines lines = playSession(4294967296.0 + 1801.5);
-    ASSERT_EQ(lines.size(), 1u);
-    EXPECT_NE(lines[0].find(" N273|10010 pkg:a/b&time:1801"), std::string::npos);
-}
-
 TEST_F(FlowingDataExceptionTest, SessionsOfSystemPackagesAreNotReported) {
     for (const char* name : {"com.android.incallui", "com.android.mms", "com.android.systemui",
                              "com.android.server.telecom", "my.com.zunophone"}) {

@@ -153,17 +153,6 @@ TEST_F(MagneticUseIfTest, TheTotalsAreLoadedAtBootAndStoredOnlyAfterwards) {
                      "14000 persist.sys.total_oriut=3", "14000 persist.sys.ds_oriut=0"}));
 }
 
-TEST_F(MagneticUseIfTest, TheHostMayAddToATotalByItsNumber) {
-    play("0 d2");
-    for (int bucket = -1; bucket <= 6; ++bucket) {
-        mUse->calCurretUseTotalTime("host", 10 + bucket, bucket);
-    }
-    EXPECT_EQ(taken(), (Lines{"1000 N273|10012 days:2&fastChargeTime:11&otherChargeTime:13&"
-                              "pkg:host&shockAndChargeTime:14&totalTime:15&usbChargeTime:12"}));
-    EXPECT_EQ(mUse->convertLongToString(-2147483647 - 1), "-2147483648");
-    EXPECT_EQ(mUse->convertIntToString(7), "7");
-}
-
 TEST_F(MagneticUseIfTest, ReportsTheFiftyLongestByNameAmongEqualsAndDropsTheOthers) {
     for (int i = 10; i < 70; ++i) {
         const std::string pkg = std::to_string(i);

@@ -11,32 +11,41 @@ namespace {
 
 using Lines = std::vector<std::string>;
 
-const std::string kCount = "persist.zuno.rgb.shot.count";
-
-/** The output line of the count's save. */
-std::string saved(const std::string& at, int count) {
-    return R"({"at": )" + at + R"(, "property": {"name": ")" + kCount + R"(", "value": ")" +
-           std::to_string(count) + R"("}})";
+/** A line at a time, in milliseconds as the line has it. */
+std::string line(const std::string& at, const std::string& rest) {
+    return R"({"at": )" + at + ", " + rest + '}';
 }
 
-/** The output line of the count's report. */
-std::string reported(const std::string& at, int count) {
-    return R"({"at": )" + at +
-           R"(, "event": {"module": "N273", "id": "N273|10009", "payload": "count:)" +
-           std::to_string(count) + R"("}})";
+/** Lines, each with its line feed. */
+std::string joined(const Lines& lines) {
+    std::string text;
+    for (const std::string& each : lines) text += each + '\n';
+    return text;
 }
 
-/** A trace's line that counts a sample, or reports the count. */
+// Lines of traces, and of the output: a boot, a sample that is counted, the count as it is stored,
+// its report as it is asked for and as it is sent.
+
+std::string boot(const std::string& at, const std::string& kind) {
+    return line(at, R"("boot": ")" + kind + '"');
+}
+
 std::string sample(const std::string& at) {
-    return R"({"at": )" + at +
-           R"(, "call": "SDCImpl.setRgbShotCount"})"
-           "\n";
+    return line(at, R"("call": "SDCImpl.setRgbShotCount")");
+}
+
+std::string saved(const std::string& at, int count) {
+    return line(at, R"("property": {"name": "persist.zuno.rgb.shot.count", "value": ")" +
+                            std::to_string(count) + R"("})");
 }
 
 std::string report(const std::string& at) {
-    return R"({"at": )" + at +
-           R"(, "call": "SDCImpl.putRgbShotTally", "args": [7]})"
-           "\n";
+    return line(at, R"("call": "SDCImpl.putRgbShotTally", "args": [7])");
+}
+
+std::string reported(const std::string& at, int count) {
+    return line(at, R"("event": {"module": "N273", "id": "N273|10009", "payload": "count:)" +
+                            std::to_string(count) + R"("})");
 }
 
 /** A property that a file keeps. */
@@ -48,88 +57,72 @@ std::string storedIn(const char* file, const char* name) {
     return value;
 }
 
-class ReplayTest : public ReplayToolTest {};
+class ReplayTest : public ReplayToolTest {
+protected:
+    /** Plays the lines as "trace", as JSON Lines. */
+    Played play(const Lines& trace) const {
+        write("trace", joined(trace));
+        return run("--json trace");
+    }
+};
 
 TEST_F(ReplayTest, RunsWhatIsDueBeforeALineAndHoldsTheWorkerWithinAMoment) {
     // The load is due at 2000, the save at 2500; the report at 2500 finds the saved count, and its
     // reset comes before a save of the same moment's sample.
-    const Played played = play(sample("0") + sample("2000") + report("2500") + sample("2500") +
-                               report("2500") + R"({"at": 9000})");
+    const Played played = play({sample("0"), sample("2000"), report("2500"), sample("2500"),
+                                report("2500"), R"({"at": 9000})"});
     EXPECT_EQ(happened(played), (Lines{saved("500", 1), saved("2500", 2), reported("2500", 2),
                                        reported("2500", 1), saved("3000", 0)}));
     EXPECT_EQ(played.status, 0);
 }
 
 TEST_F(ReplayTest, EndsAtTheLastLineWithWhatIsDueAtThatMoment) {
-    EXPECT_EQ(happened(play(sample("0") + R"({"at": 500})")), (Lines{saved("500", 1)}));
-    EXPECT_EQ(happened(play(sample("0") + R"({"at": 499.999999})")), (Lines{}));
+    EXPECT_EQ(happened(play({sample("0"), R"({"at": 500})"})), (Lines{saved("500", 1)}));
+    EXPECT_EQ(happened(play({sample("0"), R"({"at": 499.999999})"})), (Lines{}));
 }
 
-TEST_F(ReplayTest, WritesFractionsOfMillisecondsAsTheyAre) {
-    EXPECT_EQ(happened(play(report("0.1") + report("8999999999999.5"))),
-              (Lines{reported("0.1", 0), reported("8999999999999.5", 0)}));
-    EXPECT_EQ(happened(play(report("0.000001") + report("1001e-3") + report("1.0020e+0") +
-                            report("10.03E2") + report("86400000000.1234560"))),
-              (Lines{reported("0.000001", 0), reported("1.001", 0), reported("1.002", 0),
-                     reported("1003", 0), reported("86400000000.123456", 0)}));
-}
-
-TEST_F(ReplayTest, ReadsATimeWhereverItStandsAndWhateverFollowsIt) {
-    const std::string call = R"("call": "SDCImpl.putRgbShotTally", "args": [7])";
-    EXPECT_EQ(happened(play("{" + call +
-                            R"(, "at": 1.5})"
-                            "\n#-9-9-9\n" +
-                            "{" + call +
-                            R"(, "\u0061t" : 2.250 })"
-                            "\n" +
-                            R"({"at": -0.0, "boot": "device"})")),
-              (Lines{reported("1.5", 0), reported("2.25", 0)}));
+TEST_F(ReplayTest, ReadsEveryFormOfATimeExactlyAndWritesItInDecimal) {
+    Lines trace;
+    Lines expected;
+    for (const auto& [read, written] : std::vector<std::pair<std::string, std::string>>{
+                 {"-0.0", "0"},
+                 {"0.000001", "0.000001"},
+                 {"1001e-3", "1.001"},
+                 {"1.0020e+0", "1.002"},
+                 {"10.03E2", "1003"},
+                 {"86400000000.1234560 ", "86400000000.123456"},
+                 {"8999999999999.5", "8999999999999.5"}}) {
+        trace.push_back(report(read));
+        trace.push_back("#-9-9-9");  // stands right behind the number, when that stands last
+        expected.push_back(reported(written, 0));
+    }
+    trace.push_back(
+            R"({"call": "SDCImpl.putRgbShotTally", "args": [7], "\u0061t":8999999999999.75})");
+    trace.push_back("#-9-9-9");
+    expected.push_back(reported("8999999999999.75", 0));
+    EXPECT_EQ(happened(play(trace)), expected);
 }
 
 TEST_F(ReplayTest, AProcessBootKeepsTheClockAndThePropertiesADeviceBootOnlyWhatPersists) {
-    const std::string properties =
-            R"({"at": 0, "property": {"persist.zuno.rgb.shot.count": "7", "sys.x": "1"}})"
-            "\n";
-    const Played played = play(properties + sample("1000") +
-                               R"({"at": 1500, "boot": "process"})"
-                               "\n" +
-                               sample("1500") +
-                               R"({"at": 1500, "boot": "process"})"
-                               "\n" +
-                               R"({"at": 1500, "call": "SDCImpl.getInstance"})"
-                               "\n" +
-                               report("3500") + sample("3600") +
-                               R"({"at": 7, "boot": "device"})"
-                               "\n" +
-                               report("8"));
-    // What was due at 1500 ran before the boot line; what the process posted at 1500 is lost with
-    // it.
-    EXPECT_EQ(played.out, R"({"at": 0, "boot": "device"})"
-                          "\n" + saved("1500", 1) +
-                                  "\n" +
-                                  R"({"at": 1500, "boot": "process"})"
-                                  "\n" +
-                                  R"({"at": 1500, "boot": "process"})"
-                                  "\n" +
-                                  reported("3500", 1) + "\n" +
-                                  R"({"at": 7, "boot": "device"})"
-                                  "\n" +
-                                  reported("8", 0) + "\n");
+    const Played played =
+            play({line("0", R"("property": {"persist.zuno.rgb.shot.count": "7"})"), sample("1000"),
+                  boot("1500", "process"), sample("1500"), boot("1500", "process"),
+                  line("1500", R"("call": "SDCImpl.getInstance")"), report("3500"), sample("3600"),
+                  boot("7", "device"), report("8")});
+    // What was due at 1500 ran before the boot line; what was posted at 1500 is lost with its
+    // process.
+    EXPECT_EQ(played.out, joined({boot("0", "device"), saved("1500", 1), boot("1500", "process"),
+                                  boot("1500", "process"), reported("3500", 1), boot("7", "device"),
+                                  reported("8", 0)}));
 }
 
 TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
-    write("one", R"({"at": 100, "property": {"sys.x": "1", "ro.x": "2"}})"
-                 "\n" + sample("100") +
-                         R"({"at": 700})");
+    write("one", joined({line("100", R"("property": {"sys.x": "1", "ro.x": "2"})"), sample("100"),
+                         R"({"at": 700})"}));
     write("two", "# nothing\n");
-    write("three", R"({"at": 5, "call": "SDCImpl.getInstance"})"
-                   "\n" + report("2005"));
-    const std::string expected = R"({"at": 100, "boot": "device"})"
-                                 "\n" +
-                                 saved("600", 1) + "\n" +
-                                 R"({"at": 5, "boot": "device"})"
-                                 "\n" +
-                                 reported("2005", 1) + "\n";
+    write("three", joined({line("5", R"("call": "SDCImpl.getInstance")"), report("2005")}));
+    const std::string expected = joined(
+            {boot("100", "device"), saved("600", 1), boot("5", "device"), reported("2005", 1)});
     EXPECT_EQ(run("--json one two three").out, expected);
     EXPECT_EQ(run("--json one - three", "\n").out, expected);
     EXPECT_EQ(run("--json --properties store one").status, 0);
@@ -139,7 +132,7 @@ TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
 }
 
 TEST_F(ReplayTest, LaysOutLinesForAPerson) {
-    write("trace", sample("86400000") + report("86410000.5"));
+    write("trace", joined({sample("86400000"), report("86410000.5")}));
     EXPECT_EQ(run("trace").out,
               "day 2 00:00:00.000  boot      device\n"
               "day 2 00:00:00.500  property  persist.zuno.rgb.shot.count = 1\n"
@@ -201,28 +194,27 @@ TEST_F(ReplayTest, JudgesEachLineAndKeepsWhatWasDoneBeforeABadOne) {
             {R"({"at": 1, "property": {"a": ")" + std::string(92, 'v') + R"("}})",
              "at most 91 bytes"},
     };
-    for (const auto& [line, what] : cases) {
-        const Played played = play("# first\n" + report("1") + line + "\n" + report("1"));
-        EXPECT_EQ(played.status, 2) << line;
-        EXPECT_EQ(played.err.find("trace:3: "), 0u) << line << '\n' << played.err;
-        EXPECT_NE(played.err.find(what), std::string::npos) << line << '\n' << played.err;
+    for (const auto& [bad, what] : cases) {
+        const Played played = play({"# first", report("1"), bad, report("1")});
+        EXPECT_EQ(played.status, 2) << bad;
+        EXPECT_EQ(played.err.find("trace:3: "), 0u) << bad << '\n' << played.err;
+        EXPECT_NE(played.err.find(what), std::string::npos) << bad << '\n' << played.err;
         EXPECT_EQ(played.err.find('\n'), played.err.size() - 1) << played.err;
-        EXPECT_EQ(happened(played), (Lines{reported("1", 0)})) << line;
+        EXPECT_EQ(happened(played), (Lines{reported("1", 0)})) << bad;
     }
 }
 
 TEST_F(ReplayTest, ABadLineKeepsEvenWhatIsDueFromRunningAndABadFirstOneStartsNothing) {
-    const std::string post = R"({"at": 0, "call": "SDCImpl.notifySdcReset", "args": [23]})"
-                             "\n";
-    EXPECT_EQ(happened(play(post)).size(), 1u);
-    EXPECT_EQ(happened(play(post + R"({"at": 0, "x": 1})")), (Lines{}));
-    const Played played = play("\n{}\n" + report("0"));
+    const std::string post = line("0", R"("call": "SDCImpl.notifySdcReset", "args": [23])");
+    EXPECT_EQ(happened(play({post})).size(), 1u);
+    EXPECT_EQ(happened(play({post, R"({"at": 0, "x": 1})"})), (Lines{}));
+    const Played played = play({"", "{}", report("0")});
     EXPECT_EQ(played.out, "");
     EXPECT_EQ(played.err, "trace:2: \"at\" is missing\n");
 }
 
 TEST_F(ReplayTest, NamesFilesThatItCannotUse) {
-    write("trace", report("0"));
+    write("trace", report("0") + "\n");
     write("broken", "not a database, and long enough to be told from one that is empty");
     for (const auto& [arguments, what] : std::vector<std::pair<std::string, std::string>>{
                  {"missing", "missing: cannot open: No such file or directory\n"},
@@ -241,15 +233,8 @@ TEST_F(ReplayTest, NamesFilesThatItCannotUse) {
 
 TEST_F(ReplayTest, ReadsLinesLongerThanABlock) {
     const std::string blanks(600'000, ' ');
-    EXPECT_EQ(happened(play(blanks + report("0") + "{" + blanks + report("1").substr(1))),
+    EXPECT_EQ(happened(play({blanks + report("0"), "{" + blanks + report("1").substr(1)})),
               (Lines{reported("0", 0), reported("1", 0)}));
-}
-
-TEST_F(ReplayTest, ExplainsItself) {
-    const Played played = run("--help");
-    EXPECT_EQ(played.status, 0);
-    EXPECT_EQ(played.out.find("Examples:"), 0u);
-    EXPECT_NE(played.out.find("Exit status:"), std::string::npos);
 }
 
 }  // namespace

@@ -38,11 +38,6 @@ Played ReplayToolTest::run(const std::string& arguments, const std::string& inpu
             contents(mFolder / "err")};
 }
 
-Played ReplayToolTest::play(const std::string& trace) const {
-    write("trace", trace);
-    return run("--json trace");
-}
-
 std::vector<std::string> ReplayToolTest::happened(const Played& played) {
     std::vector<std::string> lines;
     std::istringstream out(played.out);

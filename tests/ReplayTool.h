@@ -25,9 +25,6 @@ protected:
     /** `arguments` as a shell takes them; `input` is its standard input. */
     Played run(const std::string& arguments, const std::string& input = "") const;
 
-    /** Plays the text as "trace", as JSON Lines. */
-    Played play(const std::string& trace) const;
-
     /** The lines of a JSON output but for boots. */
     static std::vector<std::string> happened(const Played& played);
 

@@ -15,15 +15,6 @@ protected:
     }
 };
 
-TEST_F(RgbShotTest, ABurstIsStoredOnceHalfASecondAfterItsLastSample) {
-    RgbShot::getInstance();
-    sampleAt(3000);
-    sampleAt(3100);
-    sampleAt(3200);
-    advanceTo(10000);
-    EXPECT_EQ(taken(), (Lines{"3700 persist.zuno.rgb.shot.count=3"}));
-}
-
 TEST_F(RgbShotTest, ASampleStoredBeforeTheLoadReplacesTheStoredCount) {
     setProperty(kCount, "40");
     RgbShot::getInstance();
@@ -41,22 +32,6 @@ TEST_F(RgbShotTest, ASampleThatWaitsForTheLoadIsLost) {
     sampleAt(1600);
     advanceTo(3000);
     EXPECT_EQ(taken(), (Lines{"2100 persist.zuno.rgb.shot.count=40"}));
-}
-
-TEST_F(RgbShotTest, AReportRestartsTheCountButNotWhatIsStored) {
-    setProperty(kCount, "40");
-    RgbShot::getInstance();
-    advanceTo(5000);
-    RgbShot::getInstance()->putRgbShotTally();
-    RgbShot::getInstance()->putRgbShotTally();
-    EXPECT_EQ(taken(), (Lines{"5000 N273|10009 count:40", "5000 N273|10009 count:0"}));
-    EXPECT_EQ(property(kCount), "40");
-
-    sampleAt(6000);
-    RgbShot::getInstance()->notifyRgbShotReset();
-    sampleAt(6001);
-    advanceTo(7000);
-    EXPECT_EQ(property(kCount), "1");
 }
 
 /** What is stored, and what it is loaded as. */
@@ -77,14 +52,6 @@ INSTANTIATE_TEST_SUITE_P(Texts, StoredCountTest,
                                            std::pair(" -12x", "-12"), std::pair("0x10", "0"),
                                            std::pair("99999999999999999999", "2147483647"),
                                            std::pair("-2147483649", "-2147483648")));
-
-TEST_F(RgbShotTest, TheCountWrapsAt32Bits) {
-    setProperty(kCount, "2147483647");
-    RgbShot::getInstance();
-    sampleAt(3000);
-    advanceTo(4000);
-    EXPECT_EQ(property(kCount), "-2147483648");
-}
 
 }  // namespace
 }  // namespace android

@@ -201,22 +201,5 @@ TEST(PictureTest, PixelsAreTakenAsTheyAreStored) {
     }
 }
 
-TEST(PictureTest, EveryCutOfAFileIsRefused) {
-    const std::string path = writePng("cut.png", PNG_FORMAT_RGB, {1, 2, 3, 4, 5, 6, 7, 8, 9});
-    std::FILE* file = std::fopen(path.c_str(), "rb");
-    std::vector<char> bytes(1000);
-    bytes.resize(std::fread(bytes.data(), 1, bytes.size(), file));
-    std::fclose(file);
-    Picture picture;
-    for (size_t size = 0; size < bytes.size(); size += 3) {
-        file = std::fopen(path.c_str(), "wb");
-        std::fwrite(bytes.data(), 1, size, file);
-        std::fclose(file);
-        EXPECT_NE(platform::readPng(path, &picture), std::nullopt) << size;
-    }
-    std::remove(path.c_str());
-    EXPECT_EQ(platform::readPng(path, &picture), "cannot open: No such file or directory");
-}
-
 }  // namespace
 }  // namespace android

@@ -5,7 +5,6 @@
 
 #include <unistd.h>
 
-#include "core/Log.h"
 #include "platform/PropertyService.h"
 #include "tests/LibraryTest.h"
 
@@ -37,12 +36,6 @@ TEST_F(TallyCommonTest, SendsPairsInBytewiseOrderOfTheirKeysUnescaped) {
     mTally->trackEvent("N273|10009", {{"count", "3"}});
     EXPECT_EQ(taken(), (Lines{"0 N273|10013 10:ten&9:nine&Z:&a:1:2&3", "0 N273|10009 count:3"}));
     EXPECT_EQ(mTally->convertMapToTally({}), "");
-}
-
-TEST_F(TallyCommonTest, LogsTheEventIdWhileDetailedLoggingIsOn) {
-    mLogSwitch = 1;
-    mTally->setTally({"N273|10010", "a:1"});
-    EXPECT_EQ(taken(), (Lines{"0 log 6 SDC Event = N273|10010", "0 N273|10010 a:1"}));
 }
 
 TEST_F(TallyCommonTest, CutsATextAtItsDelimiterAndKeepsEmptyPieces) {

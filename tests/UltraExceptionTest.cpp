@@ -32,15 +32,6 @@ protected:
     }
 };
 
-TEST_F(UltraExceptionTest, AnyValueThatDoesNotBeginWithNoMeansOverseas) {
-    for (const auto& [value, overseas] :
-         {std::pair("", false), std::pair("no", false), std::pair("NOne", false),
-          std::pair("n", true), std::pair(" no", true), std::pair("yes", true)}) {
-        setProperty("ro.zuno.product.overseas", value);
-        EXPECT_EQ(UltraException::getOverseas(), overseas) << value;
-    }
-}
-
 TEST_F(UltraExceptionTest, EnergiesAreCutToWholeNumbers) {
     constexpr float kInfinity = std::numeric_limits<float>::infinity();
     UltraException* ultra = loaded();

@@ -209,16 +209,5 @@ TEST_F(WechatProxExceptionTest, TakesModeAndStateFromWholeNotificationsOfTheirKi
     EXPECT_EQ(counters(), "1_0_0_1");
 }
 
-TEST(ArithmeticTest, AFloatThatDoesNotFitTruncatesToTheNearestNumber) {
-    constexpr int32_t kMin = std::numeric_limits<int32_t>::min();
-    constexpr int32_t kMax = std::numeric_limits<int32_t>::max();
-    const std::pair<float, int32_t> cases[] = {
-            {-0.99F, 0},      {5.99F, 5},        {2147483520.0F, 2147483520},
-            {0x1p31F, kMax},  {-0x1p31F, kMin},  {-3e9F, kMin},
-            {INFINITY, kMax}, {-INFINITY, kMin}, {NAN, 0},
-            {-NAN, 0}};
-    for (const auto& [value, expected] : cases) EXPECT_EQ(truncateToInt32(value), expected);
-}
-
 }  // namespace
 }  // namespace android
