@@ -57,13 +57,12 @@ public:
     void eyeChange();       // 1 in 2000 ms
     void policyChange();    // 5 in 200 ms
 
-    /** Raises the budget to `shots` in `delayMs`; at the next `isTimeToShot` if that is negative.
-     */
+    /** Raises the budget to `shots` in `delayMs`; a negative delay is over already. */
     void setRgbShotDelay(int shots, int delayMs);
 
     /**
-     * 0: no sample is allowed until another status comes. Other: that is over, and the budget is
-     * raised to 2, and to 2 in 8000 ms.
+     * 0: no sample is allowed until another status comes. Any other: that is over, and the budget
+     * is raised to 2 now and to 2 in 8000 ms.
      */
     void onTransitionStatusChange(int status);
 
@@ -80,9 +79,13 @@ public:
     /** Queues a raise: when it is due, and to what. */
     void queuePush(std::pair<long long, int> entry);
 
-    /** Drops the entry that is due first; of several, the smallest raise. See `isEmpty` first. */
+    /**
+     * Drops the entry that is due first; of several, the smallest raise. Callers ask `isEmpty`
+     * first; if another thread has come in between and nothing is left, nothing happens.
+     */
     void queuePop();
 
+    /** Whether nothing is queued; what is pending is not. */
     bool isEmpty();
 
     /**
@@ -93,7 +96,7 @@ public:
 
     /**
      * Notes the entry that `queuePop` would drop as the pending one's time and budget, without
-     * making it pending. See `isEmpty` first. Returns 0.
+     * making it pending. An empty queue is treated as there. Returns 0.
      */
     int getWaitCount();
 
