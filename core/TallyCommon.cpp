@@ -38,8 +38,9 @@ void TallyCommon::setTally(DataWrapper data) {
 
 std::string TallyCommon::convertMapToTally(std::map<std::string, std::string> params) {
     std::string result;
-    for (const auto& [key, value] : params)
+    for (const auto& [key, value] : params) {
         result.append(key).append(":").append(value).append("&");
+    }
     if (!result.empty()) result.pop_back();
     return result;
 }

@@ -207,12 +207,14 @@ std::optional<int64_t> toNanoseconds(std::string_view token) {
     }
     if (digits.empty()) return 0;
     if (token.front() == '-') return std::nullopt;
-    if (i < token.size())
-        exponent += std::clamp(std::strtol(std::string(token.substr(i + 1)).c_str(), nullptr, 10),
-                               -1000L, 1000L);
+    if (i < token.size()) {  // an exponent, or blanks, which read as 0
+        const std::string rest(token.substr(i + 1));
+        exponent += std::clamp(std::strtol(rest.c_str(), nullptr, 10), -1000L, 1000L);
+    }
     for (; digits.back() == '0'; ++exponent) digits.pop_back();
-    if (exponent < 0 || static_cast<int64_t>(digits.size()) + exponent > kMaxDigits)
+    if (exponent < 0 || static_cast<int64_t>(digits.size()) + exponent > kMaxDigits) {
         return std::nullopt;
+    }
     digits.append(static_cast<size_t>(exponent), '0');
     const int64_t time = std::strtoll(digits.c_str(), nullptr, 10);
     return time <= kMaxTimeMs * kNsPerMs ? std::optional(time) : std::nullopt;
@@ -337,8 +339,7 @@ Error readPicture(element json, const std::string& trace, platform::Picture* pic
     if (Error error = read(json, &path)) return error;
     // An absolute path stands for itself; standard input, "-", is beside the current directory.
     const auto file = std::filesystem::path(trace).parent_path() / path;
-    if (Error error = platform::readPng(file, picture))
-        return toJson(std::string_view(path)) + ": " + *error;
+    if (Error error = platform::readPng(file, picture)) return toJson(path) + ": " + *error;
     return {};
 }
 

@@ -105,8 +105,9 @@ TEST_F(UltraExceptionTest, ACallUsesTheSensorIfAnAppIsKnownOrEnablesItMeanwhile)
 }
 
 TEST_F(UltraExceptionTest, FullCountsStayButTheCallsWrap) {
-    for (const char* name : {"ultra.enable", "device.invalid", "route.invalid", "rx.close"})
+    for (const char* name : {"ultra.enable", "device.invalid", "route.invalid", "rx.close"}) {
         setProperty(std::string("persist.zuno.") + name + ".count", "2147483646");
+    }
     setProperty("persist.zuno.ultra.invalid.count", "2147483645");
     setProperty("persist.zuno.ultra.phone.enable.count", "2147483647");
     UltraException* ultra = loaded();

@@ -237,8 +237,9 @@ void MagneticUseIf::recordTime() {
 }
 
 void MagneticUseIf::calCurretTime(std::string pkg) {
-    if (mLogSwitch != 0)
+    if (mLogSwitch != 0) {
         SENSOR_PRIV_LOGD("mUD=%d, mLastUD=%d, mLastRUD=%d", mUD, mLastUD, mLastRUD);
+    }
     if (mUD <= mLastRUD) return;
     mLastRUD = mUD;
     mTotalD = addWrapped(mTotalD, int64_t{mUD} - mLastUD);  // back, if the counter went back

@@ -42,8 +42,9 @@ void RegisterConnectionList::handleEnable(const std::string& pkg, const std::str
         if (info.beginTime == 0) continue;
         if (!credited && info.rate == mCurrentRate) {
             addSeconds(&info.time, info.beginTime, now);
-            if (isDisplayOn() && info.onBeginTime != 0)
+            if (isDisplayOn() && info.onBeginTime != 0) {
                 addSeconds(&info.ontime, info.onBeginTime, now);
+            }
             credited = true;
         }
         info.beginTime = now;
