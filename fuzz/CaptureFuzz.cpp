@@ -5,20 +5,20 @@
 #include <cstdio>
 #include <cstdlib>
 
+#include "capture/CaptureImport.h"
 #include "fuzz/FuzzInput.h"
-#include "replay/CaptureImport.h"
-#include "replay/LineReader.h"
-#include "replay/TraceLine.h"
+#include "trace/LineReader.h"
+#include "trace/TraceLine.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-    replay::LineReader reader(fuzz::readable(data, size));
+    trace::LineReader reader(fuzz::readable(data, size));
     const auto first = reader.next();
     if (!first) return 0;
-    const replay::ImportedCapture capture = replay::importCapture("capture", *first, &reader);
-    const auto* trace = reinterpret_cast<const uint8_t*>(capture.trace.data());
-    replay::LineReader lines(fuzz::readable(trace, capture.trace.size()));
-    static replay::TraceParser parser;
-    replay::TraceLine line;
+    const capture::ImportedCapture imported = capture::importCapture("capture", *first, &reader);
+    const auto* trace = reinterpret_cast<const uint8_t*>(imported.trace.data());
+    trace::LineReader lines(fuzz::readable(trace, imported.trace.size()));
+    static trace::TraceParser parser;
+    trace::TraceLine line;
     int64_t last = 0;
     while (const auto text = lines.next()) {
         const auto error = parser.parse(*text, "capture", &line);

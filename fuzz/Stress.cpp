@@ -12,11 +12,11 @@
 #include <unistd.h>
 
 #include "platform/Telemetry.h"
-#include "replay/Library.h"
+#include "trace/CallTable.h"
 
-extern "C" const replay::Library* sensor_replay_library();
+extern "C" const trace::Calls* sensor_replay_calls();
 
-namespace replay {
+namespace trace {
 namespace {
 
 constexpr int kThreads = 8;
@@ -67,14 +67,14 @@ std::vector<Argument> makeArguments(Random& random) {
 constexpr std::vector<Argument> (*kArguments[])(Random&) = {
 #define CALL(Class, operation) makeArguments<decltype(&android::Class::operation)>,
 #define VARIABLE(name)
-#include "replay/library.inc"
+#include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE
 };
 
 void run(unsigned seed, int calls) {
     Random random(seed);
-    const Library* library = sensor_replay_library();
+    const Calls* library = sensor_replay_calls();
     for (int i = 0; i < calls; ++i) {
         const size_t index = random() % std::size(kArguments);
         library->call(index, kArguments[index](random));
@@ -82,7 +82,7 @@ void run(unsigned seed, int calls) {
 }
 
 }  // namespace
-}  // namespace replay
+}  // namespace trace
 
 int main(int argc, char** argv) {
     const int calls = argc > 1 ? std::atoi(argv[1]) : 10'000;
@@ -90,11 +90,11 @@ int main(int argc, char** argv) {
     platform::observeEvents([](const char*, const char*, const char*) {});
     mLogSwitch = 1;
     std::vector<std::thread> threads;
-    for (unsigned seed = 0; seed < replay::kThreads; ++seed) {
-        threads.emplace_back(replay::run, seed, calls);
+    for (unsigned seed = 0; seed < trace::kThreads; ++seed) {
+        threads.emplace_back(trace::run, seed, calls);
     }
     for (std::thread& thread : threads) thread.join();
-    std::printf("%d threads made %d calls each\n", replay::kThreads, calls);
+    std::printf("%d threads made %d calls each\n", trace::kThreads, calls);
     std::fflush(stdout);
     _exit(0);  // the worker is still at it: the library's mutexes must not be destroyed
 }

@@ -4,15 +4,15 @@
 #include <cstdint>
 
 #include "fuzz/FuzzInput.h"
-#include "replay/LineReader.h"
-#include "replay/TraceLine.h"
+#include "trace/LineReader.h"
+#include "trace/TraceLine.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-    static replay::TraceParser parser;
-    replay::LineReader reader(fuzz::readable(data, size));
-    replay::TraceLine line;
+    static trace::TraceParser parser;
+    trace::LineReader reader(fuzz::readable(data, size));
+    trace::TraceLine line;
     while (const auto text = reader.next()) {
-        if (!replay::isSkipped(*text)) parser.parse(*text, "trace", &line);
+        if (!trace::isSkipped(*text)) parser.parse(*text, "trace", &line);
     }
     return 0;
 }

@@ -9,13 +9,14 @@
 #include "platform/PropertyService.h"
 #include "platform/Telemetry.h"
 #include "replay/VirtualClock.h"
+#include "trace/TraceTime.h"
 
 namespace replay {
 
 namespace {
 
 /** For the observers of the platform, which are plain functions or know no context. */
-Output* gOutput = nullptr;
+report::Output* gOutput = nullptr;
 
 /** The platform's own libraries log too; only the library's lines are shown. */
 void takeLogLine(const __android_logger_data* data, const char* message) {
@@ -26,7 +27,7 @@ void takeLogLine(const __android_logger_data* data, const char* message) {
     }
 }
 
-void observePlatform(Output* output) {
+void observePlatform(report::Output* output) {
     gOutput = output;
     __android_log_set_logger(takeLogLine);
     __android_log_set_minimum_priority(ANDROID_LOG_VERBOSE);
@@ -38,32 +39,33 @@ void observePlatform(Output* output) {
 }
 
 /** Loads the library, which runs its static initialisers. Null if that fails. */
-const Library* loadLibrary() {
-    void* module = dlopen(SENSOR_REPLAY_LIBRARY, RTLD_NOW | RTLD_LOCAL);
+const trace::Calls* loadCalls() {
+    void* module = dlopen(SENSOR_REPLAY_CALLS, RTLD_NOW | RTLD_LOCAL);
     if (module == nullptr) return nullptr;
-    const auto entry = reinterpret_cast<const Library* (*)()>(dlsym(module, kLibraryEntry));
+    const auto entry =
+            reinterpret_cast<const trace::Calls* (*)()>(dlsym(module, trace::kCallsEntry));
     return entry == nullptr ? nullptr : entry();
 }
 
 /** One process's part of a replay. */
 class Player {
 public:
-    Player(const std::string& name, LineReader* reader, Output* output,
+    Player(const std::string& name, trace::LineReader* reader, report::Output* output,
            std::optional<Failure>* failure)
           : mName(name),
             mReader(reader),
             mOutput(output),
             mFailure(failure) {}
 
-    NextBoot play(const Boot& boot, const TraceLine* first) {
+    NextBoot play(const Boot& boot, const trace::TraceLine* first) {
         observePlatform(mOutput);
         virtual_clock::set(boot.at);
-        if (boot.kind == BootKind::kDevice) platform::dropVolatileProperties();
-        mOutput->boot(boot.kind == BootKind::kDevice ? "device" : "process");
+        if (boot.kind == trace::BootKind::kDevice) platform::dropVolatileProperties();
+        mOutput->boot(boot.kind == trace::BootKind::kDevice ? "device" : "process");
         if (first != nullptr) mLine = *first;
         if (first != nullptr || readNext()) {
             do {
-                if (mLine.action == TraceLine::Action::kBoot) return endByBoot();
+                if (mLine.action == trace::TraceLine::Action::kBoot) return endByBoot();
                 if (mLine.at > virtual_clock::now()) virtual_clock::advanceTo(mLine.at);
                 if (!carryOut()) return {};
             } while (readNext());
@@ -76,14 +78,14 @@ private:
     bool readNext() {
         if (!mReader->hasLine()) mOutput->flush();
         if (!readLine(mName, mReader, &mParser, &mLine, mFailure)) return false;
-        const bool newClock =
-                mLine.action == TraceLine::Action::kBoot && mLine.boot == BootKind::kDevice;
+        const bool newClock = mLine.action == trace::TraceLine::Action::kBoot &&
+                              mLine.boot == trace::BootKind::kDevice;
         if (mLine.at < virtual_clock::now() && !newClock) {
-            *mFailure =
-                    Failure{mName + ':' + std::to_string(mReader->lineNumber()) +
-                                    R"(: "at" goes back, from )" + formatMs(virtual_clock::now()) +
-                                    " to " + formatMs(mLine.at),
-                            kStatusBadInput};
+            *mFailure = Failure{mName + ':' + std::to_string(mReader->lineNumber()) +
+                                        R"(: "at" goes back, from )" +
+                                        trace::formatMs(virtual_clock::now()) + " to " +
+                                        trace::formatMs(mLine.at),
+                                kStatusBadInput};
             return false;
         }
         return true;
@@ -92,7 +94,7 @@ private:
     NextBoot endByBoot() {
         // The new clock's times say nothing about the old one: only its present moment runs out.
         // A process boot comes in the middle of a moment; what that has posted is lost.
-        if (mLine.boot == BootKind::kDevice) {
+        if (mLine.boot == trace::BootKind::kDevice) {
             virtual_clock::settle();
         } else if (mLine.at > virtual_clock::now()) {
             virtual_clock::advanceTo(mLine.at);
@@ -102,26 +104,26 @@ private:
 
     bool carryOut() {
         switch (mLine.action) {
-            case TraceLine::Action::kCall:
+            case trace::TraceLine::Action::kCall:
                 if (!load()) return false;
-                if (const auto result = mLibrary->call(mLine.call, mLine.arguments)) {
-                    mOutput->result(callName(mLine.call), *result);
+                if (const auto result = mCalls->call(mLine.call, mLine.arguments)) {
+                    mOutput->result(trace::callName(mLine.call), *result);
                 }
                 break;
-            case TraceLine::Action::kSet:
+            case trace::TraceLine::Action::kSet:
                 if (!load()) return false;
-                for (const auto& [index, value] : mLine.variables) mLibrary->set(index, value);
+                for (const auto& [index, value] : mLine.variables) mCalls->set(index, value);
                 break;
-            case TraceLine::Action::kProperty:
+            case trace::TraceLine::Action::kProperty:
                 for (const auto& [name, value] : mLine.properties) {
                     platform::setDeviceProperty(name, value);
                 }
                 break;
-            case TraceLine::Action::kDisplay:
+            case trace::TraceLine::Action::kDisplay:
                 platform::changeDisplay(mLine.display);
                 break;
-            case TraceLine::Action::kNone:
-            case TraceLine::Action::kBoot:
+            case trace::TraceLine::Action::kNone:
+            case trace::TraceLine::Action::kBoot:
                 break;
         }
         return true;
@@ -129,43 +131,43 @@ private:
 
     /** Properties that were set before the first call are in force when the library starts. */
     bool load() {
-        if (mLibrary == nullptr) mLibrary = loadLibrary();
-        if (mLibrary == nullptr) {
+        if (mCalls == nullptr) mCalls = loadCalls();
+        if (mCalls == nullptr) {
             *mFailure =
                     Failure{std::string("cannot load the library: ") + dlerror(), kStatusFailed};
         }
-        return mLibrary != nullptr;
+        return mCalls != nullptr;
     }
 
     const std::string& mName;
-    LineReader* const mReader;
-    Output* const mOutput;
+    trace::LineReader* const mReader;
+    report::Output* const mOutput;
     std::optional<Failure>* const mFailure;
 
-    TraceParser mParser;
-    TraceLine mLine;
-    const Library* mLibrary = nullptr;
+    trace::TraceParser mParser;
+    trace::TraceLine mLine;
+    const trace::Calls* mCalls = nullptr;
 };
 
 }  // namespace
 
-bool readLine(const std::string& name, LineReader* reader, TraceParser* parser, TraceLine* line,
-              std::optional<Failure>* failure) {
+bool readLine(const std::string& name, trace::LineReader* reader, trace::TraceParser* parser,
+              trace::TraceLine* line, std::optional<Failure>* failure) {
     const auto fail = [&](const std::string& what) {
         *failure = Failure{name + ':' + std::to_string(reader->lineNumber()) + ": " + what,
                            kStatusBadInput};
         return false;
     };
     while (const auto text = reader->next()) {
-        if (isSkipped(*text)) continue;
+        if (trace::isSkipped(*text)) continue;
         if (const auto error = parser->parse(*text, name, line)) return fail(*error);
         return true;
     }
     return reader->error() ? fail(*reader->error()) : false;
 }
 
-NextBoot play(const Boot& boot, const TraceLine* first, const std::string& name, LineReader* reader,
-              Output* output, std::optional<Failure>* failure) {
+NextBoot play(const Boot& boot, const trace::TraceLine* first, const std::string& name,
+              trace::LineReader* reader, report::Output* output, std::optional<Failure>* failure) {
     return Player(name, reader, output, failure).play(boot, first);
 }
 

@@ -12,13 +12,13 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "capture/CaptureImport.h"
 #include "platform/Display.h"
 #include "platform/PropertyService.h"
-#include "replay/CaptureImport.h"
-#include "replay/FileIo.h"
-#include "replay/LineReader.h"
 #include "replay/Player.h"
-#include "replay/TraceLine.h"
+#include "trace/FileIo.h"
+#include "trace/LineReader.h"
+#include "trace/TraceLine.h"
 
 namespace replay {
 
@@ -58,9 +58,9 @@ private:
     void runFile() {
         const int fd = mName == "-" ? dup(STDIN_FILENO) : open(mName.c_str(), O_RDONLY | O_CLOEXEC);
         if (fd < 0) return fail(mName + ": cannot open: " + std::strerror(errno));
-        mReader = std::make_unique<LineReader>(fd);
+        mReader = std::make_unique<trace::LineReader>(fd);
         std::optional<std::string_view> text = mReader->next();
-        while (text && isSkipped(*text)) text = mReader->next();
+        while (text && trace::isSkipped(*text)) text = mReader->next();
         if (mReader->error()) {
             fail(mName + ':' + std::to_string(mReader->lineNumber()) + ": " + *mReader->error());
         } else if (text && text->find_first_not_of(" \t") != text->find('{')) {
@@ -68,7 +68,7 @@ private:
         } else if (mOptions.printTrace) {
             fail(mName + ": not a device capture");
         } else if (text) {
-            TraceLine first;
+            trace::TraceLine first;
             if (const auto error = mParser.parse(*text, mName, &first)) {
                 fail(mName + ':' + std::to_string(mReader->lineNumber()) + ": " + *error);
             } else {
@@ -78,35 +78,36 @@ private:
     }
 
     void runCapture(std::string_view firstLine) {
-        const ImportedCapture capture = importCapture(mName, firstLine, mReader.get());
-        if (!capture.error.empty()) return fail(capture.error);
-        for (const std::string& warning : capture.warnings) {
+        const capture::ImportedCapture imported =
+                capture::importCapture(mName, firstLine, mReader.get());
+        if (!imported.error.empty()) return fail(imported.error);
+        for (const std::string& warning : imported.warnings) {
             std::fprintf(stderr, "%s\n", warning.c_str());
         }
         if (mOptions.printTrace) {
-            if (!writeAll(STDOUT_FILENO, capture.trace.data(), capture.trace.size())) {
+            if (!trace::writeAll(STDOUT_FILENO, imported.trace.data(), imported.trace.size())) {
                 fail(std::string("cannot write standard output: ") + std::strerror(errno),
                      kStatusFailed);
             }
             return;
         }
         const int fd = memfd_create("trace", MFD_CLOEXEC);
-        if (fd < 0 || !writeAll(fd, capture.trace.data(), capture.trace.size()) ||
+        if (fd < 0 || !trace::writeAll(fd, imported.trace.data(), imported.trace.size()) ||
             lseek(fd, 0, SEEK_SET) != 0) {
             return fail(mName + ": cannot keep the trace: " + std::strerror(errno), kStatusFailed);
         }
-        mReader = std::make_unique<LineReader>(fd);
-        TraceLine first;
+        mReader = std::make_unique<trace::LineReader>(fd);
+        trace::TraceLine first;
         if (readLine(mName, mReader.get(), &mParser, &first, &mFailure)) runTrace(first);
     }
 
-    void runTrace(const TraceLine& first) {
-        NextBoot boot = runProcess(Boot{BootKind::kDevice, first.at}, &first);
+    void runTrace(const trace::TraceLine& first) {
+        NextBoot boot = runProcess(Boot{trace::BootKind::kDevice, first.at}, &first);
         while (boot) boot = runProcess(*boot, nullptr);
     }
 
     /** Runs one boot in a process of its own. */
-    NextBoot runProcess(const Boot& boot, const TraceLine* first) {
+    NextBoot runProcess(const Boot& boot, const trace::TraceLine* first) {
         int ends[2];
         if (pipe2(ends, O_CLOEXEC) != 0) {
             fail(std::string("cannot make a pipe: ") + std::strerror(errno), kStatusFailed);
@@ -121,7 +122,7 @@ private:
             _exit(playAndReport(boot, first, ends[1]));
         }
         close(ends[1]);
-        const std::vector<unsigned char> bytes = readAll(ends[0]);
+        const std::vector<unsigned char> bytes = trace::readAll(ends[0]);
         close(ends[0]);
         if (child < 0) {
             fail(std::string("cannot start a process: ") + std::strerror(errno), kStatusFailed);
@@ -130,7 +131,7 @@ private:
         return takeReport(child, bytes);
     }
 
-    int playAndReport(const Boot& boot, const TraceLine* first, int reportFd) {
+    int playAndReport(const Boot& boot, const trace::TraceLine* first, int reportFd) {
         if (mOptions.properties) {
             if (const auto error = platform::openProperties(*mOptions.properties)) {
                 fail(*error);
@@ -153,8 +154,8 @@ private:
             return mFailure->status;
         }
         const Report report{next.has_value(), next.value_or(Boot{})};
-        const bool told = writeAll(reportFd, &report, sizeof(report)) &&
-                          writeAll(reportFd, properties.data(), properties.size());
+        const bool told = trace::writeAll(reportFd, &report, sizeof(report)) &&
+                          trace::writeAll(reportFd, properties.data(), properties.size());
         return told ? 0 : kStatusFailed;
     }
 
@@ -179,11 +180,11 @@ private:
     }
 
     const Options& mOptions;
-    Output mOutput;
-    TraceParser mParser;
+    report::Output mOutput;
+    trace::TraceParser mParser;
 
     std::string mName;  // of the file being played
-    std::unique_ptr<LineReader> mReader;
+    std::unique_ptr<trace::LineReader> mReader;
     std::vector<unsigned char> mProperties;  // if no file keeps them
 
     std::optional<Failure> mFailure;  // not yet said

@@ -4,12 +4,12 @@
 #include <string>
 #include <vector>
 
-#include "replay/Output.h"
+#include "report/Output.h"
 
 namespace replay {
 
 struct Options {
-    OutputFormat format = OutputFormat::kText;
+    report::OutputFormat format = report::OutputFormat::kText;
     bool printTrace = false;                // print the trace made from a capture, play nothing
     std::optional<std::string> properties;  // the file that keeps them; in memory without
     std::vector<std::string> files;         // "-" is standard input

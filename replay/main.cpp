@@ -47,6 +47,6 @@ int main(int argc, char** argv) {
         const int status = app.exit(error) == 0 ? 0 : replay::kStatusBadInput;
         return std::cout.flush() ? status : replay::kStatusFailed;
     }
-    if (json) options.format = replay::OutputFormat::kJson;
+    if (json) options.format = report::OutputFormat::kJson;
     return replay::replayFiles(options);
 }

@@ -4,10 +4,10 @@
 
 #include <gtest/gtest.h>
 
-#include "replay/LineReader.h"
-#include "replay/TraceLine.h"
+#include "trace/LineReader.h"
+#include "trace/TraceLine.h"
 
-namespace replay {
+namespace trace {
 namespace {
 
 /** What is wrong with a line of `trace` that changes the display by `json`; empty if nothing is. */
@@ -53,4 +53,4 @@ TEST(DisplayLineTest, WhatIsWrongIsNamed) {
 }
 
 }  // namespace
-}  // namespace replay
+}  // namespace trace

@@ -6,14 +6,14 @@
 #include <utility>
 
 #include "platform/Telemetry.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
 
 constexpr char kRecord[] = "persist.zuno.flow.detect.count";
 
-class FlowingDataExceptionTest : public LibraryTest {
+class FlowingDataExceptionTest : public DeviceTest {
 protected:
     void load(const std::string& record) {
         setProperty(kRecord, record);

@@ -3,7 +3,7 @@
 #include <regex>
 #include <sstream>
 
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
@@ -12,7 +12,7 @@ const char* const kProperties[] = {"persist.sys.fc_oriut",    "persist.sys.uc_or
                                    "persist.sys.oc_oriut",    "persist.sys.sc_oriut",
                                    "persist.sys.total_oriut", "persist.sys.ds_oriut"};
 
-class MagneticUseIfTest : public LibraryTest {
+class MagneticUseIfTest : public DeviceTest {
 protected:
     /**
      * Plays pairs of a time and what the host does then: "10 +a" enables, "20 -a" disables for

@@ -6,11 +6,11 @@
 
 #include <cutils/properties.h>
 
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace {
 
-class PropertyServiceTest : public LibraryTest {
+class PropertyServiceTest : public DeviceTest {
 protected:
     ~PropertyServiceTest() override { std::filesystem::remove_all(mFolder); }
 

@@ -3,7 +3,7 @@
 #include <json/json.h>
 
 #include "core/SDCImpl.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 #include "usage/RegisterConnectionList.h"
 
 namespace android {
@@ -13,7 +13,7 @@ namespace {
 constexpr double kStartMs = 1000;
 
 /** Drives one list, with times in seconds. Connections are named "PKG/PKG" by one name. */
-class RegisterConnectionListTest : public LibraryTest {
+class RegisterConnectionListTest : public DeviceTest {
 protected:
     void enable(double second, const std::string& pkg, long long rate) {
         advanceTo(kStartMs + second * 1000);
@@ -126,7 +126,7 @@ TEST_F(RegisterConnectionListTest, TheResetKeepsTheCurrentRateThatNobodyHolds) {
 }
 
 /** The facade's routes to the registrations and the sample count. */
-class SDCImplTest : public LibraryTest {
+class SDCImplTest : public DeviceTest {
 protected:
     void connect(double second, bool enabled, int type, const char* pkg) {
         advanceTo(kStartMs + second * 1000);

@@ -7,12 +7,12 @@
 
 #include "core/Log.h"
 #include "rgb/LightSensorState.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
 
-class RgbShotManagerTest : public LibraryTest {
+class RgbShotManagerTest : public DeviceTest {
 protected:
     /** `policy` allows samples. */
     RgbShotManagerTest() { policy = 1; }

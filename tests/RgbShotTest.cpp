@@ -1,13 +1,13 @@
 #include "rgb/RgbShot.h"
 
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
 
 constexpr char kCount[] = "persist.zuno.rgb.shot.count";
 
-class RgbShotTest : public LibraryTest {
+class RgbShotTest : public DeviceTest {
 protected:
     void sampleAt(double ms) {
         advanceTo(ms);

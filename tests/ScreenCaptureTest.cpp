@@ -11,7 +11,7 @@
 #include "platform/Display.h"
 #include "rgb/RgbShotManager.h"
 #include "rgb/SyncScreenCaptureListener.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
@@ -57,7 +57,7 @@ Rgb averageOf(const Picture& picture, const Rectangle& rect) {
             static_cast<int>(sums[2] / count)};
 }
 
-class ScreenCaptureTest : public LibraryTest {
+class ScreenCaptureTest : public DeviceTest {
 protected:
     /** Leaves the lines of the start behind. */
     ScreenCaptureTest() {

@@ -4,7 +4,7 @@
 #include <utility>
 
 #include "replay/VirtualClock.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
@@ -24,7 +24,7 @@ private:
     Lines* const mLines;
 };
 
-class SensorHandlerThreadTest : public LibraryTest {
+class SensorHandlerThreadTest : public DeviceTest {
 protected:
     SensorHandlerThread* const mThread = SensorHandlerThread::getInstance();
     Lines mLines;

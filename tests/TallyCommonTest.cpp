@@ -6,7 +6,7 @@
 #include <unistd.h>
 
 #include "platform/PropertyService.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace {
 
@@ -26,7 +26,7 @@ extern "C" int usleep(useconds_t us) {
 namespace android {
 namespace {
 
-class TallyCommonTest : public LibraryTest {
+class TallyCommonTest : public DeviceTest {
 protected:
     TallyCommon* const mTally = TallyCommon::getInstance();
 };

@@ -6,7 +6,7 @@
 #include <utility>
 
 #include "core/Log.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
@@ -15,7 +15,7 @@ enum : int { RX_CLOSED = 2, ENABLED, DEVICE_INVALID, ROUTE_INVALID, PHONE_STATE 
 
 constexpr char kInCall[] = "com.android.incallui";
 
-class UltraExceptionTest : public LibraryTest {
+class UltraExceptionTest : public DeviceTest {
 protected:
     /** The module with its counts loaded, at 2000 ms. */
     UltraException* loaded() {

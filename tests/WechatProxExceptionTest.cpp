@@ -5,14 +5,14 @@
 #include <sstream>
 
 #include "core/Arithmetic.h"
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 namespace android {
 namespace {
 
 constexpr char kRecord[] = "persist.zuno.wechat.count.info";
 
-class WechatProxExceptionTest : public LibraryTest {
+class WechatProxExceptionTest : public DeviceTest {
 protected:
     /**
      * Plays pairs of a time in milliseconds and what the host does then: "+" and "-" begin and end

@@ -1,4 +1,4 @@
-#include "replay/CaptureImport.h"
+#include "capture/CaptureImport.h"
 
 #include <algorithm>
 #include <charconv>
@@ -6,9 +6,9 @@
 #include <map>
 #include <optional>
 
-#include "replay/Output.h"
+#include "trace/JsonText.h"
 
-namespace replay {
+namespace capture {
 
 namespace {
 
@@ -227,11 +227,11 @@ public:
     void registration(int64_t at, const Registration& registration, int type) {
         ticksUpTo(at);
         const bool system = registration.uid == kSystemUid;
-        const std::string package = toJson(registration.package);
+        const std::string package = trace::toJson(registration.package);
         const int64_t rate = registration.on ? registration.periodUs * 1000 : 0;
         call(at, "SDCImpl.enableSuccess",
              std::string(registration.on ? "true" : "false") + ", " + std::to_string(type) + ", " +
-                     package + ", " + (system ? toJson("android") : package) + ", " +
+                     package + ", " + (system ? trace::toJson("android") : package) + ", " +
                      std::to_string(rate));
     }
 
@@ -316,7 +316,7 @@ void writeTrace(const std::string& name, const CaptureReader& capture, ImportedC
 }  // namespace
 
 ImportedCapture importCapture(const std::string& name, std::string_view firstLine,
-                              LineReader* reader) {
+                              trace::LineReader* reader) {
     ImportedCapture result;
     CaptureReader capture;
     const int64_t firstNumber = reader->lineNumber();
@@ -336,4 +336,4 @@ ImportedCapture importCapture(const std::string& name, std::string_view firstLin
     return result;
 }
 
-}  // namespace replay
+}  // namespace capture

@@ -1,18 +1,11 @@
 #pragma once
 
-#include <cstdint>
 #include <string>
 #include <string_view>
 
-namespace replay {
+namespace report {
 
 enum class OutputFormat { kJson, kText };
-
-/** `text` as a JSON string, in ASCII; bytes that are not UTF-8 become U+FFFD. */
-std::string toJson(std::string_view text);
-
-/** The time `ns` in milliseconds, in decimal, with as many decimals as it needs. */
-std::string formatMs(int64_t ns);
 
 /**
  * Writes what happened on standard output, a line each, stamped with the virtual clock. Lines are
@@ -40,4 +33,4 @@ private:
     std::string mGathered;
 };
 
-}  // namespace replay
+}  // namespace report

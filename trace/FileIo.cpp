@@ -1,10 +1,10 @@
-#include "replay/FileIo.h"
+#include "trace/FileIo.h"
 
 #include <cerrno>
 
 #include <unistd.h>
 
-namespace replay {
+namespace trace {
 
 bool writeAll(int fd, const void* data, size_t size) {
     const char* next = static_cast<const char*>(data);
@@ -29,4 +29,4 @@ std::vector<unsigned char> readAll(int fd) {
     }
 }
 
-}  // namespace replay
+}  // namespace trace

@@ -5,7 +5,7 @@
 
 #include <gtest/gtest.h>
 
-/** What the library did, a line each: see `LibraryTest::taken`. */
+/** What the library did, a line each: see `DeviceTest::taken`. */
 using Lines = std::vector<std::string>;
 
 /**
@@ -13,9 +13,9 @@ using Lines = std::vector<std::string>;
  * process of its own, which CTest gives it. What the test calls holds the worker thread; it runs in
  * `advanceTo`.
  */
-class LibraryTest : public ::testing::Test {
+class DeviceTest : public ::testing::Test {
 protected:
-    LibraryTest();
+    DeviceTest();
 
     /** Lets time pass up to `ms` milliseconds, and all run that is due until then. */
     void advanceTo(double ms);

@@ -1,4 +1,4 @@
-#include "replay/LineReader.h"
+#include "trace/LineReader.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -7,7 +7,7 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-namespace replay {
+namespace trace {
 
 namespace {
 
@@ -82,4 +82,4 @@ bool LineReader::fill() {
     return true;
 }
 
-}  // namespace replay
+}  // namespace trace

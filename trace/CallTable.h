@@ -20,11 +20,11 @@
 #include "rgb/RgbShotManager.h"
 
 /**
- * The library as a trace sees it: calls and variables by their place in library.inc. The tool
+ * The library as a trace sees it: calls and variables by their place in calls.inc. The tool
  * itself is not linked with the library; it loads it when a process first needs it, so that the
  * library's static initialisers run then.
  */
-namespace replay {
+namespace trace {
 
 using IntList = std::vector<int32_t>;
 using Rectangle = std::array<int32_t, 4>;  // left, top, right, bottom
@@ -68,7 +68,7 @@ struct ArgumentsOf<Result (*)()> {
 };
 
 /** The loaded library. */
-struct Library {
+struct Calls {
     /** Makes call `index`; returns its result as JSON, if it has one. */
     std::optional<std::string> (*call)(size_t index, const std::vector<Argument>& arguments);
 
@@ -76,7 +76,7 @@ struct Library {
     void (*set)(size_t index, int32_t value);
 };
 
-/** The one name that the loaded module is asked for: a function that returns `const Library*`. */
-inline constexpr char kLibraryEntry[] = "sensor_replay_library";
+/** The one name that the loaded module is asked for: a function that returns `const Calls*`. */
+inline constexpr char kCallsEntry[] = "sensor_replay_calls";
 
-}  // namespace replay
+}  // namespace trace

@@ -11,9 +11,9 @@
 #include <simdjson.h>
 
 #include "platform/Display.h"
-#include "replay/Library.h"
+#include "trace/CallTable.h"
 
-namespace replay {
+namespace trace {
 
 enum class BootKind { kDevice, kProcess };
 
@@ -24,11 +24,11 @@ struct TraceLine {
     int64_t at = 0;  // nanoseconds of the monotonic clock
     Action action = Action::kNone;
 
-    // kCall: an index into library.inc, and what it takes
+    // kCall: an index into calls.inc, and what it takes
     size_t call = 0;
     std::vector<Argument> arguments;
 
-    // kSet: indices into library.inc
+    // kSet: indices into calls.inc
     std::vector<std::pair<size_t, int32_t>> variables;
 
     // kProperty: no value deletes
@@ -63,4 +63,4 @@ private:
 /** Whether a line is blank or a comment. */
 bool isSkipped(std::string_view text);
 
-}  // namespace replay
+}  // namespace trace

@@ -1,21 +1,25 @@
-#include "replay/Output.h"
+#include "report/Output.h"
 
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
 
-#include <json/json.h>
 #include <unistd.h>
 
-#include "replay/FileIo.h"
 #include "replay/VirtualClock.h"
+#include "trace/FileIo.h"
+#include "trace/JsonText.h"
+#include "trace/TraceTime.h"
 
-namespace replay {
+namespace report {
+
+using trace::formatMs;
+using trace::kNsPerMs;
+using trace::toJson;
 
 namespace {
 
 constexpr size_t kFlushSize = size_t{64} << 10;
-constexpr int64_t kNsPerMs = 1'000'000;
 
 /** The clock as a person reads it: the day since the boot and the time of that day. */
 std::string formatClock(int64_t ns) {
@@ -52,19 +56,6 @@ char levelLetter(int level) {
 }
 
 }  // namespace
-
-std::string toJson(std::string_view text) {
-    return Json::valueToQuotedString(std::string(text).c_str());
-}
-
-std::string formatMs(int64_t ns) {
-    std::string text = std::to_string(ns / kNsPerMs);
-    if (int64_t rest = ns % kNsPerMs; rest != 0) {
-        const std::string decimals = std::to_string(kNsPerMs + rest).substr(1);
-        text += '.' + decimals.substr(0, decimals.find_last_not_of('0') + 1);
-    }
-    return text;
-}
 
 void Output::boot(std::string_view kind) {
     line(R"("boot": )" + toJson(kind), "boot", kind);
@@ -105,11 +96,11 @@ void Output::line(std::string_view json, std::string_view kind, std::string_view
 }
 
 void Output::flush() {
-    if (!writeAll(STDOUT_FILENO, mGathered.data(), mGathered.size())) {
+    if (!trace::writeAll(STDOUT_FILENO, mGathered.data(), mGathered.size())) {
         std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
         _exit(1);
     }
     mGathered.clear();
 }
 
-}  // namespace replay
+}  // namespace report

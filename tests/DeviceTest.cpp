@@ -1,4 +1,4 @@
-#include "tests/LibraryTest.h"
+#include "tests/DeviceTest.h"
 
 #include <sstream>
 #include <utility>
@@ -28,7 +28,7 @@ void note(const Parts&... parts) {
 
 }  // namespace
 
-LibraryTest::LibraryTest() {
+DeviceTest::DeviceTest() {
     __android_log_set_minimum_priority(ANDROID_LOG_VERBOSE);
     __android_log_set_logger([](const __android_logger_data* data, const char* text) {
         note("log ", data->priority, ' ', text);
@@ -41,19 +41,19 @@ LibraryTest::LibraryTest() {
             [](const char* name, const char* value) { note(name, '=', value); });
 }
 
-void LibraryTest::advanceTo(double ms) {
+void DeviceTest::advanceTo(double ms) {
     virtual_clock::advanceTo(static_cast<int64_t>(ms * 1e6));
 }
 
-Lines LibraryTest::taken() {
+Lines DeviceTest::taken() {
     return std::exchange(transcript(), {});
 }
 
-void LibraryTest::setProperty(const std::string& name, const std::string& value) {
+void DeviceTest::setProperty(const std::string& name, const std::string& value) {
     platform::setDeviceProperty(name, value);
 }
 
-std::string LibraryTest::property(const std::string& name) {
+std::string DeviceTest::property(const std::string& name) {
     char value[PROP_VALUE_MAX];
     property_get(name.c_str(), value, "");
     return value;

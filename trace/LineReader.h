@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-namespace replay {
+namespace trace {
 
 /**
  * Reads a file, or a pipe, line by line and in blocks, in constant memory. Its state lives in
@@ -61,4 +61,4 @@ private:
     std::optional<std::string> mError;
 };
 
-}  // namespace replay
+}  // namespace trace

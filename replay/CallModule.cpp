@@ -1,9 +1,15 @@
-#include "replay/Library.h"
+#include "trace/CallTable.h"
 
 #include <type_traits>
 #include <utility>
 
 namespace replay {
+
+using trace::Argument;
+using trace::ArgumentFor;
+using trace::ArgumentsOf;
+using trace::Calls;
+using trace::Rectangle;
 
 namespace {
 
@@ -72,7 +78,7 @@ std::optional<std::string> callByIndex(size_t index, const std::vector<Argument>
     constexpr std::optional<std::string> (*kCalls[])(const std::vector<Argument>&) = {
 #define CALL(Class, operation) call<&android::Class::operation>,
 #define VARIABLE(name)
-#include "replay/library.inc"
+#include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE
     };
@@ -83,7 +89,7 @@ void setByIndex(size_t index, int32_t value) {
     constexpr void (*kSetters[])(int32_t) = {
 #define CALL(Class, operation)
 #define VARIABLE(name) [](int32_t number) { ::name = static_cast<decltype(::name)>(number); },
-#include "replay/library.inc"
+#include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE
     };
@@ -92,9 +98,9 @@ void setByIndex(size_t index, int32_t value) {
 
 }  // namespace
 
-extern "C" const Library* sensor_replay_library() {
-    static constexpr Library kLibrary{callByIndex, setByIndex};
-    return &kLibrary;
+extern "C" const Calls* sensor_replay_calls() {
+    static constexpr Calls kCalls{callByIndex, setByIndex};
+    return &kCalls;
 }
 
 }  // namespace replay

@@ -1,4 +1,4 @@
-#include "replay/TraceLine.h"
+#include "trace/TraceLine.h"
 
 #include <algorithm>
 #include <array>
@@ -9,10 +9,11 @@
 #include <type_traits>
 
 #include "platform/PropertyService.h"
-#include "replay/LineReader.h"
-#include "replay/Output.h"
+#include "trace/JsonText.h"
+#include "trace/LineReader.h"
+#include "trace/TraceTime.h"
 
-namespace replay {
+namespace trace {
 
 namespace {
 
@@ -23,7 +24,6 @@ using Error = std::optional<std::string>;
 
 /** 285 years; the clock and every wait that the Looper can ask for still fit 63 bits. */
 constexpr int64_t kMaxTimeMs = 9'000'000'000'000;
-constexpr int64_t kNsPerMs = 1'000'000;
 constexpr int64_t kDecimals = 6;    // of a millisecond
 constexpr int64_t kMaxDigits = 19;  // of a time in nanoseconds
 
@@ -172,7 +172,7 @@ constexpr Call kCalls[] = {
 #define CALL(Class, operation) \
     describeCall<decltype(&android::Class::operation)>(#Class "." #operation),
 #define VARIABLE(name)
-#include "replay/library.inc"
+#include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE
 };
@@ -180,7 +180,7 @@ constexpr Call kCalls[] = {
 constexpr Variable kVariables[] = {
 #define CALL(Class, operation)
 #define VARIABLE(name) {#name, readVariable<decltype(::name)>},
-#include "replay/library.inc"
+#include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE
 };
@@ -474,4 +474,4 @@ bool isSkipped(std::string_view text) {
     return first == std::string_view::npos || text[first] == '#';
 }
 
-}  // namespace replay
+}  // namespace trace

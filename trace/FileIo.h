@@ -3,7 +3,7 @@
 #include <cstddef>
 #include <vector>
 
-namespace replay {
+namespace trace {
 
 /** Writes all of it; false, with `errno`, if that fails. */
 bool writeAll(int fd, const void* data, size_t size);
@@ -11,4 +11,4 @@ bool writeAll(int fd, const void* data, size_t size);
 /** What can be read up to the end, or up to an error. */
 std::vector<unsigned char> readAll(int fd);
 
-}  // namespace replay
+}  // namespace trace

@@ -4,9 +4,9 @@
 #include <string_view>
 #include <vector>
 
-#include "replay/LineReader.h"
+#include "trace/LineReader.h"
 
-namespace replay {
+namespace capture {
 
 /** What became of a device capture. */
 struct ImportedCapture {
@@ -25,6 +25,6 @@ struct ImportedCapture {
  * between them; it ends after the last day's reports.
  */
 ImportedCapture importCapture(const std::string& name, std::string_view firstLine,
-                              LineReader* reader);
+                              trace::LineReader* reader);
 
-}  // namespace replay
+}  // namespace capture
