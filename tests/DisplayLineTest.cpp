@@ -19,8 +19,7 @@ std::string judge(const std::string& json, const std::string& trace, TraceLine* 
 }
 
 TEST(DisplayLineTest, APictureIsFoundBesideItsTrace) {
-    const std::string example =
-            std::filesystem::path(__FILE__).parent_path() / "../examples/x.jsonl";
+    const std::string example = std::filesystem::path(EXAMPLES) / "x.jsonl";
     TraceLine line;
     EXPECT_EQ(judge(R"({"png": "home-screen.png"})", example, &line), "");
     EXPECT_EQ(line.display.picture->width, 540u);
