@@ -14,7 +14,7 @@
 #include "platform/Telemetry.h"
 #include "trace/CallTable.h"
 
-extern "C" const trace::Calls* sensor_replay_calls();
+extern "C" const trace::CallModule* sensor_replay_calls();
 
 namespace trace {
 namespace {
@@ -74,7 +74,7 @@ constexpr std::vector<Argument> (*kArguments[])(Random&) = {
 
 void run(unsigned seed, int calls) {
     Random random(seed);
-    const Calls* library = sensor_replay_calls();
+    const CallModule* library = sensor_replay_calls();
     for (int i = 0; i < calls; ++i) {
         const size_t index = random() % std::size(kArguments);
         library->call(index, kArguments[index](random));

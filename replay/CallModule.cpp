@@ -8,7 +8,7 @@ namespace replay {
 using trace::Argument;
 using trace::ArgumentFor;
 using trace::ArgumentsOf;
-using trace::Calls;
+using trace::CallModule;
 using trace::Rectangle;
 
 namespace {
@@ -98,9 +98,9 @@ void setByIndex(size_t index, int32_t value) {
 
 }  // namespace
 
-extern "C" const Calls* sensor_replay_calls() {
-    static constexpr Calls kCalls{callByIndex, setByIndex};
-    return &kCalls;
+extern "C" const CallModule* sensor_replay_calls() {
+    static constexpr CallModule kModule{callByIndex, setByIndex};
+    return &kModule;
 }
 
 }  // namespace replay

@@ -1,6 +1,8 @@
 #include "replay/Player.h"
 
+#include <array>
 #include <cstring>
+#include <string_view>
 
 #include <android/log.h>
 #include <dlfcn.h>
@@ -13,60 +15,69 @@
 
 namespace replay {
 
+using report::Record;
+using trace::BootKind;
+using trace::Failure;
+
 namespace {
 
 /** For the observers of the platform, which are plain functions or know no context. */
-report::Output* gOutput = nullptr;
+report::RecordWriter* gRecords = nullptr;
+
+void record(Record::Kind kind, std::array<std::string_view, 3> texts, int64_t number = 0) {
+    gRecords->add({kind, virtual_clock::now(), number, texts});
+}
 
 /** The platform's own libraries log too; only the library's lines are shown. */
 void takeLogLine(const __android_logger_data* data, const char* message) {
     if (std::strcmp(data->tag, SENSOR_PRIV_LOG_TAG) == 0) {
-        gOutput->log(data->priority, data->tag, message);
+        record(Record::Kind::kLog, {data->tag, message}, data->priority);
     } else {
         __android_log_stderr_logger(data, message);
     }
 }
 
-void observePlatform(report::Output* output) {
-    gOutput = output;
+void observePlatform(report::RecordWriter* records) {
+    gRecords = records;
     __android_log_set_logger(takeLogLine);
     __android_log_set_minimum_priority(ANDROID_LOG_VERBOSE);
     platform::observeEvents([](const char* module, const char* id, const char* payload) {
-        gOutput->event(module, id, payload);
+        record(Record::Kind::kEvent, {module, id, payload});
     });
-    platform::observePropertySet(
-            [](const char* name, const char* value) { gOutput->property(name, value); });
+    platform::observePropertySet([](const char* name, const char* value) {
+        record(Record::Kind::kProperty, {name, value});
+    });
 }
 
 /** Loads the library, which runs its static initialisers. Null if that fails. */
-const trace::Calls* loadCalls() {
+const trace::CallModule* loadCallModule() {
     void* module = dlopen(SENSOR_REPLAY_CALLS, RTLD_NOW | RTLD_LOCAL);
     if (module == nullptr) return nullptr;
-    const auto entry =
-            reinterpret_cast<const trace::Calls* (*)()>(dlsym(module, trace::kCallsEntry));
+    const auto entry = reinterpret_cast<const trace::CallModule* (*)()>(
+            dlsym(module, trace::kCallModuleEntry));
     return entry == nullptr ? nullptr : entry();
 }
 
 /** One process's part of a replay. */
 class Player {
 public:
-    Player(const std::string& name, trace::LineReader* reader, report::Output* output,
-           std::optional<Failure>* failure)
-          : mName(name),
-            mReader(reader),
-            mOutput(output),
+    Player(const Channels& channels, std::optional<Failure>* failure)
+          : mChannels(channels),
+            mReader(channels.reader),
             mFailure(failure) {}
 
     NextBoot play(const Boot& boot, const trace::TraceLine* first) {
-        observePlatform(mOutput);
+        observePlatform(mChannels.records);
         virtual_clock::set(boot.at);
-        if (boot.kind == trace::BootKind::kDevice) platform::dropVolatileProperties();
-        mOutput->boot(boot.kind == trace::BootKind::kDevice ? "device" : "process");
+        mLastAt = boot.at;
+        if (boot.kind == BootKind::kDevice) platform::dropVolatileProperties();
+        record(Record::Kind::kBoot, {bootName(boot.kind)});
         if (first != nullptr) mLine = *first;
         if (first != nullptr || readNext()) {
             do {
-                if (mLine.action == trace::TraceLine::Action::kBoot) return endByBoot();
-                if (mLine.at > virtual_clock::now()) virtual_clock::advanceTo(mLine.at);
+                if (const auto* kind = std::get_if<BootKind>(&mLine.action)) {
+                    return endByBoot(*kind);
+                }
                 if (!carryOut()) return {};
             } while (readNext());
         }
@@ -76,99 +87,102 @@ public:
 
 private:
     bool readNext() {
-        if (!mReader->hasLine()) mOutput->flush();
-        if (!readLine(mName, mReader, &mParser, &mLine, mFailure)) return false;
-        const bool newClock = mLine.action == trace::TraceLine::Action::kBoot &&
-                              mLine.boot == trace::BootKind::kDevice;
-        if (mLine.at < virtual_clock::now() && !newClock) {
-            *mFailure = Failure{mName + ':' + std::to_string(mReader->lineNumber()) +
-                                        R"(: "at" goes back, from )" +
-                                        trace::formatMs(virtual_clock::now()) + " to " +
-                                        trace::formatMs(mLine.at),
-                                kStatusBadInput};
+        if (!mReader->hasLine()) mChannels.records->flush();
+        if (!mReader->next(&mLine, mFailure)) return false;
+        const auto* boot = std::get_if<BootKind>(&mLine.action);
+        const bool newClock = boot != nullptr && *boot == BootKind::kDevice;
+        if (mLine.at < mLastAt && !newClock) {
+            *mFailure = Failure{trace::at(mReader->name(), mReader->lineNumber()) +
+                                R"("at" goes back, from )" + trace::formatMs(mLastAt) + " to " +
+                                trace::formatMs(mLine.at)};
             return false;
+        }
+        mLastAt = mLine.at;
+        return true;
+    }
+
+    NextBoot endByBoot(BootKind kind) {
+        // The new clock's times say nothing about the old one: only its present moment runs out.
+        // A process boot comes in the middle of a moment; what that has posted is lost.
+        if (kind == BootKind::kDevice) {
+            virtual_clock::settle();
+        } else {
+            passTime();
+        }
+        return Boot{kind, mLine.at};
+    }
+
+    void passTime() {
+        if (mLine.at > virtual_clock::now()) virtual_clock::advanceTo(mLine.at);
+    }
+
+    bool carryOut() {
+        if (const auto* expectation = std::get_if<trace::Expectation>(&mLine.action)) {
+            // Time does not pass: the line tells of a device whose worker may have been late.
+            mChannels.records->add(
+                    {Record::Kind::kExpect, mLine.at, mReader->lineNumber(), {expectation->entry}});
+            return true;
+        }
+        passTime();
+        if (const auto* call = std::get_if<trace::Call>(&mLine.action)) return make(*call);
+        if (const auto* variables = std::get_if<trace::VariableWrites>(&mLine.action)) {
+            return write(*variables);
+        }
+        if (const auto* properties = std::get_if<trace::PropertyWrites>(&mLine.action)) {
+            for (const auto& [name, value] : properties->writes) {
+                platform::setDeviceProperty(name, value);
+            }
+        } else if (const auto* display = std::get_if<platform::DisplayChange>(&mLine.action)) {
+            platform::changeDisplay(*display);
         }
         return true;
     }
 
-    NextBoot endByBoot() {
-        // The new clock's times say nothing about the old one: only its present moment runs out.
-        // A process boot comes in the middle of a moment; what that has posted is lost.
-        if (mLine.boot == trace::BootKind::kDevice) {
-            virtual_clock::settle();
-        } else if (mLine.at > virtual_clock::now()) {
-            virtual_clock::advanceTo(mLine.at);
+    bool make(const trace::Call& call) {
+        if (!load()) return false;
+        const std::string_view name = trace::callName(call.index);
+        if (mChannels.recordsCalls)
+            record(Record::Kind::kCall, {mReader->text()}, mReader->lineNumber());
+        if (const auto result = mModule->call(call.index, call.arguments)) {
+            record(Record::Kind::kResult, {name, *result});
         }
-        return Boot{mLine.boot, mLine.at};
+        return true;
     }
 
-    bool carryOut() {
-        switch (mLine.action) {
-            case trace::TraceLine::Action::kCall:
-                if (!load()) return false;
-                if (const auto result = mCalls->call(mLine.call, mLine.arguments)) {
-                    mOutput->result(trace::callName(mLine.call), *result);
-                }
-                break;
-            case trace::TraceLine::Action::kSet:
-                if (!load()) return false;
-                for (const auto& [index, value] : mLine.variables) mCalls->set(index, value);
-                break;
-            case trace::TraceLine::Action::kProperty:
-                for (const auto& [name, value] : mLine.properties) {
-                    platform::setDeviceProperty(name, value);
-                }
-                break;
-            case trace::TraceLine::Action::kDisplay:
-                platform::changeDisplay(mLine.display);
-                break;
-            case trace::TraceLine::Action::kNone:
-            case trace::TraceLine::Action::kBoot:
-                break;
-        }
+    bool write(const trace::VariableWrites& variables) {
+        if (!load()) return false;
+        for (const auto& [index, value] : variables.writes) mModule->set(index, value);
         return true;
     }
 
     /** Properties that were set before the first call are in force when the library starts. */
     bool load() {
-        if (mCalls == nullptr) mCalls = loadCalls();
-        if (mCalls == nullptr) {
-            *mFailure =
-                    Failure{std::string("cannot load the library: ") + dlerror(), kStatusFailed};
+        if (mModule == nullptr) mModule = loadCallModule();
+        if (mModule == nullptr) {
+            *mFailure = Failure{std::string("cannot load the library: ") + dlerror(),
+                                trace::kStatusFailed};
         }
-        return mCalls != nullptr;
+        return mModule != nullptr;
     }
 
-    const std::string& mName;
-    trace::LineReader* const mReader;
-    report::Output* const mOutput;
+    const Channels& mChannels;
+    trace::TraceReader* const mReader;
     std::optional<Failure>* const mFailure;
 
-    trace::TraceParser mParser;
     trace::TraceLine mLine;
-    const trace::Calls* mCalls = nullptr;
+    int64_t mLastAt = 0;  // of the line before; expectations do not move the clock
+    const trace::CallModule* mModule = nullptr;
 };
 
 }  // namespace
 
-bool readLine(const std::string& name, trace::LineReader* reader, trace::TraceParser* parser,
-              trace::TraceLine* line, std::optional<Failure>* failure) {
-    const auto fail = [&](const std::string& what) {
-        *failure = Failure{name + ':' + std::to_string(reader->lineNumber()) + ": " + what,
-                           kStatusBadInput};
-        return false;
-    };
-    while (const auto text = reader->next()) {
-        if (trace::isSkipped(*text)) continue;
-        if (const auto error = parser->parse(*text, name, line)) return fail(*error);
-        return true;
-    }
-    return reader->error() ? fail(*reader->error()) : false;
+const char* bootName(BootKind kind) {
+    return kind == BootKind::kDevice ? "device" : "process";
 }
 
-NextBoot play(const Boot& boot, const trace::TraceLine* first, const std::string& name,
-              trace::LineReader* reader, report::Output* output, std::optional<Failure>* failure) {
-    return Player(name, reader, output, failure).play(boot, first);
+NextBoot play(const Boot& boot, const trace::TraceLine* first, const Channels& channels,
+              std::optional<Failure>* failure) {
+    return Player(channels, failure).play(boot, first);
 }
 
 }  // namespace replay

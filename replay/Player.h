@@ -1,11 +1,12 @@
 #pragma once
 
+#include <cstdint>
 #include <optional>
-#include <string>
 
-#include "report/Output.h"
-#include "trace/LineReader.h"
+#include "report/Record.h"
+#include "trace/Failure.h"
 #include "trace/TraceLine.h"
+#include "trace/TraceReader.h"
 
 namespace replay {
 
@@ -18,28 +19,22 @@ struct Boot {
 /** Why a process ended: by a boot line, or because the input was over. */
 using NextBoot = std::optional<Boot>;
 
-/** A line that the tool will not carry out, or a tool that cannot go on. */
-struct Failure {
-    std::string text;  // one line for standard error
-    int status;        // of the exit
+/** "device" or "process". */
+const char* bootName(trace::BootKind kind);
+
+/** Where a player reads and writes. */
+struct Channels {
+    trace::TraceReader* reader;
+    report::RecordWriter* records;
+    bool recordsCalls;  // make a record of each call as well
 };
-
-inline constexpr int kStatusFailed = 1;
-inline constexpr int kStatusBadInput = 2;
-
-/**
- * The next line of `reader` that is neither blank nor a comment, judged into `*line`; false at the
- * end. `name` is the file's name. On a failure, `*failure` says what is wrong.
- */
-bool readLine(const std::string& name, trace::LineReader* reader, trace::TraceParser* parser,
-              trace::TraceLine* line, std::optional<Failure>* failure);
 
 /**
  * Plays one boot of the library in this process, which must be a fresh one: starts the clock as
- * `boot` says, carries out `first`, if there is one, and then the lines of `reader` up to the next
- * boot line. On a failure, `*failure` is set and nothing more has run.
+ * `boot` says, carries out `first`, if there is one, and then the lines up to the next boot line.
+ * On a failure, `*failure` is set and nothing more has run.
  */
-NextBoot play(const Boot& boot, const trace::TraceLine* first, const std::string& name,
-              trace::LineReader* reader, report::Output* output, std::optional<Failure>* failure);
+NextBoot play(const Boot& boot, const trace::TraceLine* first, const Channels& channels,
+              std::optional<trace::Failure>* failure);
 
 }  // namespace replay

@@ -1,23 +1,14 @@
 #pragma once
 
-#include <optional>
-#include <string>
-#include <vector>
-
-#include "report/Output.h"
+#include "replay/Options.h"
 
 namespace replay {
 
-struct Options {
-    report::OutputFormat format = report::OutputFormat::kText;
-    bool printTrace = false;                // print the trace made from a capture, play nothing
-    std::optional<std::string> properties;  // the file that keeps them; in memory without
-    std::vector<std::string> files;         // "-" is standard input
-};
-
 /**
- * Plays `options.files` one after another, each from a device boot on, and each boot in a process
- * of its own. Returns the exit status; what is wrong has been said on standard error.
+ * Plays `options.files`. The output is that of one after another. Captures are devices of their own
+ * and may be played at once; traces are the days of one device, as if a device boot joined them.
+ * With a property file, all are days of the device whose properties it keeps. The first file that
+ * is wrong ends the run. Returns the exit status; what is wrong has been said on standard error.
  */
 int replayFiles(const Options& options);
 

@@ -1,9 +1,12 @@
+#include <algorithm>
 #include <iostream>
+#include <thread>
 
 #include <CLI/CLI.hpp>
 
-#include "replay/Player.h"
 #include "replay/Replay.h"
+#include "trace/CallTable.h"
+#include "trace/Failure.h"
 
 namespace {
 
@@ -25,28 +28,41 @@ by its content.
 constexpr char kStatuses[] = R"(Exit status:
   0  everything was played
   1  the tool or the library failed
-  2  an argument, a line, a capture or the property file is wrong; what came before it is done)";
+  2  an argument, a line, a capture or the property file is wrong; what came before it is done
+  3  --check: the replay differs from what the trace expects)";
 
 }  // namespace
 
 int main(int argc, char** argv) {
     replay::Options options;
-    bool json = false;
+    options.jobs = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     CLI::App app(kExamples, "sensor-replay");
     app.footer(kStatuses);
-    app.add_flag("--json", json, "print JSON Lines");
-    app.add_flag("--print-trace", options.printTrace,
-                 "print the trace made from a capture instead of playing it");
+    auto* json = app.add_flag("--json", options.json, "print JSON Lines");
+    auto* printTrace = app.add_flag("--print-trace", options.printTrace,
+                                    "print the trace made from a capture instead of playing it");
+    app.add_flag("--check", options.check,
+                 R"(compare what the library does with the trace's "expect" lines)")
+            ->excludes(json)
+            ->excludes(printTrace);
+    app.add_option("--jobs", options.jobs, "captures that are played at once (default: all cores)")
+            ->type_name("N")
+            ->check(CLI::PositiveNumber);
     app.add_option("--properties", options.properties,
                    "keep the system properties in FILE (made if missing)")
             ->type_name("FILE");
-    app.add_option("FILE", options.files, "traces and captures; - is standard input")->required();
+    bool listCalls = false;
+    app.add_flag("--list-calls", listCalls, "list the calls that a trace can make, and exit");
+    app.add_option("FILE", options.files, "traces and captures; - is standard input");
     try {
         app.parse(argc, argv);
+        if (options.files.empty() && !listCalls) throw CLI::RequiredError("FILE");
     } catch (const CLI::ParseError& error) {
-        const int status = app.exit(error) == 0 ? 0 : replay::kStatusBadInput;
-        return std::cout.flush() ? status : replay::kStatusFailed;
+        const int status = app.exit(error) == 0 ? 0 : trace::kStatusBadInput;
+        return std::cout.flush() ? status : trace::kStatusFailed;
     }
-    if (json) options.format = report::OutputFormat::kJson;
+    if (listCalls) {
+        return std::cout << trace::listCalls() << std::flush ? 0 : trace::kStatusFailed;
+    }
     return replay::replayFiles(options);
 }

@@ -22,7 +22,7 @@ TEST(DisplayLineTest, APictureIsFoundBesideItsTrace) {
     const std::string example = std::filesystem::path(EXAMPLES) / "x.jsonl";
     TraceLine line;
     EXPECT_EQ(judge(R"({"png": "home-screen.png"})", example, &line), "");
-    EXPECT_EQ(line.display.picture->width, 540u);
+    EXPECT_EQ(std::get<platform::DisplayChange>(line.action).picture->width, 540u);
     EXPECT_EQ(judge(R"({"png": "home-screen.png"})", "-", &line),
               R"("png" "home-screen.png": cannot open: No such file or directory)");
     EXPECT_EQ(judge(R"({"png": "home-screen.png", "color": [1, 2, 3]})", example, &line),

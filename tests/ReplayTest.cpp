@@ -1,3 +1,4 @@
+#include <algorithm>
 #include <string>
 #include <utility>
 #include <vector>
@@ -121,14 +122,80 @@ TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
                          R"({"at": 700})"}));
     write("two", "# nothing\n");
     write("three", joined({line("5", R"("call": "SDCImpl.getInstance")"), report("2005")}));
-    const std::string expected = joined(
-            {boot("100", "device"), saved("600", 1), boot("5", "device"), reported("2005", 1)});
+    const auto in = [](const std::string& file, const std::string& each) {
+        return each.substr(0, each.size() - 1) + R"(, "file": ")" + file + "\"}";
+    };
+    const std::string expected =
+            joined({in("one", boot("100", "device")), in("one", saved("600", 1)),
+                    in("three", boot("5", "device")), in("three", reported("2005", 1))});
     EXPECT_EQ(run("--json one two three").out, expected);
     EXPECT_EQ(run("--json one - three", "\n").out, expected);
     EXPECT_EQ(run("--json --properties store one").status, 0);
     EXPECT_EQ(storedIn("store", "sys.x") + storedIn("store", "ro.x"), "12");
     EXPECT_EQ(happened(run("--json --properties store three")), (Lines{reported("2005", 1)}));
     EXPECT_EQ(storedIn("store", "sys.x") + storedIn("store", "ro.x"), "2");
+}
+
+TEST_F(ReplayTest, CapturesAreDevicesOfTheirOwnAndPrintInTheirOrderHoweverManyPlayAtOnce) {
+    const std::string capture = std::string(EXAMPLES) + "/registrations.capture.txt";
+    write("day", joined({sample("0"), R"({"at": 700})"}));
+    write("later", joined({line("0", R"("call": "SDCImpl.getInstance")"), report("2000")}));
+    const std::string files = "day " + capture + ' ' + capture + " later missing " + capture;
+    const Played one = run("--json --jobs 1 " + files);
+    const Played three = run("--json --jobs 3 " + files);
+    EXPECT_EQ(one.out, three.out);
+    EXPECT_EQ(one.err, three.err);
+    EXPECT_EQ(three.status, 2);
+    EXPECT_NE(three.err.find("missing: cannot open"), std::string::npos) << three.err;
+    const std::string alone = run("--json " + capture).out;
+    const size_t lines = static_cast<size_t>(std::count(alone.begin(), alone.end(), '\n'));
+    EXPECT_EQ(happened(three).size(), 2 * (lines - 1) + 2);
+    EXPECT_NE(happened(three).back().find("count:1"), std::string::npos);
+}
+
+TEST_F(ReplayTest, ChecksExpectationsInOrderAndWithoutTheirTimes) {
+    const auto expect = [](const std::string& at, const std::string& output) {
+        return line(at, R"("expect": {)" + output.substr(output.find(", ") + 2));
+    };
+    const std::string event = expect("401", reported("400", 1));
+    const std::string stored = expect("520.5", saved("500", 0));
+    const std::string end = R"({"at": 600})";
+    const struct {
+        Lines expectations;
+        int status;
+        std::string message;
+    } kCases[] = {
+            {{event, stored, end}, 0, ""},
+            {{event, end, expect("600", saved("1", 0))}, 0, ""},
+            {{expect("401", reported("400", 2)), stored, end},
+             3,
+             "trace:3: the replay differs\n"
+             R"(  expected: {"at": 401, "event": {"module": "N273", "id": "N273|10009", )"
+             R"("payload": "count:2"}})"
+             "\n"
+             R"(  replayed: {"at": 400, "event": {"module": "N273", "id": "N273|10009", )"
+             R"("payload": "count:1"}})"
+             "\n"},
+            {{expect("401", saved("500", 0)), event, end}, 3, "trace:3: the replay differs\n"},
+            {{event, end}, 3, "trace: the replay differs\n  expected: nothing more\n"},
+            {{event, stored}, 3, "trace:4: the replay differs\n"},  // time does not pass
+            {{end}, 3, "expected: nothing more\n"},
+            {{event, R"({"at": 500})"}, 3, "expected: nothing more\n"},
+            {{event, expect("400", saved("1", 0))}, 2, R"("at" goes back, from 401 to 400)"},
+            {{event, R"({"at": 401, "expect": {"event": {"module": "N273"}}})"}, 2, "lacks a key"},
+            {{R"({"at": 401, "expect": {"log": {}}})"}, 2, R"(the unknown key "log")"},
+    };
+    for (const auto& [expectations, status, message] : kCases) {
+        Lines trace{sample("0"), report("400")};
+        trace.insert(trace.end(), expectations.begin(), expectations.end());
+        write("trace", joined(trace));
+        const Played played = run("--check trace");
+        EXPECT_EQ(played.status, status) << joined(trace) << played.err;
+        EXPECT_NE(played.err.find(message), std::string::npos) << played.err;
+        EXPECT_EQ(played.out, status == 0 ? "trace: 2 expectations met\n" : "");
+    }
+    write("trace", sample("0") + "\n");
+    EXPECT_EQ(run("--check trace").err, "trace: nothing to check: no \"expect\" lines\n");
 }
 
 TEST_F(ReplayTest, LaysOutLinesForAPerson) {
@@ -152,6 +219,7 @@ TEST_F(ReplayTest, JudgesEachLineAndKeepsWhatWasDoneBeforeABadOne) {
             {R"({"at": 9000000000001})", R"("at" must be)"},
             {R"({"at": 1e-7})", R"("at" must be)"},
             {R"({"at": 1e300})", R"("at" must be)"},
+            {R"({"at": 1e999})", "the number 1e999 is out of range"},
             {R"({"at": 1.5e-99999999999999999999})", R"("at" must be)"},
             {R"({"at": 1, "call": "SDCImpl.process", "args": [{"type": 1, "data": [1,2,3,4,5,6,7,8,9,)"
              R"(10,11,12,13,14,15,16,17]}]})",

@@ -1,9 +1,11 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <tuple>
 #include <variant>
 #include <vector>
@@ -20,9 +22,8 @@
 #include "rgb/RgbShotManager.h"
 
 /**
- * The library as a trace sees it: calls and variables by their place in calls.inc. The tool
- * itself is not linked with the library; it loads it when a process first needs it, so that the
- * library's static initialisers run then.
+ * The library as a trace sees it: the calls and variables of calls.inc by their place there, and
+ * the types that a trace gives for their parameters, taken from the library's declarations.
  */
 namespace trace {
 
@@ -67,8 +68,21 @@ struct ArgumentsOf<Result (*)()> {
     using type = std::tuple<>;
 };
 
-/** The loaded library. */
-struct Calls {
+/** The name of a call, as a trace writes it. */
+std::string_view callName(size_t index);
+
+/** The place of the call or the variable of that name, if there is one. */
+std::optional<size_t> findCall(std::string_view name);
+std::optional<size_t> findVariable(std::string_view name);
+
+/** The known call whose name is the nearest to `name`. */
+std::string_view nearestCall(std::string_view name);
+
+/** All calls, a line each, with the types of their arguments in brackets. */
+std::string listCalls();
+
+/** The entry points of the module that holds the library. */
+struct CallModule {
     /** Makes call `index`; returns its result as JSON, if it has one. */
     std::optional<std::string> (*call)(size_t index, const std::vector<Argument>& arguments);
 
@@ -76,7 +90,7 @@ struct Calls {
     void (*set)(size_t index, int32_t value);
 };
 
-/** The one name that the loaded module is asked for: a function that returns `const Calls*`. */
-inline constexpr char kCallsEntry[] = "sensor_replay_calls";
+/** The one name that the module is asked for: a function that returns `const CallModule*`. */
+inline constexpr char kCallModuleEntry[] = "sensor_replay_calls";
 
 }  // namespace trace

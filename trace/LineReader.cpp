@@ -14,6 +14,9 @@ namespace {
 constexpr size_t kBlock = size_t{256} << 10;
 constexpr size_t kCapacity = LineReader::kMaxLine + kBlock;
 
+constexpr char kTooLong[] = "the line is longer than 64 MiB";
+constexpr std::string_view kMark = "\xEF\xBB\xBF";  // the byte order mark of UTF-8
+
 /** Pages of shared memory that are never touched cost nothing. */
 void* mapShared(size_t size) {
     void* memory = mmap(nullptr, size, PROT_READ | PROT_WRITE,
@@ -51,8 +54,16 @@ std::optional<std::string_view> LineReader::next() {
         const size_t length = feed == nullptr
                                       ? unread
                                       : static_cast<size_t>(static_cast<const char*>(feed) - begin);
+        if (length > kMaxLine) {
+            mError = kTooLong;
+            return std::nullopt;
+        }
         mState->begin += std::min(length + 1, unread);
-        return std::string_view(begin, length);
+        std::string_view line(begin, length);
+        if (mState->lineNumber == 1 && line.substr(0, kMark.size()) == kMark) {
+            line.remove_prefix(kMark.size());
+        }
+        return line;
     }
 }
 
@@ -65,8 +76,8 @@ bool LineReader::fill() {
     std::memmove(buffer(), buffer() + mState->begin, mState->end - mState->begin);
     mState->end -= mState->begin;
     mState->begin = 0;
-    if (mState->end >= kMaxLine) {
-        mError = "the line is longer than 64 MiB";
+    if (mState->end > kMaxLine) {
+        mError = kTooLong;
         return false;
     }
     ssize_t count;

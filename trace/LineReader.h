@@ -18,7 +18,7 @@ public:
     /** Readable bytes behind each line, as a vectorised parser wants them. */
     static constexpr size_t kPadding = 64;
 
-    /** Longest line, in bytes. */
+    /** Longest line, in bytes without its line feed. */
     static constexpr size_t kMaxLine = size_t{64} << 20;
 
     /** Reads `fd` from where it stands; takes it over. */
@@ -30,7 +30,7 @@ public:
 
     /**
      * The next line without its line feed, valid until the next call; nothing at the end or on an
-     * error.
+     * error. The first line comes without a UTF-8 byte order mark.
      */
     std::optional<std::string_view> next();
 

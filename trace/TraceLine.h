@@ -2,13 +2,13 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <utility>
+#include <variant>
 #include <vector>
-
-#include <simdjson.h>
 
 #include "platform/Display.h"
 #include "trace/CallTable.h"
@@ -17,36 +17,46 @@ namespace trace {
 
 enum class BootKind { kDevice, kProcess };
 
-/** One line of a trace, judged: its action is known to be in order and can be carried out. */
-struct TraceLine {
-    enum class Action { kNone, kCall, kSet, kProperty, kDisplay, kBoot };
-
-    int64_t at = 0;  // nanoseconds of the monotonic clock
-    Action action = Action::kNone;
-
-    // kCall: an index into calls.inc, and what it takes
-    size_t call = 0;
+/** A call of the library: its place in calls.inc, and what it takes. */
+struct Call {
+    size_t index = 0;
     std::vector<Argument> arguments;
-
-    // kSet: indices into calls.inc
-    std::vector<std::pair<size_t, int32_t>> variables;
-
-    // kProperty: no value deletes
-    std::vector<std::pair<std::string, std::optional<std::string>>> properties;
-
-    // kDisplay: a picture has been read already
-    platform::DisplayChange display;
-
-    // kBoot
-    BootKind boot = BootKind::kDevice;
 };
 
-/** The name of a call, as a trace writes it. */
-std::string_view callName(size_t index);
+/** Writes of variables: their places in calls.inc, and their new values. */
+struct VariableWrites {
+    std::vector<std::pair<size_t, int32_t>> writes;
+};
 
-/** Judges lines one by one; whether times go back is the caller's business. */
+/** Writes of properties; no value deletes. */
+struct PropertyWrites {
+    std::vector<std::pair<std::string, std::optional<std::string>>> writes;
+};
+
+/** What the library did on the device that the trace was recorded on. */
+struct Expectation {
+    std::string entry;  // `eventEntry` or `propertyEntry`
+};
+
+/** One line of a trace, judged: its action is known to be in order and can be carried out. */
+struct TraceLine {
+    int64_t at = 0;  // nanoseconds of the monotonic clock
+    std::variant<std::monostate, Call, VariableWrites, PropertyWrites, platform::DisplayChange,
+                 Expectation, BootKind>
+            action;
+};
+
+// What the library did, as output and "expect" lines have it: the key and its object.
+
+std::string eventEntry(std::string_view module, std::string_view id, std::string_view payload);
+std::string propertyEntry(std::string_view name, std::string_view value);
+
+/** Judges lines one by one. Whether times go back is the caller's business. */
 class TraceParser {
 public:
+    TraceParser();
+    ~TraceParser();
+
     /**
      * Parses `text`, behind which `LineReader::kPadding` bytes must be readable, into `*line`.
      * Pictures are looked for beside the file `trace`. Returns nothing, or what is wrong with the
@@ -56,8 +66,8 @@ public:
                                      TraceLine* line);
 
 private:
-    simdjson::dom::parser mParser;
-    simdjson::ondemand::parser mNumberParser;
+    struct Parsers;
+    const std::unique_ptr<Parsers> mParsers;
 };
 
 /** Whether a line is blank or a comment. */

@@ -1,0 +1,112 @@
+#include "replay/FilePlayer.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <utility>
+
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include "capture/CaptureImport.h"
+#include "report/Lines.h"
+#include "trace/FileIo.h"
+
+namespace replay {
+
+using trace::Failure;
+
+namespace {
+
+/** Makes `text` a file that is read from its start; -1, with `errno`, if that fails. */
+int memoryFile(const std::string& text) {
+    const int fd = memfd_create("trace", MFD_CLOEXEC);
+    if (fd >= 0 && trace::writeAll(fd, text.data(), text.size()) && lseek(fd, 0, SEEK_SET) == 0) {
+        return fd;
+    }
+    if (fd >= 0) close(fd);
+    return -1;
+}
+
+}  // namespace
+
+FilePlayer::FilePlayer(const Options& options) : mOptions(options) {
+    if (options.check) {
+        mReports.push_back(std::make_unique<report::Check>(&mOut));
+        mCheck = static_cast<report::Check*>(mReports.back().get());
+    } else if (options.json) {
+        mReports.push_back(std::make_unique<report::JsonLines>(&mOut, options.files.size() > 1));
+    } else {
+        mReports.push_back(std::make_unique<report::LogLines>(&mOut));
+    }
+    for (const auto& report : mReports) mWantsCalls |= report->wantsCalls();
+}
+
+std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
+    Device ownDevice;
+    ownDevice.propertyFile = device->propertyFile;
+    std::string text;
+    const bool isCapture = file.isCapture();
+    if (isCapture) {
+        if (auto failure = importTrace(&file, &text)) return failure;
+        const int fd = memoryFile(text);
+        if (fd < 0) {
+            return Failure{file.name + ": cannot keep the trace: " + std::strerror(errno),
+                           trace::kStatusFailed};
+        }
+        file.lines = std::make_unique<trace::LineReader>(fd);
+        file.first = file.lines->next();
+    }
+    for (const auto& report : mReports) report->begin({file.name});
+    trace::TraceReader reader(file.name, file.lines.get());
+    trace::TraceLine first;
+    mFailure.reset();
+    if (file.first && reader.judge(*file.first, &first, &mFailure)) {
+        playTrace(&reader, isCapture ? &ownDevice : device, first);
+    }
+    for (const auto& report : mReports) report->end(!mFailure);
+    mOut.flush();
+    if (!mFailure && mCheck != nullptr) return mCheck->failure();
+    return mFailure;
+}
+
+void FilePlayer::playTrace(trace::TraceReader* reader, Device* device,
+                           const trace::TraceLine& first) {
+    const auto run = [&](const Boot& boot, const trace::TraceLine* line) {
+        return runBoot(
+                boot, line, mWantsCalls, device, reader,
+                [this](const report::Record& record) {
+                    for (const auto& report : mReports) report->take(record);
+                },
+                [this] { mOut.flush(); }, &mFailure);
+    };
+    NextBoot next = run(Boot{trace::BootKind::kDevice, first.at}, &first);
+    while (next) next = run(*next, nullptr);
+}
+
+std::optional<Failure> FilePlayer::printTrace(InputFile file) {
+    if (!file.isCapture()) return Failure{file.name + ": not a device capture"};
+    std::string text;
+    if (auto failure = importTrace(&file, &text)) return failure;
+    if (mPrintedTrace) {
+        // The next device's clock starts at its first line's time.
+        mOut.write(text.substr(0, text.find(',')) + ", \"boot\": \"device\"}\n");
+    }
+    mPrintedTrace = true;
+    mOut.write(text);
+    mOut.flush();
+    return {};
+}
+
+std::optional<Failure> FilePlayer::importTrace(InputFile* file, std::string* trace) {
+    capture::ImportedCapture imported =
+            capture::importCapture(file->name, *file->first, file->lines.get());
+    if (!imported.error.empty()) return Failure{imported.error};
+    for (const std::string& warning : imported.warnings) {
+        std::fprintf(stderr, "%s\n", warning.c_str());
+    }
+    *trace = std::move(imported.trace);
+    return {};
+}
+
+}  // namespace replay

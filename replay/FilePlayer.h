@@ -1,0 +1,46 @@
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "replay/BootProcess.h"
+#include "replay/InputFile.h"
+#include "replay/Options.h"
+#include "report/Check.h"
+#include "report/Report.h"
+#include "report/Stdout.h"
+#include "trace/Failure.h"
+#include "trace/TraceReader.h"
+
+namespace replay {
+
+/** Plays inputs and makes of them what the options ask for. */
+class FilePlayer {
+public:
+    explicit FilePlayer(const Options& options);
+
+    /**
+     * Plays `file`, each boot in a process of its own. A capture is a device of its own; traces are
+     * played on `device`, one after another. Returns nothing, or why it had to stop.
+     */
+    std::optional<trace::Failure> play(InputFile file, Device* device);
+
+    /** Prints the trace that is made of the capture `file`. */
+    std::optional<trace::Failure> printTrace(InputFile file);
+
+private:
+    std::optional<trace::Failure> importTrace(InputFile* file, std::string* trace);
+    void playTrace(trace::TraceReader* reader, Device* device, const trace::TraceLine& first);
+
+    const Options& mOptions;
+    report::Stdout mOut;
+    std::vector<std::unique_ptr<report::Report>> mReports;
+    report::Check* mCheck = nullptr;  // one of these
+    bool mWantsCalls = false;
+    bool mPrintedTrace = false;
+    std::optional<trace::Failure> mFailure;
+};
+
+}  // namespace replay

@@ -1,0 +1,19 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace replay {
+
+/** What the command line asks for. */
+struct Options {
+    bool json = false;                      // print JSON Lines
+    bool printTrace = false;                // print the trace made from a capture, play nothing
+    bool check = false;                     // compare with "expect" lines, print no lines
+    int jobs = 1;                           // captures that are played at once, at least 1
+    std::optional<std::string> properties;  // the file that keeps them; in memory without
+    std::vector<std::string> files;         // "-" is standard input
+};
+
+}  // namespace replay
