@@ -1,16 +1,15 @@
 #include "report/Lines.h"
 
 #include "report/Format.h"
+#include "report/Payload.h"
 #include "trace/JsonText.h"
 #include "trace/TraceLine.h"
 #include "trace/TraceTime.h"
 
 namespace report {
 
-using trace::toJson;
-
 void JsonLines::begin(const Input& input) {
-    if (mWithFile) mEnd = R"(, "file": )" + toJson(input.name) + "}\n";
+    if (mWithFile) mEnd = R"(, "file": )" + trace::toJson(input.name) + "}\n";
 }
 
 void JsonLines::take(const Record& record) {
@@ -18,20 +17,22 @@ void JsonLines::take(const Record& record) {
     std::string entry;
     switch (record.kind) {
         case Record::Kind::kBoot:
-            entry = R"("boot": )" + toJson(first);
+            entry = R"("boot": )" + trace::toJson(first);
             break;
         case Record::Kind::kEvent:
             entry = trace::eventEntry(first, second, third);
+            entry.back() = ',';
+            entry += R"( "fields": )" + report::toJson(takeApart(second, third)) + '}';
             break;
         case Record::Kind::kProperty:
             entry = trace::propertyEntry(first, second);
             break;
         case Record::Kind::kLog:
             entry = R"("log": {"level": )" + std::to_string(record.number) + R"(, "tag": )" +
-                    toJson(first) + R"(, "text": )" + toJson(second) + '}';
+                    trace::toJson(first) + R"(, "text": )" + trace::toJson(second) + '}';
             break;
         case Record::Kind::kResult:
-            entry = R"("result": {"call": )" + toJson(first) + R"(, "value": )" +
+            entry = R"("result": {"call": )" + trace::toJson(first) + R"(, "value": )" +
                     std::string(second) + '}';
             break;
         default:

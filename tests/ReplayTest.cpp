@@ -45,8 +45,9 @@ std::string report(const std::string& at) {
 }
 
 std::string reported(const std::string& at, int count) {
+    const std::string number = std::to_string(count);
     return line(at, R"("event": {"module": "N273", "id": "N273|10009", "payload": "count:)" +
-                            std::to_string(count) + R"("})");
+                            number + R"(", "fields": {"count": ")" + number + R"("}})");
 }
 
 /** A property that a file keeps. */
