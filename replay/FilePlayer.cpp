@@ -10,6 +10,7 @@
 
 #include "capture/CaptureImport.h"
 #include "report/Lines.h"
+#include "report/Summary.h"
 #include "trace/FileIo.h"
 
 namespace replay {
@@ -36,8 +37,10 @@ FilePlayer::FilePlayer(const Options& options) : mOptions(options) {
         mCheck = static_cast<report::Check*>(mReports.back().get());
     } else if (options.json) {
         mReports.push_back(std::make_unique<report::JsonLines>(&mOut, options.files.size() > 1));
-    } else {
+    } else if (options.log) {
         mReports.push_back(std::make_unique<report::LogLines>(&mOut));
+    } else {
+        mReports.push_back(std::make_unique<report::Summary>(&mOut, options.all, options.colours));
     }
     for (const auto& report : mReports) mWantsCalls |= report->wantsCalls();
 }

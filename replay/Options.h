@@ -9,6 +9,9 @@ namespace replay {
 /** What the command line asks for. */
 struct Options {
     bool json = false;                      // print JSON Lines
+    bool log = false;                       // print lines for a person, in order of time
+    bool all = false;                       // print all rows of the summary's tables
+    bool colours = false;                   // in the summary
     bool printTrace = false;                // print the trace made from a capture, play nothing
     bool check = false;                     // compare with "expect" lines, print no lines
     int jobs = 1;                           // captures that are played at once, at least 1

@@ -1,7 +1,9 @@
 #include <algorithm>
+#include <cstdlib>
 #include <iostream>
 #include <thread>
 
+#include <unistd.h>
 #include <CLI/CLI.hpp>
 
 #include "replay/Replay.h"
@@ -38,12 +40,16 @@ int main(int argc, char** argv) {
     options.jobs = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     CLI::App app(kExamples, "sensor-replay");
     app.footer(kStatuses);
-    auto* json = app.add_flag("--json", options.json, "print JSON Lines");
+    auto* log = app.add_flag("--log", options.log, "print what happens, a line each, as it comes");
+    auto* json =
+            app.add_flag("--json", options.json, "print the same as JSON Lines")->excludes(log);
+    app.add_flag("--all", options.all, "show all rows of the summary's tables, not the first 20");
     auto* printTrace = app.add_flag("--print-trace", options.printTrace,
                                     "print the trace made from a capture instead of playing it");
     app.add_flag("--check", options.check,
                  R"(compare what the library does with the trace's "expect" lines)")
             ->excludes(json)
+            ->excludes(log)
             ->excludes(printTrace);
     app.add_option("--jobs", options.jobs, "captures that are played at once (default: all cores)")
             ->type_name("N")
@@ -64,5 +70,7 @@ int main(int argc, char** argv) {
     if (listCalls) {
         return std::cout << trace::listCalls() << std::flush ? 0 : trace::kStatusFailed;
     }
+    const char* noColour = std::getenv("NO_COLOR");
+    options.colours = isatty(STDOUT_FILENO) != 0 && (noColour == nullptr || *noColour == '\0');
     return replay::replayFiles(options);
 }

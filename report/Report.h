@@ -1,14 +1,18 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "report/Record.h"
+#include "trace/Origin.h"
 
 namespace report {
 
 /** What is about to be played. */
 struct Input {
-    std::string name;  // of the file, as it was given
+    std::string name;                        // of the file, as it was given
+    const trace::Origin* origin = nullptr;   // of a capture's trace
+    std::vector<std::string> warnings = {};  // of its import, a line each
 };
 
 /**

@@ -201,7 +201,7 @@ TEST_F(ReplayTest, ChecksExpectationsInOrderAndWithoutTheirTimes) {
 
 TEST_F(ReplayTest, LaysOutLinesForAPerson) {
     write("trace", joined({sample("86400000"), report("86410000.5")}));
-    EXPECT_EQ(run("trace").out,
+    EXPECT_EQ(run("--log trace").out,
               "day 2 00:00:00.000  boot      device\n"
               "day 2 00:00:00.500  property  persist.zuno.rgb.shot.count = 1\n"
               "day 2 00:00:10.000500000  event     N273|10009 count:1\n");

@@ -1,0 +1,78 @@
+#include "report/DayTable.h"
+
+#include <algorithm>
+#include <cstddef>
+
+#include "report/SensorNames.h"
+#include "report/Table.h"
+#include "report/Text.h"
+
+namespace report {
+
+namespace {
+
+std::string share(const DayUse& use) {
+    if (!use.displayOn || use.held == 0) return "-";
+    return std::to_string(*use.displayOn * 100 / use.held) + " %";
+}
+
+}  // namespace
+
+void DayTable::add(int64_t boot, const Slice& slice, const Usage& usage) {
+    for (int64_t number = slice.from / kNsPerDay;; ++number) {
+        const int64_t midnight = (number + 1) * kNsPerDay;
+        const Span span{std::max(slice.from, midnight - kNsPerDay), std::min(slice.to, midnight)};
+        DayUse& use = mUses[{boot, number}][{slice.app, slice.type}];
+        use.app = slice.app;
+        use.type = slice.type;
+        use.held += span.to - span.from;
+        if (const auto on = usage.displayOn(span)) use.displayOn = use.displayOn.value_or(0) + *on;
+        for (const Enable& enable : slice.enables) {
+            if (enable.at / kNsPerDay != number) continue;
+            ++use.enables;
+            use.fastest = std::min(use.fastest.value_or(enable.periodNs), enable.periodNs);
+        }
+        use.isOpen = slice.isOpen || slice.to > midnight;
+        if (slice.to <= midnight) return;
+    }
+}
+
+std::vector<Day> DayTable::days() const {
+    std::vector<Day> days;
+    for (const auto& [day, uses] : mUses) days.push_back(day);
+    return days;
+}
+
+std::vector<DayUse> DayTable::usesOf(const Day& day) const {
+    std::vector<DayUse> uses;
+    const auto found = mUses.find(day);
+    if (found == mUses.end()) return uses;
+    for (const auto& [key, use] : found->second) uses.push_back(use);
+    std::stable_sort(uses.begin(), uses.end(),
+                     [](const DayUse& a, const DayUse& b) { return a.held > b.held; });
+    return uses;
+}
+
+std::string layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_t limit) {
+    Table table({{"App", Table::Column::kCut},
+                 {"Sensor", Table::Column::kCut},
+                 {"Held", Table::Column::kRight},
+                 {"Display on", Table::Column::kRight},
+                 {"Enables", Table::Column::kRight},
+                 {"Rate Hz", Table::Column::kRight},
+                 {"At the end"}});
+    const size_t shown = std::min(uses.size(), limit);
+    for (size_t i = 0; i < shown; ++i) {
+        const DayUse& use = uses[i];
+        table.add({use.app, nameSensor(use.type, origin), formatDuration(use.held), share(use),
+                   std::to_string(use.enables), use.fastest ? formatRate(*use.fastest) : "-",
+                   use.isOpen ? "still on" : ""});
+    }
+    std::string text = table.text(2);
+    if (shown < uses.size()) {
+        text += "  and " + std::to_string(uses.size() - shown) + " more (--all shows them)\n";
+    }
+    return text;
+}
+
+}  // namespace report

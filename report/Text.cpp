@@ -1,0 +1,116 @@
+#include "report/Text.h"
+
+#include <cstdio>
+#include <ctime>
+
+#include <unictype.h>
+#include <unistr.h>
+#include <uniwidth.h>
+
+namespace report {
+
+namespace {
+
+constexpr int64_t kNsPerSecond = 1'000'000'000;
+constexpr std::string_view kEllipsis = "\u2026";
+
+/** The first character of `text`, which is taken off it; U+FFFD for what is none. */
+ucs4_t takeCharacter(std::string_view* text) {
+    ucs4_t character = 0;
+    const int size =
+            u8_mbtouc(&character, reinterpret_cast<const uint8_t*>(text->data()), text->size());
+    text->remove_prefix(static_cast<size_t>(size));
+    return character;
+}
+
+void append(ucs4_t character, std::string* text) {
+    uint8_t bytes[6];
+    const int size = u8_uctomb(bytes, character, sizeof(bytes));
+    text->append(reinterpret_cast<const char*>(bytes), static_cast<size_t>(size));
+}
+
+/** Whether a terminal would do something with it other than to show it. */
+bool isControl(ucs4_t character) {
+    return uc_is_general_category_withtable(
+                   character, UC_CATEGORY_MASK_Cc | UC_CATEGORY_MASK_Zl | UC_CATEGORY_MASK_Zp) ||
+           uc_is_property(character, UC_PROPERTY_BIDI_CONTROL);
+}
+
+size_t columnsOf(ucs4_t character) {
+    const int columns = uc_width(character, "UTF-8");
+    return columns > 0 ? static_cast<size_t>(columns) : 0;
+}
+
+}  // namespace
+
+std::string safe(std::string_view text) {
+    std::string result;
+    while (!text.empty()) {
+        const ucs4_t character = takeCharacter(&text);
+        append(isControl(character) ? ucs4_t{'?'} : character, &result);
+    }
+    return result;
+}
+
+size_t width(std::string_view text) {
+    size_t columns = 0;
+    while (!text.empty()) columns += columnsOf(takeCharacter(&text));
+    return columns;
+}
+
+std::string cut(const std::string& text, size_t columns) {
+    const size_t all = width(text);
+    if (all <= columns) return text;
+    if (columns == 0) return {};
+    const size_t kept = columns - 1;  // beside the ellipsis
+    const size_t head = kept / 2;
+    std::string result;
+    std::string_view rest = text;
+    size_t passed = 0;
+    while (!rest.empty()) {
+        std::string_view next = rest;
+        const size_t end = passed + columnsOf(takeCharacter(&next));
+        if (end > head) break;
+        result.append(rest, 0, rest.size() - next.size());
+        passed = end;
+        rest = next;
+    }
+    result += kEllipsis;
+    while (all - passed > kept - head) passed += columnsOf(takeCharacter(&rest));
+    return result.append(rest);
+}
+
+std::string formatDuration(int64_t ns) {
+    const auto seconds = static_cast<long long>(ns / kNsPerSecond);
+    char text[48];
+    std::snprintf(text, sizeof(text), "%lld:%02lld:%02lld", seconds / 3600, seconds / 60 % 60,
+                  seconds % 60);
+    return text;
+}
+
+std::string formatRate(int64_t periodNs) {
+    if (periodNs <= 0) return "fastest";
+    const double rate = 1e9 / static_cast<double>(periodNs);
+    char text[48];
+    std::snprintf(text, sizeof(text), rate < 1 ? "%.3g" : rate < 1e6 ? "%.1f" : "%.3g", rate);
+    return text;
+}
+
+std::string formatDate(int64_t day) {
+    const auto time = static_cast<time_t>(day * 86'400);
+    tm date{};
+    gmtime_r(&time, &date);
+    char text[48];
+    std::strftime(text, sizeof(text), "%Y-%m-%d", &date);
+    return text;
+}
+
+std::string formatTimeOfDay(int64_t ns) {
+    const int64_t seconds = ns / kNsPerSecond % 86'400;
+    char text[48];
+    std::snprintf(text, sizeof(text), "%02d:%02d:%02d", static_cast<int>(seconds / 3600),
+                  static_cast<int>(seconds / 60 % 60), static_cast<int>(seconds % 60));
+    return text;
+}
+
+}  // namespace report
