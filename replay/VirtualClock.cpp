@@ -1,65 +1,103 @@
 #include "replay/VirtualClock.h"
 
+#include <algorithm>
 #include <atomic>
-#include <condition_variable>
 #include <limits>
-#include <mutex>
+#include <list>
+#include <memory>
+#include <utility>
 
 #include <sys/epoll.h>
 #include <sys/syscall.h>
 #include <time.h>
 #include <unistd.h>
+#include <utils/AndroidThreads.h>
+
+#include "replay/Fiber.h"
 
 namespace {
 
+using virtual_clock::Fiber;
+
 constexpr int64_t kNever = std::numeric_limits<int64_t>::max();
+
+/** As much as a thread has by default; only the pages that are used take memory. */
+constexpr size_t kStackBytes = size_t{8} << 20;
 
 std::atomic<int64_t> currentTime{0};
 
-/** Where the Looper's thread is, as the driver has to know it. */
-struct Worker {
-    enum class State {
-        kNone,     // there is no Looper, or its thread has ended
-        kRunning,  // on its way to epoll_wait
-        kAsleep,   // in epoll_wait
-    };
+/** A Looper's thread. */
+class Worker {
+public:
+    explicit Worker(std::unique_ptr<Fiber> fiber) : mFiber(std::move(fiber)) {}
 
-    std::mutex mutex;
-    std::condition_variable changed;
-    State state = State::kNone;
+    bool hasEnded() const { return mFiber->hasEnded(); }
 
-    // While asleep.
-    int epollFd = -1;
-    int64_t deadline = kNever;
+    /** When its wait is over though nothing happens. */
+    int64_t deadline() const { return mDeadline; }
 
-    /** Never destroyed: the Looper's thread sleeps on it until the process is gone. */
-    static Worker& get() {
-        static auto* const instance = new Worker;
-        return *instance;
+    /** Runs until there is nothing left to do at the present moment; false if there was nothing. */
+    bool run() {
+        if (!isReady()) return false;
+        tRunning = this;
+        mFiber->resume();
+        tRunning = nullptr;
+        return true;
     }
 
-    void enter(State newState) {
-        const std::lock_guard lock(mutex);
-        state = newState;
-        changed.notify_all();
+    /** `epoll_wait`, called by the worker itself. */
+    int wait(int epollFd, epoll_event* events, int maxEvents, int timeoutMs) {
+        mEpollFd = epollFd;
+        mEvents = events;
+        mMaxEvents = maxEvents;
+        mDeadline = timeoutMs < 0 ? kNever : virtual_clock::now() + int64_t{timeoutMs} * 1'000'000;
+        if (!isReady()) mFiber->pause();
+        return mEventCount;
     }
+
+    /** The one that runs on this thread; null for the driver. */
+    static Worker* running() { return tRunning; }
+
+private:
+    /** Whether the wait is over. `epoll_pwait` is libc's own, while `epoll_wait` is ours. */
+    bool isReady() {
+        if (mEpollFd < 0) return true;
+        mEventCount = epoll_pwait(mEpollFd, mEvents, mMaxEvents, 0, nullptr);
+        return mEventCount != 0 || mDeadline <= virtual_clock::now();
+    }
+
+    const std::unique_ptr<Fiber> mFiber;
+
+    // Its wait.
+    int mEpollFd = -1;  // before the first one
+    epoll_event* mEvents = nullptr;
+    int mMaxEvents = 0;
+    int mEventCount = 0;
+    int64_t mDeadline = kNever;
+
+    static thread_local Worker* tRunning;
 };
 
-/** Tells the driver that a Looper's thread has ended. */
-struct EndOfThread {
-    ~EndOfThread() { Worker::get().enter(Worker::State::kNone); }
-};
+thread_local Worker* Worker::tRunning = nullptr;
 
-/** What is ready now. `epoll_pwait` is libc's own, while `epoll_wait` is ours. */
-int poll(int epollFd, epoll_event* events, int maxEvents) {
-    return epoll_pwait(epollFd, events, maxEvents, 0, nullptr);
+/** Those that have not ended, oldest first. Never destroyed: the stacks hold objects in use. */
+std::list<Worker>& workers() {
+    static auto* const instance = new std::list<Worker>;
+    return *instance;
 }
 
-/** Whether the worker, once awake, has a reason to leave epoll_wait. */
-bool hasReason(const Worker& worker) {
-    epoll_event event;
-    return worker.deadline <= virtual_clock::now() || poll(worker.epollFd, &event, 1) != 0;
+/** For libutils, in place of its own: creates a thread and returns 1, or 0 without memory. */
+int createWorker(android_thread_func_t function, void* data, const char*, int32_t,
+                 size_t stackBytes, android_thread_id_t* id) {
+    auto fiber = Fiber::create(function, data, stackBytes > 0 ? stackBytes : kStackBytes);
+    if (fiber == nullptr) return 0;
+    workers().emplace_back(std::move(fiber));
+    // The driver's own: libutils then refuses to block the driver until the worker has ended.
+    if (id != nullptr) *id = androidGetThreadId();
+    return 1;
 }
+
+[[maybe_unused]] const bool gCreatesWorkers = (androidSetCreateThreadFunc(createWorker), true);
 
 }  // namespace
 
@@ -74,20 +112,21 @@ void set(int64_t time) {
 }
 
 void settle() {
-    Worker& worker = Worker::get();
-    std::unique_lock lock(worker.mutex);
-    for (;;) {
-        worker.changed.wait(lock, [&] { return worker.state != Worker::State::kRunning; });
-        if (worker.state == Worker::State::kNone || !hasReason(worker)) return;
-        worker.state = Worker::State::kRunning;
-        worker.changed.notify_all();
-    }
+    bool ran;
+    do {
+        ran = false;
+        for (Worker& worker : workers()) ran |= worker.run();
+        workers().remove_if([](const Worker& worker) { return worker.hasEnded(); });
+    } while (ran && workers().size() > 1);  // one may have posted to another
 }
 
 void advanceTo(int64_t time) {
-    Worker& worker = Worker::get();
-    for (settle(); worker.state == Worker::State::kAsleep && worker.deadline <= time; settle()) {
-        set(worker.deadline);
+    for (;;) {
+        settle();
+        int64_t deadline = kNever;
+        for (const Worker& worker : workers()) deadline = std::min(deadline, worker.deadline());
+        if (deadline > time) break;
+        set(deadline);
     }
     set(time);
 }
@@ -104,20 +143,8 @@ extern "C" int clock_gettime(clockid_t clock, timespec* time) noexcept {
     return 0;
 }
 
-extern "C" int epoll_create1(int flags) noexcept {
-    Worker::get().enter(Worker::State::kRunning);  // its thread will come to epoll_wait
-    return static_cast<int>(syscall(SYS_epoll_create1, flags));
-}
-
 extern "C" int epoll_wait(int epollFd, epoll_event* events, int maxEvents, int timeoutMs) {
-    thread_local const EndOfThread endOfThread;
-    Worker& worker = Worker::get();
-    std::unique_lock lock(worker.mutex);
-    worker.epollFd = epollFd;
-    worker.deadline =
-            timeoutMs < 0 ? kNever : virtual_clock::now() + int64_t{timeoutMs} * 1'000'000;
-    worker.state = Worker::State::kAsleep;
-    worker.changed.notify_all();
-    worker.changed.wait(lock, [&] { return worker.state == Worker::State::kRunning; });
-    return poll(epollFd, events, maxEvents);
+    Worker* const worker = Worker::running();
+    return worker != nullptr ? worker->wait(epollFd, events, maxEvents, timeoutMs)
+                             : epoll_pwait(epollFd, events, maxEvents, timeoutMs, nullptr);
 }
