@@ -10,6 +10,7 @@
 #include <unistd.h>
 
 // Null in a build without the sanitizer that defines them.
+#pragma weak __asan_handle_no_return
 #pragma weak __lsan_register_root_region
 #pragma weak __lsan_unregister_root_region
 #pragma weak __sanitizer_finish_switch_fiber
@@ -85,6 +86,7 @@ void Fiber::leave(Side* from, Side* to) {
     context.uc_stack.ss_sp = mStack;
     context.uc_stack.ss_size = mStackBytes;
     makecontext(&context, start, 0);
+    if (__asan_handle_no_return != nullptr) __asan_handle_no_return();  // as `_longjmp` does
     setcontext(&context);
 }
 
