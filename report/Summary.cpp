@@ -117,6 +117,7 @@ void Summary::endBoot() {
 }
 
 void Summary::end(bool isWhole) {
+    if (!isWhole && mBoot < 0) return;
     endBoot();
     printOrigin();
     printDays();
