@@ -59,17 +59,16 @@ std::string TallyCommon::longToStr(long value) {
 
 void TallyCommon::splitStr(const std::string& text, const std::string& delimiter,
                            std::vector<std::string>& out) {
-    // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): `text` may lie in `out`
-    const std::string source = text;
-    out.clear();
+    std::vector<std::string> pieces;  // `text` and `delimiter` may lie in `out`
     size_t begin = 0;
-    size_t end = delimiter.empty() ? std::string::npos : source.find_first_of(delimiter);
+    size_t end = delimiter.empty() ? std::string::npos : text.find_first_of(delimiter);
     while (end != std::string::npos) {
-        out.push_back(source.substr(begin, end - begin));
+        pieces.push_back(text.substr(begin, end - begin));
         begin = end + delimiter.size();
-        end = source.find(delimiter, begin);
+        end = text.find(delimiter, begin);
     }
-    out.push_back(source.substr(std::min(begin, source.size())));
+    pieces.push_back(text.substr(std::min(begin, text.size())));
+    out = std::move(pieces);
 }
 
 void TallyCommon::BootNotFinish() {
