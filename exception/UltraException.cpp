@@ -10,7 +10,6 @@
 #include "core/CounterProperty.h"
 #include "core/Log.h"
 #include "core/SensorHandlerThread.h"
-#include "core/SharedText.h"
 #include "core/TallyCommon.h"
 
 namespace android {
@@ -91,8 +90,9 @@ UltraException* UltraException::getInstance() {
     return mUltraException;
 }
 
-UltraException::UltraException() : mHandler(new UltraExceptionHandler) {
-    initSharedText(&mPackageName, kUnknownPackage);
+UltraException::UltraException()
+      : mHandler(new UltraExceptionHandler),
+        mPackageName(kUnknownPackage) {
     if (isOverseas) return;
     SensorHandlerThread::getInstance()->sendMessageDelayed(mHandler, MSG_LOAD, kLoadDelayMs);
 }
@@ -110,7 +110,7 @@ void UltraException::doAction(int code, const UltraExceptionInfo& info) {
     if (code == MSG_PHONE_STATE) {
         mPhoneState = info.phoneState;
     } else if (code == MSG_ENABLED) {
-        setSharedText(&mPackageName, info.packageName);
+        mPackageName.set(info.packageName);
     }
     SensorHandlerThread* thread = SensorHandlerThread::getInstance();
     thread->removeMessage(mHandler, code);
@@ -133,7 +133,7 @@ void UltraException::setUltraEnergy(const sensors_event_t& event) {
 void UltraException::resetUltraStatus() {
     mFluctuantEnergy = 0;
     mBackgroundEnergy = 0;
-    setSharedText(&mPackageName, kUnknownPackage);
+    mPackageName.set(kUnknownPackage);
 }
 
 void UltraException::putPhoneOpenUltraTally() {
@@ -166,7 +166,7 @@ void UltraException::increaseEnableUltrasoundCount() {
 
 void UltraException::updateUltraInvalid() {
     if (mInvalidCount > kLastCounted) return;
-    if (mPackageName.find(kInCallPackage) == std::string::npos) return;
+    if (mPackageName.get().find(kInCallPackage) == std::string::npos) return;
     if (mInvalidCountedInCall) return;
     mInvalidCountedInCall = true;
     ++mInvalidCount;
@@ -199,7 +199,7 @@ void UltraException::trackEvent(std::string eventId, int code, int count) {
 
 void UltraException::sendEvent(std::string eventId, int code, int32_t failures, int32_t uses) {
     TallyCommon::getInstance()->trackEvent(
-            std::move(eventId), {{"pkg", mPackageName},
+            std::move(eventId), {{"pkg", mPackageName.get()},
                                  {"ultraExpired", std::to_string(code)},
                                  {"TempInvalidRate", joined(failures, uses)},
                                  {"ultraEnergy", joined(mBackgroundEnergy, mFluctuantEnergy)}});
@@ -207,7 +207,7 @@ void UltraException::sendEvent(std::string eventId, int code, int32_t failures, 
 
 void UltraException::updatePhoneOpenUltraCount() {
     if (mPhoneState != 0) {
-        if (mPackageName != kUnknownPackage) mUltraOpenedInCall = true;
+        if (mPackageName.get() != kUnknownPackage) mUltraOpenedInCall = true;
         return;
     }
     mInvalidCountedInCall = false;
