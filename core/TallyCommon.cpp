@@ -8,13 +8,20 @@
 #include <cutils/properties.h>
 #include <unistd.h>
 
-#include "core/CounterProperty.h"
 #include "core/Log.h"
+#include "core/ParseInt32.h"
 
 /** Of the device's telemetry library: three NUL-terminated texts. */
 extern "C" void track_event(const char* moduleId, const char* eventId, const char* payload);
 
 namespace android {
+
+namespace {
+
+constexpr char kModuleId[] = "N273";
+constexpr useconds_t kBootPollUs = 200'000;
+
+}  // namespace
 
 Mutex TallyCommon::sLock;
 TallyCommon* TallyCommon::mTallyCommon = nullptr;
@@ -25,7 +32,7 @@ TallyCommon* TallyCommon::getInstance() {
     return mTallyCommon;
 }
 
-TallyCommon::TallyCommon() : mModuleId("N273"), mBootFinished(false) {}
+TallyCommon::TallyCommon() : mModuleId(kModuleId), mBootFinished(false) {}
 
 void TallyCommon::trackEvent(std::string eventId, std::map<std::string, std::string> params) {
     setTally({std::move(eventId), convertMapToTally(std::move(params))});
@@ -81,7 +88,7 @@ void TallyCommon::BootNotFinish() {
             mBootFinished = true;
             return;
         }
-        usleep(200'000);
+        usleep(kBootPollUs);
     }
 }
 

@@ -7,6 +7,7 @@
 #include <utils/SystemClock.h>
 
 #include "core/Arithmetic.h"
+#include "core/Connection.h"
 #include "core/CounterProperty.h"
 #include "core/Log.h"
 #include "core/SensorHandlerThread.h"
@@ -33,7 +34,6 @@ enum : int { ROUTE_INVALID = 100, DEVICE_INVALID = 101, RX_CLOSED = 102, DAILY =
 enum : int { DATA_MARKER = 3, DATA_ENERGY = 4, BACKGROUND_MARKER = 301, FLUCTUANT_MARKER = 302 };
 
 constexpr int kLoadDelayMs = 2000;
-constexpr int32_t kLastCounted = 2147483645;
 constexpr char kEventId[] = "N273|10011";
 constexpr char kUnknownPackage[] = "unknown";
 constexpr char kInCallPackage[] = "com.android.incallui";
@@ -166,7 +166,7 @@ void UltraException::increaseEnableUltrasoundCount() {
 
 void UltraException::updateUltraInvalid() {
     if (mInvalidCount > kLastCounted) return;
-    if (mPackageName.get().find(kInCallPackage) == std::string::npos) return;
+    if (!nameHolds(mPackageName.get(), kInCallPackage)) return;
     if (mInvalidCountedInCall) return;
     mInvalidCountedInCall = true;
     ++mInvalidCount;

@@ -5,8 +5,8 @@
 #include <cutils/properties.h>
 #include <time.h>
 
-#include "core/CounterProperty.h"
 #include "core/Log.h"
+#include "core/ParseInt32.h"
 #include "rgb/LightSensorState.h"
 
 namespace android {

@@ -104,7 +104,9 @@ int createNoThread(android_thread_func_t, void*, const char*, int32_t, size_t,
     return 0;
 }
 
-TEST_F(DeviceTest, WithoutAWorkerThreadTheLibraryLivesAndOnlyDeferredWorkIsUndone) {
+class WorkerlessTest : public DeviceTest {};
+
+TEST_F(WorkerlessTest, TheLibraryLivesAndOnlyItsDeferredWorkIsUndone) {
     androidSetCreateThreadFunc(createNoThread);
     MagneticUseIf::getInstance()->sendBootShutdownRebootState(0);
     EXPECT_EQ(taken(), Lines{}) << "nothing to do, so no thread yet";

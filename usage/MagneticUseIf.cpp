@@ -1,6 +1,5 @@
 #include "usage/MagneticUseIf.h"
 
-#include <algorithm>
 #include <map>
 #include <vector>
 
@@ -8,11 +7,13 @@
 #include <utils/Timers.h>
 
 #include "core/Arithmetic.h"
+#include "core/Connection.h"
 #include "core/CounterProperty.h"
 #include "core/Log.h"
-#include "core/RankedList.h"
+#include "core/ParseInt32.h"
 #include "core/SensorHandlerThread.h"
 #include "core/TallyCommon.h"
+#include "usage/RankedList.h"
 
 namespace android {
 
@@ -169,7 +170,7 @@ void MagneticUseIf::dealWithChargeAndOrientationEnableState() {
 void MagneticUseIf::dealWithOrientationEnableDisable(std::string pkg, std::string opPkg,
                                                      bool enable) {
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
-    const std::string key = pkg + "/" + opPkg;
+    const std::string key = connectionKey(pkg, opPkg);
     Mutex::Autolock lock(mPkgLock);
     if (enable) {
         const auto it = mPkgInfoMap.try_emplace(key).first;
@@ -180,13 +181,12 @@ void MagneticUseIf::dealWithOrientationEnableDisable(std::string pkg, std::strin
         }
         info.beginTime = now;
         if (mIsChargeState) info.chargeBeginTime = now;
-        info.enableCount = addWrapped(std::max(info.enableCount, 0), 1);
+        nestEnable(&info.enableCount);
     } else {
         const auto it = mPkgInfoMap.find(key);
         if (it == mPkgInfoMap.end() || it->second.beginTime == 0) return;
         PkgInfo& info = it->second;
-        info.enableCount = addWrapped(info.enableCount, -1);
-        if (info.enableCount != 0) return;
+        if (!unnestEnable(&info.enableCount)) return;
         if (mIsChargeState) {
             updateChargeTime(it, now);
             info.chargeBeginTime = now;
