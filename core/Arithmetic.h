@@ -10,6 +10,9 @@ constexpr int32_t addWrapped(int32_t total, int64_t amount) {
     return static_cast<int32_t>(static_cast<uint32_t>(total) + static_cast<uint32_t>(amount));
 }
 
+/** Counters that must not wrap are raised up to one past this number, and then stay there. */
+constexpr int32_t kLastCounted = 2'147'483'645;
+
 /** Whole seconds from `begin` to `end`, both in nanoseconds, truncated toward zero. */
 constexpr int64_t secondsBetween(int64_t begin, int64_t end) {
     return (end - begin) / 1'000'000'000;

@@ -1,21 +1,12 @@
 #include "core/CounterProperty.h"
 
-#include <algorithm>
-#include <cstdlib>
-#include <limits>
 #include <string>
 
 #include <cutils/properties.h>
 
-namespace android {
+#include "core/ParseInt32.h"
 
-void parseInt32(const char* text, int32_t* value) {
-    char* end = nullptr;
-    const long long number = std::strtoll(text, &end, 10);
-    if (end == text) return;
-    *value = static_cast<int32_t>(std::clamp<long long>(number, std::numeric_limits<int32_t>::min(),
-                                                        std::numeric_limits<int32_t>::max()));
-}
+namespace android {
 
 int32_t CounterProperty::load() const {
     char text[PROP_VALUE_MAX] = "0";

@@ -4,14 +4,6 @@
 
 namespace android {
 
-/**
- * Reads the decimal number at the start of `text`, after blanks and a sign, into `*value`.
- * A number that does not fit 32 bits reads as the nearest one that does. Text that does not start
- * with a number leaves `*value` unchanged. This is the one place where stored numbers are parsed,
- * so that they read the same on 32-bit and 64-bit machines.
- */
-void parseInt32(const char* text, int32_t* value);
-
 /** A counter's place in the system properties. May be used from any thread; takes no lock. */
 class CounterProperty {
 public:

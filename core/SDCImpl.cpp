@@ -9,6 +9,38 @@
 
 namespace android {
 
+namespace {
+
+/** Which statistics follow a sensor's connections. */
+enum class Route { NONE, REGISTRATION, ORIENTATION, PROXIMITY };
+
+constexpr struct {
+    int sensorType;
+    Route route;
+} kRouteTable[] = {
+        {SENSOR_TYPE_ACCELEROMETER, Route::REGISTRATION},
+        {SENSOR_TYPE_ACCELEROMETER_UNCALIBRATED, Route::REGISTRATION},
+        {SENSOR_TYPE_GYROSCOPE, Route::REGISTRATION},
+        {SENSOR_TYPE_GYROSCOPE_UNCALIBRATED, Route::REGISTRATION},
+        {SENSOR_TYPE_ORIENTATION, Route::ORIENTATION},
+        {SENSOR_TYPE_ROTATION_VECTOR, Route::ORIENTATION},
+        {SENSOR_TYPE_PROXIMITY, Route::PROXIMITY},
+};
+
+Route routeOf(int sensorType) {
+    for (const auto& entry : kRouteTable) {
+        if (entry.sensorType == sensorType) return entry.route;
+    }
+    return Route::NONE;
+}
+
+// Hours of the day at which the host's hourly calls act.
+constexpr int kMorningHour = 7;    // screen samples, ultrasonic proximity
+constexpr int kExceptionHour = 8;  // sensor exceptions
+constexpr int kNightHour = 23;     // usage, registrations, chat calls
+
+}  // namespace
+
 Mutex SDCImpl::sLock;
 SDCImpl* SDCImpl::mSDC = nullptr;
 
@@ -36,37 +68,33 @@ void SDCImpl::enableSuccess(bool enabled, int type, const std::string& pkg,
 }
 
 void SDCImpl::handleEnable(int type, std::string pkg, std::string opPkg, long long rate) {
-    switch (type) {
-        case 1:
-        case 4:
-        case 16:
-        case 35:
+    switch (routeOf(type)) {
+        case Route::REGISTRATION:
             mRegisterInfo->handleEnable(type, pkg, opPkg, rate);
             break;
-        case 3:
-        case 11:
+        case Route::ORIENTATION:
             mMagneticUseIf->setOrientationEnable(pkg, opPkg);
             break;
-        case 8:
+        case Route::PROXIMITY:
             mFlowingDataException->setProxEnable(pkg, opPkg);
+            break;
+        case Route::NONE:
             break;
     }
 }
 
 void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
-    switch (type) {
-        case 1:
-        case 4:
-        case 16:
-        case 35:
+    switch (routeOf(type)) {
+        case Route::REGISTRATION:
             mRegisterInfo->handleDisable(type, pkg, opPkg);
             break;
-        case 3:
-        case 11:
+        case Route::ORIENTATION:
             mMagneticUseIf->setOrientationDisable(pkg, opPkg);
             break;
-        case 8:
+        case Route::PROXIMITY:
             mFlowingDataException->setProxDisable(pkg, opPkg);
+            break;
+        case Route::NONE:
             break;
     }
 }
@@ -106,9 +134,9 @@ void SDCImpl::setRgbShotCount() {
 }
 
 void SDCImpl::notifySdcClock(int hour) {
-    if (hour == 8) {
+    if (hour == kExceptionHour) {
         mFlowingDataException->putDetectTally();
-    } else if (hour == 23) {
+    } else if (hour == kNightHour) {
         mMagneticUseIf->notifyDayNight();
         mWechatProxException->notifyDayNight();
         mRegisterInfo->notifyDayNight();
@@ -116,9 +144,9 @@ void SDCImpl::notifySdcClock(int hour) {
 }
 
 void SDCImpl::notifySdcReset(int hour) {
-    if (hour == 8) {
+    if (hour == kExceptionHour) {
         mFlowingDataException->notifyFlowReset();
-    } else if (hour == 23) {
+    } else if (hour == kNightHour) {
         mMagneticUseIf->notifyMagReset();
         mWechatProxException->resetWechatCount();
         mRegisterInfo->notifyRegisterInfoReset();
@@ -126,19 +154,19 @@ void SDCImpl::notifySdcReset(int hour) {
 }
 
 void SDCImpl::putRgbShotTally(int hour) {
-    if (hour == 7) mRgbShot->putRgbShotTally();
+    if (hour == kMorningHour) mRgbShot->putRgbShotTally();
 }
 
 void SDCImpl::notifyRgbShotReset(int hour) {
-    if (hour == 7) mRgbShot->notifyRgbShotReset();
+    if (hour == kMorningHour) mRgbShot->notifyRgbShotReset();
 }
 
 void SDCImpl::putPhoneOpenUltraTally(int hour) {
-    if (hour == 7) UltraException::getInstance()->putPhoneOpenUltraTally();
+    if (hour == kMorningHour) UltraException::getInstance()->putPhoneOpenUltraTally();
 }
 
 void SDCImpl::notifyUltraReset(int hour) {
-    if (hour == 7) UltraException::getInstance()->notifyUltraReset();
+    if (hour == kMorningHour) UltraException::getInstance()->notifyUltraReset();
 }
 
 }  // namespace android

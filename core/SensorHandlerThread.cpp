@@ -3,6 +3,10 @@
 #include <cstdint>
 #include <limits>
 
+#include <utils/Errors.h>
+
+#include "core/Log.h"
+
 namespace android {
 
 Mutex SensorHandlerThread::sLock;
@@ -23,7 +27,14 @@ SensorHandlerThread::SensorHandlerThread(const char* name, int priority)
       : Thread(/*canCallJava=*/true),
         mLooper(new Looper(/*allowNonCallbacks=*/false)),
         mQuit(false) {
-    run(name, priority, 0);
+    // If the thread cannot be created, `run` drops the reference that it took. Without another one
+    // that would destroy the object under construction.
+    incStrong(this);
+    if (run(name, priority, 0) == OK) {
+        decStrong(this);  // the thread holds its own
+    } else {
+        SENSOR_PRIV_LOGE("%s: the thread cannot be created", name);
+    }
 }
 
 SensorHandlerThread::~SensorHandlerThread() {

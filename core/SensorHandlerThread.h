@@ -31,7 +31,11 @@ public:
     /** The single instance; the first call creates it and so starts the thread. Locks `sLock`. */
     static SensorHandlerThread* getInstance();
 
-    /** Starts the thread at once, with that name and priority and the default stack size. */
+    /**
+     * Starts the thread at once, with that name and priority and the default stack size. If the
+     * thread cannot be created, an error goes to the log, messages queue up and are never
+     * delivered, and the object is never destroyed.
+     */
     SensorHandlerThread(const char* name, int priority);
 
     /** Ends the loop as `quit()` does; does not wait for the thread. */

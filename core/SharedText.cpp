@@ -1,14 +1,23 @@
 #include "core/SharedText.h"
 
+#include <algorithm>
+
 namespace android {
 
-void initSharedText(std::string* text, const char* value) {
-    text->reserve(255);
-    text->assign(value);
+SharedText::SharedText(const std::string& text) {
+    set(text);
 }
 
-void setSharedText(std::string* text, const std::string& value) {
-    text->assign(value);
+void SharedText::set(const std::string& text) {
+    const size_t size = std::min(text.size(), kMaxBytes);
+    for (size_t i = 0; i < size; ++i) mBytes[i].store(text[i], std::memory_order_relaxed);
+    mSize.store(size, std::memory_order_relaxed);
+}
+
+std::string SharedText::get() const {
+    std::string text(mSize.load(std::memory_order_relaxed), '\0');
+    for (size_t i = 0; i < text.size(); ++i) text[i] = mBytes[i].load(std::memory_order_relaxed);
+    return text;
 }
 
 }  // namespace android

@@ -1,17 +1,34 @@
 #pragma once
 
+#include <array>
+#include <atomic>
+#include <cstddef>
 #include <string>
 
 namespace android {
 
-// Names that threads write and read without a lock. A race may mix two names; it must not touch
-// freed memory, so such a text never outgrows its first storage as long as names are no longer than
-// the platform allows, 255 bytes.
+/**
+ * A name that several threads write and read without a lock.
+ *
+ * It holds up to 1023 bytes, NULs included. A longer name is cut there.
+ *
+ * All operations may be called from any thread at any time and never wait. A call that runs beside
+ * a `set` may return a mix of the old name and the new one. Two `set`s that run at once may leave
+ * such a mix behind until the next `set`.
+ */
+class SharedText {
+public:
+    explicit SharedText(const std::string& text);
 
-/** Gives `text`, which nobody else knows yet, its storage and its first value. */
-void initSharedText(std::string* text, const char* value);
+    void set(const std::string& text);
+    std::string get() const;
 
-/** Copies `value` into the storage of `text`. */
-void setSharedText(std::string* text, const std::string& value);
+private:
+    static constexpr size_t kMaxBytes = 1023;
+
+    // The storage never moves, so that a race can only mix bytes.
+    std::array<std::atomic<char>, kMaxBytes> mBytes{};
+    std::atomic<size_t> mSize{0};
+};
 
 }  // namespace android

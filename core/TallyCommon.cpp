@@ -8,13 +8,20 @@
 #include <cutils/properties.h>
 #include <unistd.h>
 
-#include "core/CounterProperty.h"
 #include "core/Log.h"
+#include "core/ParseInt32.h"
 
 /** Of the device's telemetry library: three NUL-terminated texts. */
 extern "C" void track_event(const char* moduleId, const char* eventId, const char* payload);
 
 namespace android {
+
+namespace {
+
+constexpr char kModuleId[] = "N273";
+constexpr useconds_t kBootPollUs = 200'000;
+
+}  // namespace
 
 Mutex TallyCommon::sLock;
 TallyCommon* TallyCommon::mTallyCommon = nullptr;
@@ -25,7 +32,7 @@ TallyCommon* TallyCommon::getInstance() {
     return mTallyCommon;
 }
 
-TallyCommon::TallyCommon() : mModuleId("N273"), mBootFinished(false) {}
+TallyCommon::TallyCommon() : mModuleId(kModuleId), mBootFinished(false) {}
 
 void TallyCommon::trackEvent(std::string eventId, std::map<std::string, std::string> params) {
     setTally({std::move(eventId), convertMapToTally(std::move(params))});
@@ -59,17 +66,16 @@ std::string TallyCommon::longToStr(long value) {
 
 void TallyCommon::splitStr(const std::string& text, const std::string& delimiter,
                            std::vector<std::string>& out) {
-    // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): `text` may lie in `out`
-    const std::string source = text;
-    out.clear();
+    std::vector<std::string> pieces;  // `text` and `delimiter` may lie in `out`
     size_t begin = 0;
-    size_t end = delimiter.empty() ? std::string::npos : source.find_first_of(delimiter);
+    size_t end = delimiter.empty() ? std::string::npos : text.find_first_of(delimiter);
     while (end != std::string::npos) {
-        out.push_back(source.substr(begin, end - begin));
+        pieces.push_back(text.substr(begin, end - begin));
         begin = end + delimiter.size();
-        end = source.find(delimiter, begin);
+        end = text.find(delimiter, begin);
     }
-    out.push_back(source.substr(std::min(begin, source.size())));
+    pieces.push_back(text.substr(std::min(begin, text.size())));
+    out = std::move(pieces);
 }
 
 void TallyCommon::BootNotFinish() {
@@ -82,7 +88,7 @@ void TallyCommon::BootNotFinish() {
             mBootFinished = true;
             return;
         }
-        usleep(200'000);
+        usleep(kBootPollUs);
     }
 }
 

@@ -48,8 +48,8 @@ public:
 
     /**
      * Cuts `text` at every `delimiter` and puts the pieces, empty ones included, into `out`, which
-     * then holds at least one piece. Meant for delimiters of one character: of a longer one, the
-     * first cut is made at any of its characters.
+     * then holds at least one piece. `text` and `delimiter` may lie in `out`. Meant for delimiters
+     * of one character: of a longer one, the first cut is made at any of its characters.
      */
     void splitStr(const std::string& text, const std::string& delimiter,
                   std::vector<std::string>& out);

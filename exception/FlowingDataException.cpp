@@ -6,12 +6,14 @@
 #include <utility>
 
 #include <cutils/properties.h>
+#include <hardware/sensors.h>
 #include <strings.h>
 #include <utils/Timers.h>
 
 #include "core/Arithmetic.h"
-#include "core/CounterProperty.h"
+#include "core/Connection.h"
 #include "core/Log.h"
+#include "core/ParseInt32.h"
 #include "core/SensorHandlerThread.h"
 #include "core/TallyCommon.h"
 
@@ -31,18 +33,20 @@ constexpr struct {
     int sensorTypes[4];
     const char* eventId;
 } kFamilyTable[] = {
-        {{1, 9, 10, 35}, "N273|10003"},  // accelerometer, gravity, linear acceleration
-        {{4, 16}, "N273|10004"},         // gyroscope
-        {{2, 14}, "N273|10005"},         // magnetic field
-        {{5}, "N273|10006"},             // light
-        {{3}, "N273|10007"},             // orientation
-        {{11}, "N273|10008"},            // rotation vector
+        {{SENSOR_TYPE_ACCELEROMETER, SENSOR_TYPE_GRAVITY, SENSOR_TYPE_LINEAR_ACCELERATION,
+          SENSOR_TYPE_ACCELEROMETER_UNCALIBRATED},
+         "N273|10003"},
+        {{SENSOR_TYPE_GYROSCOPE, SENSOR_TYPE_GYROSCOPE_UNCALIBRATED}, "N273|10004"},
+        {{SENSOR_TYPE_MAGNETIC_FIELD, SENSOR_TYPE_MAGNETIC_FIELD_UNCALIBRATED}, "N273|10005"},
+        {{SENSOR_TYPE_LIGHT}, "N273|10006"},
+        {{SENSOR_TYPE_ORIENTATION}, "N273|10007"},
+        {{SENSOR_TYPE_ROTATION_VECTOR}, "N273|10008"},
 };
+constexpr char kSessionEventId[] = "N273|10010";
 constexpr int kNoSlot = -1;
 
 constexpr int kCountDelayMs = 11'000;
 constexpr int kResetDelayMs = 2000;
-constexpr int32_t kLastCounted = 2147483645;
 
 constexpr char kRecordProperty[] = "persist.zuno.flow.detect.count";
 constexpr char kNoRecord[] = "unknown";
@@ -68,10 +72,6 @@ int slotOfType(int sensorType) {
 int slotOfCode(int code, int first) {
     const int end = first + static_cast<int>(std::size(kFamilyTable));
     return code >= first && code < end ? code - first : kNoSlot;
-}
-
-bool contains(const std::string& text, const char* part) {
-    return text.find(part) != std::string::npos;
 }
 
 }  // namespace
@@ -199,12 +199,12 @@ std::string FlowingDataException::convertIntToString(int value) {
 void FlowingDataException::setProxEnable(std::string pkg, std::string opPkg) {
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
     Mutex::Autolock lock(mProxLock);
-    ProxInfo& info = mProxInfoMap[pkg + "/" + opPkg];
+    ProxInfo& info = mProxInfoMap[connectionKey(pkg, opPkg)];
     if (info.startTime != 0) {
         info.duration = addWrapped(info.duration, secondsBetween(info.startTime, now));
     }
     info.startTime = now;
-    info.count = addWrapped(std::max(info.count, 0), 1);
+    nestEnable(&info.count);
 }
 
 void FlowingDataException::setProxDisable(std::string pkg, std::string opPkg) {
@@ -212,11 +212,10 @@ void FlowingDataException::setProxDisable(std::string pkg, std::string opPkg) {
     int32_t seconds = 0;
     {
         Mutex::Autolock lock(mProxLock);
-        const auto it = mProxInfoMap.find(pkg + "/" + opPkg);
+        const auto it = mProxInfoMap.find(connectionKey(pkg, opPkg));
         if (it == mProxInfoMap.end()) return;
         ProxInfo& info = it->second;
-        info.count = addWrapped(info.count, -1);
-        if (info.count != 0) return;
+        if (!unnestEnable(&info.count)) return;
         seconds = addWrapped(info.duration, secondsBetween(info.startTime, now));
         mProxInfoMap.erase(it);
     }
@@ -225,11 +224,11 @@ void FlowingDataException::setProxDisable(std::string pkg, std::string opPkg) {
 
 void FlowingDataException::setProxTally(std::string pkg, std::string opPkg, int seconds) {
     for (const char* name : kSystemPackages) {
-        if (contains(pkg, name) || contains(opPkg, name)) return;
+        if (nameHolds(pkg, name) || nameHolds(opPkg, name)) return;
     }
     TallyCommon* tally = TallyCommon::getInstance();
-    tally->trackEvent("N273|10010",
-                      {{"pkg", pkg + "/" + opPkg}, {"time", tally->intToStr(seconds)}});
+    tally->trackEvent(kSessionEventId,
+                      {{"pkg", connectionKey(pkg, opPkg)}, {"time", tally->intToStr(seconds)}});
 }
 
 }  // namespace android

@@ -7,10 +7,10 @@
 #include <utils/SystemClock.h>
 
 #include "core/Arithmetic.h"
+#include "core/Connection.h"
 #include "core/CounterProperty.h"
 #include "core/Log.h"
 #include "core/SensorHandlerThread.h"
-#include "core/SharedText.h"
 #include "core/TallyCommon.h"
 
 namespace android {
@@ -34,7 +34,6 @@ enum : int { ROUTE_INVALID = 100, DEVICE_INVALID = 101, RX_CLOSED = 102, DAILY =
 enum : int { DATA_MARKER = 3, DATA_ENERGY = 4, BACKGROUND_MARKER = 301, FLUCTUANT_MARKER = 302 };
 
 constexpr int kLoadDelayMs = 2000;
-constexpr int32_t kLastCounted = 2147483645;
 constexpr char kEventId[] = "N273|10011";
 constexpr char kUnknownPackage[] = "unknown";
 constexpr char kInCallPackage[] = "com.android.incallui";
@@ -91,8 +90,9 @@ UltraException* UltraException::getInstance() {
     return mUltraException;
 }
 
-UltraException::UltraException() : mHandler(new UltraExceptionHandler) {
-    initSharedText(&mPackageName, kUnknownPackage);
+UltraException::UltraException()
+      : mHandler(new UltraExceptionHandler),
+        mPackageName(kUnknownPackage) {
     if (isOverseas) return;
     SensorHandlerThread::getInstance()->sendMessageDelayed(mHandler, MSG_LOAD, kLoadDelayMs);
 }
@@ -110,7 +110,7 @@ void UltraException::doAction(int code, const UltraExceptionInfo& info) {
     if (code == MSG_PHONE_STATE) {
         mPhoneState = info.phoneState;
     } else if (code == MSG_ENABLED) {
-        setSharedText(&mPackageName, info.packageName);
+        mPackageName.set(info.packageName);
     }
     SensorHandlerThread* thread = SensorHandlerThread::getInstance();
     thread->removeMessage(mHandler, code);
@@ -133,7 +133,7 @@ void UltraException::setUltraEnergy(const sensors_event_t& event) {
 void UltraException::resetUltraStatus() {
     mFluctuantEnergy = 0;
     mBackgroundEnergy = 0;
-    setSharedText(&mPackageName, kUnknownPackage);
+    mPackageName.set(kUnknownPackage);
 }
 
 void UltraException::putPhoneOpenUltraTally() {
@@ -166,7 +166,7 @@ void UltraException::increaseEnableUltrasoundCount() {
 
 void UltraException::updateUltraInvalid() {
     if (mInvalidCount > kLastCounted) return;
-    if (mPackageName.find(kInCallPackage) == std::string::npos) return;
+    if (!nameHolds(mPackageName.get(), kInCallPackage)) return;
     if (mInvalidCountedInCall) return;
     mInvalidCountedInCall = true;
     ++mInvalidCount;
@@ -199,7 +199,7 @@ void UltraException::trackEvent(std::string eventId, int code, int count) {
 
 void UltraException::sendEvent(std::string eventId, int code, int32_t failures, int32_t uses) {
     TallyCommon::getInstance()->trackEvent(
-            std::move(eventId), {{"pkg", mPackageName},
+            std::move(eventId), {{"pkg", mPackageName.get()},
                                  {"ultraExpired", std::to_string(code)},
                                  {"TempInvalidRate", joined(failures, uses)},
                                  {"ultraEnergy", joined(mBackgroundEnergy, mFluctuantEnergy)}});
@@ -207,7 +207,7 @@ void UltraException::sendEvent(std::string eventId, int code, int32_t failures, 
 
 void UltraException::updatePhoneOpenUltraCount() {
     if (mPhoneState != 0) {
-        if (mPackageName != kUnknownPackage) mUltraOpenedInCall = true;
+        if (mPackageName.get() != kUnknownPackage) mUltraOpenedInCall = true;
         return;
     }
     mInvalidCountedInCall = false;

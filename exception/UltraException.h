@@ -9,6 +9,7 @@
 #include <utils/RefBase.h>
 
 #include "core/Export.h"
+#include "core/SharedText.h"
 
 namespace android {
 
@@ -16,8 +17,9 @@ class CounterProperty;
 
 /** What the host tells with an action of the ultrasonic proximity sensor. */
 struct UltraExceptionInfo {
-    std::string packageName;  // the app that uses the sensor; read with an enable (3)
-    int32_t phoneState = 0;   // 0: no phone call; read with a change of the phone state (6)
+    // The app that uses the sensor; read with an enable (3). Bytes past 1023 are cut.
+    std::string packageName;
+    int32_t phoneState = 0;  // 0: no phone call; read with a change of the phone state (6)
 };
 
 /** For the actions that read nothing of it. Each source file that includes this has its own. */
@@ -163,7 +165,7 @@ private:
     int32_t mRxCloseCount = 0;
     int32_t mFluctuantEnergy = 0;
     int32_t mBackgroundEnergy = 0;
-    std::string mPackageName;            // of the latest enable, "unknown": none; a shared text
+    SharedText mPackageName;             // of the latest enable, "unknown": none
     int32_t mPhoneState = 0;             // 0: no phone call
     bool mUltraOpenedInCall = false;     // the present call uses the sensor
     bool mInvalidCountedInCall = false;  // the present call has been counted as failed

@@ -10,7 +10,8 @@
 #include <utils/Timers.h>
 
 #include "core/Arithmetic.h"
-#include "core/CounterProperty.h"
+#include "core/Connection.h"
+#include "core/ParseInt32.h"
 #include "core/SensorHandlerThread.h"
 #include "core/StyledJson.h"
 #include "core/TallyCommon.h"
@@ -26,8 +27,6 @@ constexpr int kCheckDelayMs = 100;
 constexpr int kLastCheck = 5;
 constexpr int64_t kMinSampleSpanNs = 20'000'001;
 
-constexpr int kAccelerometer = 1;
-constexpr int kProximity = 8;
 constexpr int kNear = 0;
 constexpr int kFar = 5;
 
@@ -39,10 +38,6 @@ constexpr char kChatApp[] = "com.tencent.mm";
 constexpr char kDisplayController[] = "com.android.server.display.DisplayPowerController";
 constexpr char kCountProperty[] = "persist.zuno.wechat.count.info";
 constexpr char kEventId[] = "N273|10013";
-
-bool holds(const std::string& name, const char* part) {
-    return name.find(part) != std::string::npos;
-}
 
 }  // namespace
 
@@ -83,10 +78,11 @@ WechatProxException::~WechatProxException() = default;
 
 void WechatProxException::enableSuccess(bool enabled, int type, const std::string& pkg,
                                         const std::string& opPkg) {
-    if (type == kAccelerometer && enabled && holds(opPkg, kChatApp)) mAccSamples.fill({});
-    if (type != kProximity) return;
+    const bool isChatApp = nameHolds(opPkg, kChatApp);
+    if (type == SENSOR_TYPE_ACCELEROMETER && enabled && isChatApp) mAccSamples.fill({});
+    if (type != SENSOR_TYPE_PROXIMITY) return;
     handleProxWakeLock(pkg, enabled);
-    if (!holds(opPkg, kChatApp)) return;
+    if (!isChatApp) return;
 
     if (enabled) {
         mNearSeen = false;
@@ -105,16 +101,16 @@ void WechatProxException::enableSuccess(bool enabled, int type, const std::strin
 }
 
 void WechatProxException::handleProxWakeLock(const std::string& pkg, bool enabled) {
-    if (!holds(pkg, kDisplayController)) return;
+    if (!nameHolds(pkg, kDisplayController)) return;
     mDisplayProxEnabled = enabled;
     if (mWechatProxEnabled && enabled && isVoiceCall()) mLockCount = addWrapped(mLockCount, 1);
 }
 
 void WechatProxException::process(const sensors_event_t& event) {
     if (!mWechatProxEnabled) return;
-    if (event.type == kAccelerometer) {
+    if (event.type == SENSOR_TYPE_ACCELEROMETER) {
         getAccData(event);
-    } else if (event.type == kProximity) {
+    } else if (event.type == SENSOR_TYPE_PROXIMITY) {
         processProxEvent(event);
     }
 }

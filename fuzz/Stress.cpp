@@ -1,6 +1,9 @@
 /**
  * Calls everything that a trace can call, at random and from eight threads at once, in real time:
  * food for the sanitizers. The argument is the number of calls of each thread.
+ *
+ * First and last come two plain flags that the library shares between threads: the end of the boot
+ * and of the worker.
  */
 
 #include <cstdio>
@@ -9,10 +12,12 @@
 #include <thread>
 
 #include <android/log.h>
-#include <unistd.h>
-
+#include "core/SensorHandlerThread.h"
+#include "core/TallyCommon.h"
+#include "platform/PropertyService.h"
 #include "platform/Telemetry.h"
 #include "trace/CallTable.h"
+#include "usage/MagneticUseIf.h"
 
 extern "C" const trace::CallModule* sensor_replay_calls();
 
@@ -20,6 +25,8 @@ namespace trace {
 namespace {
 
 constexpr int kThreads = 8;
+constexpr size_t kMaxNameBytes = 100'000;
+constexpr int kUltraEnabled = 3;
 
 using Random = std::mt19937;
 
@@ -32,7 +39,9 @@ T make(Random& random) {
     if constexpr (std::is_same_v<T, std::string>) {
         constexpr const char* kNames[] = {"", "com.example.a", "com.example.b", "com.tencent.mm",
                                           "com.android.server.display.DisplayPowerController"};
-        return kNames[random() % std::size(kNames)];
+        const size_t index = random() % (std::size(kNames) + 1);
+        return index < std::size(kNames) ? kNames[index]
+                                         : std::string(random() % (kMaxNameBytes + 1), 'x');
     } else if constexpr (std::is_same_v<T, IntList>) {
         IntList list(random() % 14);
         for (int32_t& value : list) value = pick(random, {0, 1, 2, 3, 7, 10});
@@ -74,11 +83,32 @@ constexpr std::vector<Argument> (*kArguments[])(Random&) = {
 
 void run(unsigned seed, int calls) {
     Random random(seed);
+    android::TallyCommon::getInstance()->BootNotFinish();
     const CallModule* library = sensor_replay_calls();
     for (int i = 0; i < calls; ++i) {
         const size_t index = random() % std::size(kArguments);
         library->call(index, kArguments[index](random));
     }
+}
+
+/** Names that grow, told and read at once: a text whose storage moves would be read when freed. */
+void growNames(unsigned seed) {
+    android::UltraException* ultra = android::UltraException::getInstance();
+    android::MagneticUseIf* orientation = android::MagneticUseIf::getInstance();
+    for (size_t bytes = seed; bytes < kMaxNameBytes; bytes += 500) {
+        const std::string name(bytes, 'x');
+        ultra->doAction(kUltraEnabled, {name, 0});
+        ultra->trackEvent(name, 0, 0);
+        orientation->setOrientationEnable("", "");
+        orientation->setOrientationDisable(name, "");
+    }
+}
+
+template <typename Work>
+void inAllThreads(Work work) {
+    std::vector<std::thread> threads;
+    for (unsigned seed = 0; seed < kThreads; ++seed) threads.emplace_back(work, seed);
+    for (std::thread& thread : threads) thread.join();
 }
 
 }  // namespace
@@ -89,12 +119,10 @@ int main(int argc, char** argv) {
     __android_log_set_logger([](const __android_logger_data*, const char*) {});
     platform::observeEvents([](const char*, const char*, const char*) {});
     mLogSwitch = 1;
-    std::vector<std::thread> threads;
-    for (unsigned seed = 0; seed < trace::kThreads; ++seed) {
-        threads.emplace_back(trace::run, seed, calls);
-    }
-    for (std::thread& thread : threads) thread.join();
+    platform::setDeviceProperty("service.bootanim.exit", "1");
+    trace::inAllThreads(trace::growNames);
+    trace::inAllThreads([calls](unsigned seed) { trace::run(seed, calls); });
+    trace::inAllThreads([](unsigned) { android::SensorHandlerThread::getInstance()->quit(); });
+    android::SensorHandlerThread::getInstance()->join();
     std::printf("%d threads made %d calls each\n", trace::kThreads, calls);
-    std::fflush(stdout);
-    _exit(0);  // the worker is still at it: the library's mutexes must not be destroyed
 }

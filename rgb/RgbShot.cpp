@@ -18,6 +18,7 @@ enum : int { MSG_LOAD_COUNT = 1, MSG_SAVE_COUNT = 2 };
 constexpr int kLoadDelayMs = 2000;
 constexpr int kSaveDelayMs = 500;
 
+constexpr char kEventId[] = "N273|10009";
 constexpr CounterProperty kCountProperty("persist.zuno.rgb.shot.count");
 
 }  // namespace
@@ -75,7 +76,7 @@ void RgbShot::putRgbShotTally() {
     mLock.lock();
     std::map<std::string, std::string> params{{"count", tally->intToStr(mRgbShotCount)}};
     mLock.unlock();
-    tally->trackEvent("N273|10009", std::move(params));
+    tally->trackEvent(kEventId, std::move(params));
     // Samples counted while the report was being sent go with the reset.
     Mutex::Autolock lock(mLock);
     mRgbShotCount = 0;

@@ -5,8 +5,8 @@
 #include <cutils/properties.h>
 #include <time.h>
 
-#include "core/CounterProperty.h"
 #include "core/Log.h"
+#include "core/ParseInt32.h"
 #include "rgb/LightSensorState.h"
 
 namespace android {
@@ -117,20 +117,24 @@ void RgbShotManager::clearQueue() {
 }
 
 int RgbShotManager::getWaitCount() {
-    Mutex::Autolock lock(mLock);
-    if (!mShotQueue.empty()) {  // see queuePop
-        mPendingTime = mShotQueue.top().first;
-        mPendingShots = mShotQueue.top().second;
-    }
+    noteFirst();
     return 0;
+}
+
+bool RgbShotManager::noteFirst() {
+    Mutex::Autolock lock(mLock);
+    if (mShotQueue.empty()) return false;
+    mPendingTime = mShotQueue.top().first;
+    mPendingShots = mShotQueue.top().second;
+    return true;
 }
 
 void RgbShotManager::isTimeToShot() {
     const long long now = getCurrentMs();
-    // Each access locks for itself: an entry pushed in between may be dropped in another's place.
-    if (!mHasPending && !isEmpty()) {
+    // Each access locks for itself. Between them another thread may empty the queue, and then
+    // nothing becomes pending, or push an entry, which may be dropped in another's place.
+    if (!mHasPending && !isEmpty() && noteFirst()) {
         mHasPending = true;
-        getWaitCount();
         queuePop();
     }
     if (mHasPending && mPendingTime < now) {

@@ -132,6 +132,9 @@ public:
 private:
     using Entry = std::pair<long long, int>;  // when due, the budget that it raises to
 
+    /** `getWaitCount`, but returns whether there was an entry to note. */
+    SENSOR_PRIV_HIDDEN bool noteFirst();
+
     // Plain fields, read and written by every caller without a lock (see above).
     int32_t mShotBudget;
     int32_t mTestMode;

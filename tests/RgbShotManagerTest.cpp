@@ -1,13 +1,36 @@
 #include "rgb/RgbShotManager.h"
 
 #include <algorithm>
+#include <functional>
 #include <random>
 #include <string>
 #include <vector>
 
+#include <dlfcn.h>
+#include <pthread.h>
+
 #include "core/Log.h"
 #include "rgb/LightSensorState.h"
 #include "tests/DeviceTest.h"
+
+namespace {
+
+/** What another thread does just before this one takes its `locksUntilThen`-th lock from now. */
+thread_local const std::function<void()>* otherThread = nullptr;
+thread_local int locksUntilThen = 0;
+
+}  // namespace
+
+/** The sanitizers' own `pthread_mutex_lock`, in their builds. */
+extern "C" int __interceptor_pthread_mutex_lock(pthread_mutex_t* mutex) __attribute__((weak));
+
+extern "C" int pthread_mutex_lock(pthread_mutex_t* mutex) noexcept {
+    static const auto libcLock =
+            reinterpret_cast<int (*)(pthread_mutex_t*)>(dlsym(RTLD_NEXT, "pthread_mutex_lock"));
+    if (locksUntilThen > 0 && --locksUntilThen == 0) (*otherThread)();
+    if (__interceptor_pthread_mutex_lock != nullptr) return __interceptor_pthread_mutex_lock(mutex);
+    return libcLock(mutex);
+}
 
 namespace android {
 namespace {
@@ -100,6 +123,33 @@ TEST_F(RgbShotManagerTest, ClearingTheQueueLeavesThePendingEntry) {
     EXPECT_TRUE(manager.isEmpty());
     EXPECT_FALSE(manager.stopRgbThread());
     EXPECT_EQ(allowedAt(2001, &manager), 1);
+}
+
+TEST_F(RgbShotManagerTest, NothingIsGrantedIfAnotherThreadIsFasterThanTheTake) {
+    const struct {
+        const char* name;
+        void (*otherThread)(RgbShotManager*);
+        int later;
+    } kCases[] = {
+            {"clears the queue", [](RgbShotManager* m) { m->clearQueue(); }, 0},
+            {"takes the entry", [](RgbShotManager* m) { m->allowRgbShot(); }, 3},
+    };
+    double ms = 0;
+    for (const auto& other : kCases) {
+        SCOPED_TRACE(other.name);
+        RgbShotManager& manager = newManager();
+        manager.setRgbShotDelay(5, -1);
+        EXPECT_EQ(allowedAt(ms, &manager), 5);
+        manager.setRgbShotDelay(3, 10);
+        const std::function<void()> act = [&] { other.otherThread(&manager); };
+        otherThread = &act;
+        locksUntilThen = 2;
+        EXPECT_FALSE(manager.allowRgbShot());
+        EXPECT_EQ(locksUntilThen, 0);
+        EXPECT_EQ(manager.stopRgbThread(), other.later == 0);
+        EXPECT_EQ(allowedAt(ms += 11, &manager), other.later);
+        EXPECT_TRUE(manager.stopRgbThread());
+    }
 }
 
 TEST_F(RgbShotManagerTest, TestModeIsReadFromThePropertyAndAllowsEverything) {

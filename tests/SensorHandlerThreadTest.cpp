@@ -3,8 +3,12 @@
 #include <limits>
 #include <utility>
 
+#include <utils/AndroidThreads.h>
+
+#include "core/SDCImpl.h"
 #include "replay/VirtualClock.h"
 #include "tests/DeviceTest.h"
+#include "usage/MagneticUseIf.h"
 
 namespace android {
 namespace {
@@ -92,6 +96,30 @@ TEST_F(SensorHandlerThreadTest, AfterQuittingNothingIsDelivered) {
     // What was due when the loop was told to end still ran in its last turn.
     EXPECT_EQ(mLines, (Lines{"50 a2"}));
     EXPECT_FALSE(mThread->isRunning());
+}
+
+/** Creates no thread; 0 is the failure. */
+int createNoThread(android_thread_func_t, void*, const char*, int32_t, size_t,
+                   android_thread_id_t*) {
+    return 0;
+}
+
+class WorkerlessTest : public DeviceTest {};
+
+TEST_F(WorkerlessTest, TheLibraryLivesAndOnlyItsDeferredWorkIsUndone) {
+    androidSetCreateThreadFunc(createNoThread);
+    MagneticUseIf::getInstance()->sendBootShutdownRebootState(0);
+    EXPECT_EQ(taken(), Lines{}) << "nothing to do, so no thread yet";
+    SDCImpl* sdc = SDCImpl::getInstance();
+    EXPECT_EQ(taken(), (Lines{"0 log 6 sensor_native_handler: the thread cannot be created"}));
+    sdc->sendBootShutdownRebootState(1);
+    sdc->setRgbShotCount();
+    sdc->putRgbShotTally(7);
+    sdc->notifySdcClock(8);
+    sdc->notifySdcReset(8);
+    EXPECT_EQ(taken(), (Lines{"0 N273|10009 count:1"}));
+    EXPECT_FALSE(SensorHandlerThread::getInstance()->isRunning());
+    SensorHandlerThread::getInstance()->quit();
 }
 
 }  // namespace

@@ -55,8 +55,14 @@ TEST_F(TallyCommonTest, CutsATextAtItsDelimiterAndKeepsEmptyPieces) {
         mTally->splitStr(text, delimiter, pieces);
         EXPECT_EQ(pieces, expected) << '"' << text << "\" at \"" << delimiter << '"';
     }
-    Lines pieces{"1_2"};
-    mTally->splitStr(pieces[0], "_", pieces);
+}
+
+TEST_F(TallyCommonTest, CutsATextThatLiesWhereThePiecesGoAsItsDelimiterMay) {
+    const std::string kLong(100, 'x');
+    Lines pieces{kLong + "_" + kLong, "_"};
+    mTally->splitStr(pieces[0], pieces[1], pieces);
+    EXPECT_EQ(pieces, (Lines{kLong, kLong}));
+    mTally->splitStr("1" + kLong + "2", pieces[1], pieces);
     EXPECT_EQ(pieces, (Lines{"1", "2"}));
 }
 

@@ -59,6 +59,18 @@ TEST_F(UltraExceptionTest, EnergiesAreCutToWholeNumbers) {
     }
 }
 
+TEST_F(UltraExceptionTest, NamesAreKeptUpTo1023Bytes) {
+    UltraException* ultra = loaded();
+    for (const size_t length : {1023, 1024, 100'000, 255, 256, 0, 1}) {
+        const std::string name = std::string(length, 'a') + (length < 1023 ? kInCall : "");
+        act(ENABLED, {name, 0});
+        taken();
+        ultra->trackEvent("", 0, 0);
+        EXPECT_NE(taken().back().find("&pkg:" + name.substr(0, 1023) + "&"), std::string::npos)
+                << length;
+    }
+}
+
 TEST_F(UltraExceptionTest, AnActionThatStillWaitsMovesBehindTheOthers) {
     UltraException* ultra = loaded();
     ultra->doAction(ENABLED, {"com.example.first", 0});

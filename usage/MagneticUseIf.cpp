@@ -1,6 +1,5 @@
 #include "usage/MagneticUseIf.h"
 
-#include <algorithm>
 #include <map>
 #include <vector>
 
@@ -8,12 +7,13 @@
 #include <utils/Timers.h>
 
 #include "core/Arithmetic.h"
+#include "core/Connection.h"
 #include "core/CounterProperty.h"
 #include "core/Log.h"
-#include "core/RankedList.h"
+#include "core/ParseInt32.h"
 #include "core/SensorHandlerThread.h"
-#include "core/SharedText.h"
 #include "core/TallyCommon.h"
+#include "usage/RankedList.h"
 
 namespace android {
 
@@ -66,9 +66,7 @@ MagneticUseIf* MagneticUseIf::getInstance() {
     return mMagneticUseIf;
 }
 
-MagneticUseIf::MagneticUseIf() : mHandler(new MagneticUseIfHandler) {
-    initSharedText(&mLastPkg, "unknow");
-}
+MagneticUseIf::MagneticUseIf() : mLastPkg("unknow"), mHandler(new MagneticUseIfHandler) {}
 
 void MagneticUseIf::sendChargeState(int state) {
     if (mLogSwitch != 0) {
@@ -87,15 +85,15 @@ void MagneticUseIf::sendChargeState(int state) {
 
 void MagneticUseIf::sendBootShutdownRebootState(int state) {
     if (mLogSwitch != 0) SENSOR_PRIV_LOGD("boot state = %d", state);
-    SensorHandlerThread* thread = SensorHandlerThread::getInstance();
     if (state == kBooted) {
         mBooted = true;
-        thread->removeMessage(mHandler, MSG_LOAD);
-        thread->sendMessage(mHandler, MSG_LOAD);
-    } else if (mBooted) {
-        thread->removeMessage(mHandler, MSG_SAVE);
-        thread->sendMessage(mHandler, MSG_SAVE);
+    } else if (!mBooted) {
+        return;  // totals that were never loaded must not replace the stored ones
     }
+    const int code = state == kBooted ? MSG_LOAD : MSG_SAVE;
+    SensorHandlerThread* thread = SensorHandlerThread::getInstance();
+    thread->removeMessage(mHandler, code);
+    thread->sendMessage(mHandler, code);
 }
 
 void MagneticUseIf::sendUsedTime(int uds) {
@@ -116,7 +114,7 @@ void MagneticUseIf::setOrientationEnable(std::string pkg, std::string opPkg) {
 }
 
 void MagneticUseIf::setOrientationDisable(std::string pkg, std::string opPkg) {
-    if (mEnableNumbers == 1 && !pkg.empty()) setSharedText(&mLastPkg, pkg);
+    if (mEnableNumbers == 1 && !pkg.empty()) mLastPkg.set(pkg);
     mEnableNumbers = addWrapped(mEnableNumbers, -1);
     if (mLogSwitch != 0) SENSOR_PRIV_LOGD("Disable mEnableNumbers = %d", mEnableNumbers);
     dealWithOrientationEnableDisable(std::move(pkg), std::move(opPkg), false);
@@ -172,7 +170,7 @@ void MagneticUseIf::dealWithChargeAndOrientationEnableState() {
 void MagneticUseIf::dealWithOrientationEnableDisable(std::string pkg, std::string opPkg,
                                                      bool enable) {
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
-    const std::string key = pkg + "/" + opPkg;
+    const std::string key = connectionKey(pkg, opPkg);
     Mutex::Autolock lock(mPkgLock);
     if (enable) {
         const auto it = mPkgInfoMap.try_emplace(key).first;
@@ -183,13 +181,12 @@ void MagneticUseIf::dealWithOrientationEnableDisable(std::string pkg, std::strin
         }
         info.beginTime = now;
         if (mIsChargeState) info.chargeBeginTime = now;
-        info.enableCount = addWrapped(std::max(info.enableCount, 0), 1);
+        nestEnable(&info.enableCount);
     } else {
         const auto it = mPkgInfoMap.find(key);
         if (it == mPkgInfoMap.end() || it->second.beginTime == 0) return;
         PkgInfo& info = it->second;
-        info.enableCount = addWrapped(info.enableCount, -1);
-        if (info.enableCount != 0) return;
+        if (!unnestEnable(&info.enableCount)) return;
         if (mIsChargeState) {
             updateChargeTime(it, now);
             info.chargeBeginTime = now;
@@ -215,7 +212,7 @@ void MagneticUseIf::dealWithOrientationTotalTime() {
         mTotalEndTime = systemTime(SYSTEM_TIME_MONOTONIC);
         const int64_t seconds = secondsBetween(mTotalBeginTime, mTotalEndTime);
         mTotalOrientationUT = addWrapped(mTotalOrientationUT, seconds);
-        calCurretTime(mLastPkg);
+        calCurretTime(mLastPkg.get());
         if (mLogSwitch != 0) SENSOR_PRIV_LOGD("oritt == %d", static_cast<int32_t>(seconds));
         if (mEnableNumbers < 0) mEnableNumbers = 0;
         mTotalBeginTime = 0;
@@ -228,7 +225,7 @@ void MagneticUseIf::recordTime() {
     mEndTime = systemTime(SYSTEM_TIME_MONOTONIC);
     const int64_t seconds = secondsBetween(mBeginTime, mEndTime);
     if (seconds >= 1) {
-        calCurretUseTotalTime(mLastPkg, static_cast<long>(seconds), mChargeType);
+        calCurretUseTotalTime(mLastPkg.get(), static_cast<long>(seconds), mChargeType);
         if (mLogSwitch != 0) {
             SENSOR_PRIV_LOGD("tt = %d, type = %d", static_cast<int32_t>(seconds), mChargeType);
         }

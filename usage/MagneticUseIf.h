@@ -11,6 +11,7 @@
 #include <utils/RefBase.h>
 
 #include "core/Export.h"
+#include "core/SharedText.h"
 
 namespace android {
 
@@ -71,7 +72,7 @@ public:
      * A connection was enabled, or disabled: counts it, then runs
      * `dealWithOrientationEnableDisable`, `dealWithChargeAndOrientationEnableState` and
      * `dealWithOrientationTotalTime`, in this order. The `pkg` of the disable that takes the count
-     * from 1 to 0 is the one that the report names, unless it is empty.
+     * from 1 to 0 is the one that the report names, unless it is empty, cut at 1023 bytes.
      *
      * Surplus disables take the count below 0, and it is set back only when an enabled span closes:
      * if they come while none is open, the next enables start no span until the count is 1 again.
@@ -196,7 +197,7 @@ private:
     int64_t mBeginTime = 0;
     int64_t mEndTime = 0;
 
-    std::string mLastPkg;  // what the report names; a shared text without a lock
+    SharedText mLastPkg;  // what the report names
 
     // The enabled span; times are monotonic ns, 0 while there is none.
     bool mTotalBeginCountTime = false;  // it is open

@@ -1,13 +1,13 @@
 #include "usage/RegisterConnectionList.h"
 
-#include <algorithm>
 #include <vector>
 
 #include <json/json.h>
 #include <utils/Timers.h>
 
 #include "core/Arithmetic.h"
-#include "core/RankedList.h"
+#include "core/Connection.h"
+#include "usage/RankedList.h"
 
 namespace android {
 
@@ -53,23 +53,22 @@ void RegisterConnectionList::handleEnable(const std::string& pkg, const std::str
 
     if (mCurrentRate == kNoRate || rate < mCurrentRate) mCurrentRate = rate;
 
-    const auto [it, inserted] = mConnections.try_emplace(pkg + "/" + opPkg);
+    const auto [it, inserted] = mConnections.try_emplace(connectionKey(pkg, opPkg));
     PkgRegInfo& info = it->second;
     if (inserted) info.rate = rate;
     info.beginTime = now;
     if (isDisplayOn()) info.onBeginTime = now;
-    info.enableCount = addWrapped(std::max(info.enableCount, 0), 1);
+    nestEnable(&info.enableCount);
 }
 
 void RegisterConnectionList::handleDisable(const std::string& pkg, const std::string& opPkg) {
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
     Mutex::Autolock lock(mLock);
 
-    const auto it = mConnections.find(pkg + "/" + opPkg);
+    const auto it = mConnections.find(connectionKey(pkg, opPkg));
     if (it == mConnections.end()) return;
     PkgRegInfo& ended = it->second;
-    ended.enableCount = addWrapped(ended.enableCount, -1);
-    if (ended.enableCount != 0) return;
+    if (!unnestEnable(&ended.enableCount)) return;
 
     if (ended.rate != mCurrentRate) {
         ended.beginTime = 0;

@@ -1,5 +1,7 @@
 #include "usage/RegisterInfo.h"
 
+#include <hardware/sensors.h>
+
 #include "core/SensorHandlerThread.h"
 #include "core/TallyCommon.h"
 #include "usage/RegisterConnectionList.h"
@@ -10,7 +12,12 @@ namespace {
 
 enum : int { MSG_REPORT = 1 };
 
+constexpr char kAccEventId[] = "N273|10003";
+constexpr char kGyroEventId[] = "N273|10004";
+
+// Notifications of the display state: their kind, and the element that has the state.
 constexpr int kDisplayNotification = 2;
+constexpr size_t kDisplayElement = 2;
 
 void report(const char* eventId, RegisterConnectionList* list) {
     const std::string text = list->getRegisterConnectionInfo();
@@ -49,7 +56,9 @@ void RegisterInfo::handleDisable(int type, std::string pkg, std::string opPkg) {
 }
 
 void RegisterInfo::setNotification(const Vector<int>& values) {
-    if (values.size() > 2 && values[0] == kDisplayNotification) setDisplayState(values[2]);
+    if (values.size() > kDisplayElement && values[0] == kDisplayNotification) {
+        setDisplayState(values[kDisplayElement]);
+    }
 }
 
 void RegisterInfo::setDisplayState(int state) {
@@ -62,8 +71,8 @@ void RegisterInfo::notifyDayNight() {
 }
 
 void RegisterInfo::putPkgInfoTally() {
-    report("N273|10003", mAccConnections);
-    report("N273|10004", mGyroConnections);
+    report(kAccEventId, mAccConnections);
+    report(kGyroEventId, mGyroConnections);
 }
 
 void RegisterInfo::notifyRegisterInfoReset() {
@@ -73,11 +82,11 @@ void RegisterInfo::notifyRegisterInfoReset() {
 
 RegisterConnectionList* RegisterInfo::listFor(int type) const {
     switch (type) {
-        case 1:   // accelerometer
-        case 35:  // accelerometer, uncalibrated
+        case SENSOR_TYPE_ACCELEROMETER:
+        case SENSOR_TYPE_ACCELEROMETER_UNCALIBRATED:
             return mAccConnections;
-        case 4:   // gyroscope
-        case 16:  // gyroscope, uncalibrated
+        case SENSOR_TYPE_GYROSCOPE:
+        case SENSOR_TYPE_GYROSCOPE_UNCALIBRATED:
             return mGyroConnections;
         default:
             return nullptr;
