@@ -12,6 +12,8 @@
 #include <time.h>
 #include <unistd.h>
 #include <utils/AndroidThreads.h>
+#include <utils/SystemClock.h>
+#include <utils/Timers.h>
 
 #include "replay/Fiber.h"
 
@@ -141,6 +143,21 @@ extern "C" int clock_gettime(clockid_t clock, timespec* time) noexcept {
     time->tv_sec = static_cast<time_t>(now / 1'000'000'000);
     time->tv_nsec = static_cast<long>(now % 1'000'000'000);
     return 0;
+}
+
+// libutils' own ones ask clock_gettime, which cannot tell 32-bit ARM a time past 68 years.
+
+extern "C" nsecs_t systemTime(int clock) {
+    if (clock == SYSTEM_TIME_MONOTONIC || clock == SYSTEM_TIME_BOOTTIME) {
+        return virtual_clock::now();
+    }
+    timespec time;
+    clock_gettime(clock, &time);  // the others have one number there and here
+    return nsecs_t{time.tv_sec} * 1'000'000'000 + time.tv_nsec;
+}
+
+int64_t android::elapsedRealtimeNano() {
+    return virtual_clock::now();
 }
 
 extern "C" int epoll_wait(int epollFd, epoll_event* events, int maxEvents, int timeoutMs) {

@@ -5,9 +5,10 @@
 /**
  * Virtual time for the real Looper.
  *
- * An executable that links this defines `clock_gettime` and `epoll_wait`; since its symbols win over
- * libc's, libutils and the library call these. It also has libutils create threads through it. Two
- * roles share one real thread and never run at the same time:
+ * An executable that links this defines `clock_gettime` and `epoll_wait`, and libutils' `systemTime`
+ * and `elapsedRealtimeNano`; since its symbols win over theirs, libutils and the library call these.
+ * It also has libutils create threads through it. Two roles share one real thread and never run at
+ * the same time:
  *
  *  - The driver calls the functions below. The monotonic and the boot-time clock stand still until
  *    it moves them.

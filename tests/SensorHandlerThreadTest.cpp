@@ -59,6 +59,13 @@ TEST_F(SensorHandlerThreadTest, ANegativeDelayIsDueAtOnceAndTheLongestDelayDoesN
     EXPECT_EQ(mLines.back(), "2147483647 a1");
 }
 
+TEST_F(SensorHandlerThreadTest, RunsMessagesOverTheEndOfSecondsIn32Bits) {
+    advanceTo(2147483647000);
+    mThread->sendMessageDelayed(mA, 1, 2000);
+    advanceTo(2147483650000);
+    EXPECT_EQ(mLines, (Lines{"2147483649000 a1"}));
+}
+
 TEST_F(SensorHandlerThreadTest, RemovesAllMessagesOfACodeOrOfAHandlerAndNoOthers) {
     for (int delayMs : {0, 10, 20}) {
         mThread->sendMessageDelayed(mA, 1, delayMs);
