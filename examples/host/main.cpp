@@ -43,7 +43,8 @@ int fail(int status, const std::string& what) {
 /** Ends the process at once: the library's worker and the service's threads are still running. */
 [[noreturn]] void end(SensorService* service, int status) {
     service->settle();
-    std::fflush(stdout);
+    if (const auto error = platform::propertyFileError()) status = fail(kStatusFailed, *error);
+    if (std::fflush(stdout) != 0) status = fail(kStatusFailed, "cannot write the output");
     std::_Exit(status);
 }
 
