@@ -21,6 +21,8 @@ using trace::kStatusFailed;
 
 namespace {
 
+constexpr int kIdleMs = 200;  // between two calls of `idle` while nothing comes
+
 /** Plays the boot in this process; its last record is one that no report gets. */
 void playAndTell(const Boot& boot, const trace::TraceLine* first, const Device& device,
                  const Channels& channels) {
@@ -92,7 +94,7 @@ void readRecords(int fd, const std::function<void(const Record&)>& take,
     std::vector<char> block(size_t{64} << 10);
     for (;;) {
         pollfd ready{fd, POLLIN, 0};
-        if (poll(&ready, 1, 0) == 0) idle();
+        for (int waitMs = 0; poll(&ready, 1, waitMs) == 0; waitMs = kIdleMs) idle();
         const ssize_t count = read(fd, block.data(), block.size());
         if (count < 0 && errno == EINTR) continue;
         if (count <= 0) return;

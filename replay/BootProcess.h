@@ -19,7 +19,8 @@ struct Device {
 
 /**
  * Runs one boot of the library in a process of its own, forked from this one, and hands its records
- * to `take`; `idle` is called whenever there are none left for now. The process dies with this one.
+ * to `take`; `idle` is called whenever there are none left for now, and again and again while none
+ * come. The process dies with this one.
  */
 NextBoot runBoot(const Boot& boot, const trace::TraceLine* first, bool recordsCalls, Device* device,
                  trace::TraceReader* reader, const std::function<void(const report::Record&)>& take,

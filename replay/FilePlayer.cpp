@@ -31,7 +31,9 @@ int memoryFile(const std::string& text) {
 
 }  // namespace
 
-FilePlayer::FilePlayer(const Options& options) : mOptions(options) {
+FilePlayer::FilePlayer(const Options& options, Progress* progress)
+      : mOptions(options),
+        mProgress(progress) {
     if (options.check) {
         mReports.push_back(std::make_unique<report::Check>(&mOut));
         mCheck = static_cast<report::Check*>(mReports.back().get());
@@ -67,8 +69,10 @@ std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
     if (file.first && reader.judge(*file.first, &first, &mFailure)) {
         playTrace(&reader, isCapture ? &ownDevice : device, first);
     }
+    mProgress->clear();
     for (const auto& report : mReports) report->end(!mFailure);
     mOut.flush();
+    ++mPlayed;
     if (!mFailure && mCheck != nullptr) return mCheck->failure();
     return mFailure;
 }
@@ -81,7 +85,11 @@ void FilePlayer::playTrace(trace::TraceReader* reader, Device* device,
                 [this](const report::Record& record) {
                     for (const auto& report : mReports) report->take(record);
                 },
-                [this] { mOut.flush(); }, &mFailure);
+                [this, reader] {
+                    mOut.flush();
+                    mProgress->show(mPlayed, reader->name(), reader->lineNumber());
+                },
+                &mFailure);
     };
     NextBoot next = run(Boot{trace::BootKind::kDevice, first.at}, &first);
     while (next) next = run(*next, nullptr);

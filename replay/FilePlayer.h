@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <memory>
 #include <optional>
 #include <string>
@@ -8,6 +9,7 @@
 #include "replay/BootProcess.h"
 #include "replay/InputFile.h"
 #include "replay/Options.h"
+#include "replay/Progress.h"
 #include "report/Check.h"
 #include "report/Report.h"
 #include "report/Stdout.h"
@@ -19,7 +21,7 @@ namespace replay {
 /** Plays inputs and makes of them what the options ask for. */
 class FilePlayer {
 public:
-    explicit FilePlayer(const Options& options);
+    FilePlayer(const Options& options, Progress* progress);
 
     /**
      * Plays `file`, each boot in a process of its own. A capture is a device of its own; traces are
@@ -35,6 +37,8 @@ private:
     void playTrace(trace::TraceReader* reader, Device* device, const trace::TraceLine& first);
 
     const Options& mOptions;
+    Progress* const mProgress;
+    size_t mPlayed = 0;  // files
     report::Stdout mOut;
     std::vector<std::unique_ptr<report::Report>> mReports;
     report::Check* mCheck = nullptr;  // one of these

@@ -5,6 +5,7 @@
 #include <csignal>
 #include <cstdio>
 #include <cstring>
+#include <vector>
 
 #include <sys/mman.h>
 #include <sys/prctl.h>
@@ -84,6 +85,7 @@ int Jobs::waitForOne() {
         job->ended = true;
         job->status = status;
         --mRunning;
+        mTell(++mEnded);
     }
     return printEnded();
 }

@@ -3,7 +3,7 @@
 #include <cstddef>
 #include <deque>
 #include <functional>
-#include <vector>
+#include <utility>
 
 #include <sys/types.h>
 
@@ -15,8 +15,8 @@ namespace replay {
  */
 class Jobs {
 public:
-    /** At most `count` run at once. */
-    explicit Jobs(int count) : mCount(count) {}
+    /** At most `count` run at once; `tell` hears how many have ended, each time one does. */
+    Jobs(int count, std::function<void(size_t)> tell) : mCount(count), mTell(std::move(tell)) {}
 
     /** Ends what still runs. */
     ~Jobs();
@@ -47,6 +47,8 @@ private:
     int printEnded();
 
     const int mCount;
+    const std::function<void(size_t)> mTell;
+    size_t mEnded = 0;
     int mRunning = 0;
     std::deque<Job> mJobs;  // not printed yet
 };

@@ -5,10 +5,13 @@
 #include <string>
 #include <utility>
 
+#include <unistd.h>
+
 #include "platform/Display.h"
 #include "replay/FilePlayer.h"
 #include "replay/InputFile.h"
 #include "replay/Jobs.h"
+#include "replay/Progress.h"
 
 namespace replay {
 
@@ -23,13 +26,19 @@ int say(const std::optional<Failure>& failure) {
     return failure->status;
 }
 
+/** Whether lines appear on a terminal as they come. */
+bool showsLines(const Options& options) {
+    return (options.json || options.log || options.printTrace) && isatty(STDOUT_FILENO) != 0;
+}
+
 /** The days of one device, and between them other devices' captures. */
 class Replay {
 public:
     explicit Replay(const Options& options)
           : mOptions(options),
-            mPlayer(options),
-            mJobs(options.jobs) {
+            mProgress(options.files.size(), !showsLines(options)),
+            mPlayer(options, &mProgress),
+            mJobs(options.jobs, [this](size_t ended) { mProgress.show(ended, "", 0); }) {
         mDevice.propertyFile = options.properties;
     }
 
@@ -56,6 +65,7 @@ private:
     }
 
     const Options& mOptions;
+    Progress mProgress;
     FilePlayer mPlayer;
     Jobs mJobs;
     Device mDevice;

@@ -5,10 +5,10 @@
 /**
  * Virtual time for the real Looper.
  *
- * An executable that links this defines `clock_gettime` and `epoll_wait`, and libutils' `systemTime`
- * and `elapsedRealtimeNano`; since its symbols win over theirs, libutils and the library call these.
- * It also has libutils create threads through it. Two roles share one real thread and never run at
- * the same time:
+ * An executable that links this defines `clock_gettime` and `epoll_wait`, and libutils'
+ * `systemTime` and `elapsedRealtimeNano`; since its symbols win over theirs, libutils and the
+ * library call these. It also has libutils create threads through it. Two roles share one real
+ * thread and never run at the same time:
  *
  *  - The driver calls the functions below. The monotonic and the boot-time clock stand still until
  *    it moves them.
@@ -40,8 +40,8 @@ void set(int64_t time);
 void settle();
 
 /**
- * Lets the workers run all that falls due up to `time`, each at its own moment, and leaves the clock
- * at `time`, which must not lie in the past.
+ * Lets the workers run all that falls due up to `time`, each at its own moment, and leaves the
+ * clock at `time`, which must not lie in the past.
  */
 void advanceTo(int64_t time);
 
