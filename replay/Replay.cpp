@@ -26,9 +26,11 @@ int say(const std::optional<Failure>& failure) {
     return failure->status;
 }
 
-/** Whether lines appear on a terminal as they come. */
-bool showsLines(const Options& options) {
-    return (options.json || options.log || options.printTrace) && isatty(STDOUT_FILENO) != 0;
+/** Whether what appears on a terminal shows by itself how far the replay has come. */
+bool showsItself(const Options& options) {
+    const bool asTheyCome =
+            options.json || options.log || options.printTrace || options.files.size() > 1;
+    return asTheyCome && isatty(STDOUT_FILENO) != 0;
 }
 
 /** The days of one device, and between them other devices' captures. */
@@ -36,7 +38,7 @@ class Replay {
 public:
     explicit Replay(const Options& options)
           : mOptions(options),
-            mProgress(options.files.size(), !showsLines(options)),
+            mProgress(options.files.size(), !showsItself(options)),
             mPlayer(options, &mProgress),
             mJobs(options.jobs, [this](size_t ended) { mProgress.show(ended, "", 0); }) {
         mDevice.propertyFile = options.properties;
