@@ -1,5 +1,7 @@
+#include "rgb/RgbShot.h"
 #include "trace/CallTable.h"
 
+#include <algorithm>
 #include <type_traits>
 #include <utility>
 
@@ -12,6 +14,28 @@ using trace::CallModule;
 using trace::Rectangle;
 
 namespace {
+
+// The counters have no accessors. Only an explicit instantiation may name a private member: each
+// makes `expose` of its tag return the member.
+
+template <auto Member, typename Tag>
+struct Exposed {
+    friend constexpr auto expose(Tag) { return Member; }
+};
+
+#define EXPOSE(Tag, Class, member)         \
+    struct Tag {                           \
+        friend constexpr auto expose(Tag); \
+    };                                     \
+    template struct Exposed<&android::Class::member, Tag>;
+
+EXPOSE(BudgetOwner, RgbShotManager, mRgbShot)
+EXPOSE(Budget, RgbShotManager, mShotBudget)
+EXPOSE(CountOwner, RgbShot, mRgbShot)
+EXPOSE(Count, RgbShot, mRgbShotCount)
+EXPOSE(DetectionOwner, FlowingDataException, mFlowingDataException)
+EXPOSE(Detections, FlowingDataException, mDetectCount)
+#undef EXPOSE
 
 /** Turns what the trace gives into what the operation takes. */
 template <typename Parameter, typename Given>
@@ -96,10 +120,20 @@ void setByIndex(size_t index, int32_t value) {
     kSetters[index](value);
 }
 
+trace::Counters lookAtCounters() {
+    trace::Counters counters{};
+    if (const auto* manager = *expose(BudgetOwner())) counters[0] = manager->*expose(Budget());
+    if (const auto* shot = *expose(CountOwner())) counters[1] = shot->*expose(Count());
+    if (const auto* exception = *expose(DetectionOwner())) {
+        std::copy_n(exception->*expose(Detections()), counters.size() - 2, &counters[2]);
+    }
+    return counters;
+}
+
 }  // namespace
 
 extern "C" const CallModule* sensor_replay_calls() {
-    static constexpr CallModule kModule{callByIndex, setByIndex};
+    static constexpr CallModule kModule{callByIndex, setByIndex, lookAtCounters};
     return &kModule;
 }
 

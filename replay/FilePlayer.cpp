@@ -9,8 +9,10 @@
 #include <unistd.h>
 
 #include "capture/CaptureImport.h"
+#include "report/Check.h"
 #include "report/Lines.h"
 #include "report/Summary.h"
+#include "report/Timeline.h"
 #include "trace/FileIo.h"
 
 namespace replay {
@@ -36,13 +38,15 @@ FilePlayer::FilePlayer(const Options& options, Progress* progress)
         mProgress(progress) {
     if (options.check) {
         mReports.push_back(std::make_unique<report::Check>(&mOut));
-        mCheck = static_cast<report::Check*>(mReports.back().get());
     } else if (options.json) {
         mReports.push_back(std::make_unique<report::JsonLines>(&mOut, options.files.size() > 1));
     } else if (options.log) {
         mReports.push_back(std::make_unique<report::LogLines>(&mOut));
     } else {
         mReports.push_back(std::make_unique<report::Summary>(&mOut, options.all, options.colours));
+    }
+    if (options.timeline) {
+        mReports.push_back(std::make_unique<report::Timeline>(*options.timeline));
     }
     for (const auto& report : mReports) mWantsCalls |= report->wantsCalls();
 }
@@ -73,7 +77,9 @@ std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
     for (const auto& report : mReports) report->end(!mFailure);
     mOut.flush();
     ++mPlayed;
-    if (!mFailure && mCheck != nullptr) return mCheck->failure();
+    for (const auto& report : mReports) {
+        if (!mFailure) mFailure = report->failure();
+    }
     return mFailure;
 }
 

@@ -10,7 +10,6 @@
 #include "replay/InputFile.h"
 #include "replay/Options.h"
 #include "replay/Progress.h"
-#include "report/Check.h"
 #include "report/Report.h"
 #include "report/Stdout.h"
 #include "trace/Failure.h"
@@ -41,7 +40,6 @@ private:
     size_t mPlayed = 0;  // files
     report::Stdout mOut;
     std::vector<std::unique_ptr<report::Report>> mReports;
-    report::Check* mCheck = nullptr;  // one of these
     bool mWantsCalls = false;
     bool mPrintedTrace = false;
     std::optional<trace::Failure> mFailure;

@@ -81,7 +81,9 @@ public:
                 if (!carryOut()) return {};
             } while (readNext());
         }
-        if (!*mFailure) virtual_clock::settle();
+        if (*mFailure) return {};
+        virtual_clock::settle();
+        recordCounters();
         return {};
     }
 
@@ -106,6 +108,7 @@ private:
         // A process boot comes in the middle of a moment; what that has posted is lost.
         if (kind == BootKind::kDevice) {
             virtual_clock::settle();
+            recordCounters();
         } else {
             passTime();
         }
@@ -113,7 +116,12 @@ private:
     }
 
     void passTime() {
-        if (mLine.at > virtual_clock::now()) virtual_clock::advanceTo(mLine.at);
+        if (mLine.at <= virtual_clock::now()) return;
+        if (mChannels.recordsCalls) {
+            virtual_clock::advanceTo(mLine.at, [this] { recordCounters(); });
+        } else {
+            virtual_clock::advanceTo(mLine.at);
+        }
     }
 
     bool carryOut() {
@@ -146,6 +154,7 @@ private:
         if (const auto result = mModule->call(call.index, call.arguments)) {
             record(Record::Kind::kResult, {name, *result});
         }
+        recordCounters();
         return true;
     }
 
@@ -153,6 +162,17 @@ private:
         if (!load()) return false;
         for (const auto& [index, value] : variables.writes) mModule->set(index, value);
         return true;
+    }
+
+    /** Makes a record of the library's counters, if they have changed and calls are recorded. */
+    void recordCounters() {
+        if (mModule == nullptr || !mChannels.recordsCalls) return;
+        const trace::Counters counters = mModule->counters();
+        if (counters == mCounters) return;
+        mCounters = counters;
+        const std::string_view bytes(reinterpret_cast<const char*>(counters.data()),
+                                     sizeof(counters));
+        record(Record::Kind::kCounters, {bytes});
     }
 
     /** Properties that were set before the first call are in force when the library starts. */
@@ -172,6 +192,7 @@ private:
     trace::TraceLine mLine;
     int64_t mLastAt = 0;  // of the line before; expectations do not move the clock
     const trace::CallModule* mModule = nullptr;
+    trace::Counters mCounters{};  // as last recorded
 };
 
 }  // namespace

@@ -55,8 +55,9 @@ private:
     int runFile(const std::string& name) {
         InputFile file;
         const auto failure = open(name, &file);
-        const bool isJob = !failure && file.isCapture() && mOptions.jobs > 1 &&
-                           !mOptions.properties && !mOptions.printTrace;
+        const bool mayBeJob = mOptions.jobs > 1 && mOptions.files.size() > 1 &&
+                              !mOptions.properties && !mOptions.printTrace;
+        const bool isJob = mayBeJob && !failure && file.isCapture();
         if (isJob) {
             return mJobs.start([&] { return say(mPlayer.play(std::move(file), &mDevice)); });
         }

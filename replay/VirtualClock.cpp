@@ -122,9 +122,10 @@ void settle() {
     } while (ran && workers().size() > 1);  // one may have posted to another
 }
 
-void advanceTo(int64_t time) {
+void advanceTo(int64_t time, const std::function<void()>& afterMoment) {
     for (;;) {
         settle();
+        if (afterMoment) afterMoment();
         int64_t deadline = kNever;
         for (const Worker& worker : workers()) deadline = std::min(deadline, worker.deadline());
         if (deadline > time) break;

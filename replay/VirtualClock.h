@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 
 /**
  * Virtual time for the real Looper.
@@ -41,8 +42,8 @@ void settle();
 
 /**
  * Lets the workers run all that falls due up to `time`, each at its own moment, and leaves the
- * clock at `time`, which must not lie in the past.
+ * clock at `time`, which must not lie in the past. Calls `afterMoment` after each moment.
  */
-void advanceTo(int64_t time);
+void advanceTo(int64_t time, const std::function<void()>& afterMoment = {});
 
 }  // namespace virtual_clock

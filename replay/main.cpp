@@ -57,12 +57,19 @@ int main(int argc, char** argv) {
     app.add_option("--properties", options.properties,
                    "keep the system properties in FILE (made if missing)")
             ->type_name("FILE");
+    app.add_option("--timeline", options.timeline,
+                   "write the day of one input as trace events to FILE, for a timeline viewer")
+            ->type_name("FILE")
+            ->excludes(printTrace);
     bool listCalls = false;
     app.add_flag("--list-calls", listCalls, "list the calls that a trace can make, and exit");
     app.add_option("FILE", options.files, "traces and captures; - is standard input");
     try {
         app.parse(argc, argv);
         if (options.files.empty() && !listCalls) throw CLI::RequiredError("FILE");
+        if (options.files.size() > 1 && options.timeline) {
+            throw CLI::ValidationError("--timeline", "takes one input");
+        }
     } catch (const CLI::ParseError& error) {
         const int status = app.exit(error) == 0 ? 0 : trace::kStatusBadInput;
         return std::cout.flush() ? status : trace::kStatusFailed;

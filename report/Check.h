@@ -26,7 +26,7 @@ public:
     void end(bool isWhole) override;
 
     /** The first difference, or that there was nothing to compare with. */
-    const std::optional<trace::Failure>& failure() const { return mFailure; }
+    const std::optional<trace::Failure>& failure() const override { return mFailure; }
 
 private:
     struct Entry {

@@ -18,6 +18,7 @@ struct Record {
         kLog,       // the library wrote a log line: tag, text; `number` is the level
         kResult,    // a call returned: its name, its result as JSON
         kCall,      // a call of the trace is about to be made: its line; `number` is the line's
+        kCounters,  // the library's counters have changed: trace::Counters, as bytes
         kExpect,    // what the recorded device did: an entry; `number` is the line's
 
         // What a process leaves to the tool; no report gets these.

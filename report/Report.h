@@ -1,9 +1,11 @@
 #pragma once
 
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "report/Record.h"
+#include "trace/Failure.h"
 #include "trace/Origin.h"
 
 namespace report {
@@ -31,6 +33,12 @@ public:
 
     /** After the last record; `isWhole` tells whether the input was played to its end. */
     virtual void end([[maybe_unused]] bool isWhole) {}
+
+    /** What the report has found wrong, or why it could not be made, if anything. */
+    virtual const std::optional<trace::Failure>& failure() const {
+        static const std::optional<trace::Failure> kNone;
+        return kNone;
+    }
 };
 
 }  // namespace report

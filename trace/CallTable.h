@@ -81,6 +81,9 @@ std::string_view nearestCall(std::string_view name);
 /** All calls, a line each, with the types of their arguments in brackets. */
 std::string listCalls();
 
+/** The library's counters: the budget of samples, the sample count, the six detect counts. */
+using Counters = std::array<int32_t, 8>;
+
 /** The entry points of the module that holds the library. */
 struct CallModule {
     /** Makes call `index`; returns its result as JSON, if it has one. */
@@ -88,6 +91,9 @@ struct CallModule {
 
     /** Writes variable `index`; a `bool` takes 0 and 1. */
     void (*set)(size_t index, int32_t value);
+
+    /** Looks at the counters; those of a module that does not exist yet are 0. */
+    Counters (*counters)();
 };
 
 /** The one name that the module is asked for: a function that returns `const CallModule*`. */

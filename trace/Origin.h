@@ -22,8 +22,8 @@ struct Interval {
 };
 
 /**
- * Where a trace comes from: what a capture, or several merged ones, says of itself beside it. Dates and times of day
- * are local time of the device.
+ * Where a trace comes from: what a capture, or several merged ones, says of itself beside it. Dates
+ * and times of day are local time of the device.
  */
 struct Origin {
     std::vector<std::string> files;    // as they were given; in the order of their contents
