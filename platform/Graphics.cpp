@@ -10,6 +10,7 @@
 #include <thread>
 #include <utility>
 
+#include <gui/ScreenCaptureResults.h>
 #include <gui/SurfaceComposerClient.h>
 #include <hardware/gralloc.h>
 #include <log/log.h>
@@ -170,6 +171,21 @@ uint32_t bytesPerPixel(PixelFormat format) {
     }
     return 0;
 }
+
+namespace gui {
+
+ScreenCaptureResults::ScreenCaptureResults() = default;
+ScreenCaptureResults::~ScreenCaptureResults() = default;
+
+status_t ScreenCaptureResults::writeToParcel(Parcel*) const {
+    return INVALID_OPERATION;
+}
+
+status_t ScreenCaptureResults::readFromParcel(const Parcel*) {
+    return INVALID_OPERATION;
+}
+
+}  // namespace gui
 
 const sp<Fence> Fence::NO_FENCE(new Fence);
 

@@ -41,7 +41,8 @@ int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
     args.height = static_cast<uint32_t>(rect[3]) - static_cast<uint32_t>(rect[1]);
     args.useIdentityTransform = true;
 
-    const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
+    const sp<sensor_priv::SyncScreenCaptureListener> listener =
+            new sensor_priv::SyncScreenCaptureListener;
     if (ScreenshotClient::captureDisplay(args, listener) != OK) {
         SENSOR_PRIV_LOGE("UL: captureDisplay failed!");
         return 0;

@@ -4,6 +4,8 @@
 
 namespace android {
 
+inline namespace sensor_priv {
+
 binder::Status SyncScreenCaptureListener::onScreenCaptureCompleted(
         const gui::ScreenCaptureResults& results) {
     mResults.set_value(results);
@@ -15,5 +17,7 @@ gui::ScreenCaptureResults SyncScreenCaptureListener::waitForResults() {
     results.fence->waitForever("");
     return results;
 }
+
+}  // namespace sensor_priv
 
 }  // namespace android

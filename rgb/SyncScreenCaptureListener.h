@@ -10,6 +10,10 @@
 
 namespace android {
 
+// The platform's gui library has an `android::SyncScreenCaptureListener` too. The inline namespace
+// keeps the two apart where a file or a process holds both.
+inline namespace sensor_priv {
+
 /** Lets one thread wait for one capture, which the platform completes on another. */
 class SENSOR_PRIV_HIDDEN SyncScreenCaptureListener : public gui::BnScreenCaptureListener {
 public:
@@ -28,5 +32,7 @@ public:
 private:
     std::promise<gui::ScreenCaptureResults> mResults;
 };
+
+}  // namespace sensor_priv
 
 }  // namespace android

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <binder/Parcelable.h>
 #include <ui/Fence.h>
 #include <ui/GraphicBuffer.h>
 #include <ui/GraphicTypes.h>
@@ -8,8 +9,15 @@
 
 namespace android::gui {
 
-/** What a capture has led to. If `result` is not `OK`, there may be no buffer. */
-struct ScreenCaptureResults {
+/** The outcome of a capture. If `result` is not `OK`, there may be no buffer. */
+struct ScreenCaptureResults : public Parcelable {
+    ScreenCaptureResults();
+    ~ScreenCaptureResults() override;
+
+    /** Both return INVALID_OPERATION: the host has one process only. */
+    status_t writeToParcel(Parcel* parcel) const override;
+    status_t readFromParcel(const Parcel* parcel) override;
+
     sp<GraphicBuffer> buffer;
     sp<Fence> fence = Fence::NO_FENCE;  // signals when the buffer's contents are complete
     bool capturedSecureLayers{false};
