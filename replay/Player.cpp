@@ -78,10 +78,12 @@ public:
                 if (const auto* kind = std::get_if<BootKind>(&mLine.action)) {
                     return endByBoot(*kind);
                 }
-                if (!carryOut()) return {};
+                if (!carryOut() || storeFailed()) return {};
             } while (readNext());
         }
-        if (!*mFailure) virtual_clock::settle();
+        if (*mFailure) return {};
+        virtual_clock::settle();
+        storeFailed();
         return {};
     }
 
@@ -92,10 +94,8 @@ private:
         const auto* boot = std::get_if<BootKind>(&mLine.action);
         const bool newClock = boot != nullptr && *boot == BootKind::kDevice;
         if (mLine.at < mLastAt && !newClock) {
-            *mFailure = Failure{trace::at(mReader->name(), mReader->lineNumber()) +
-                                R"("at" goes back, from )" + trace::formatMs(mLastAt) + " to " +
-                                trace::formatMs(mLine.at)};
-            return false;
+            return fail(R"("at" goes back, from )" + trace::formatMs(mLastAt) + " to " +
+                        trace::formatMs(mLine.at));
         }
         mLastAt = mLine.at;
         return true;
@@ -109,7 +109,20 @@ private:
         } else {
             passTime();
         }
+        if (storeFailed()) return {};
         return Boot{kind, mLine.at};
+    }
+
+    /** Fails if the store did: without it, the library is on a device that cannot exist. */
+    bool storeFailed() {
+        const auto error = platform::propertyFileError();
+        return error && !fail(*error);
+    }
+
+    /** Makes `what` the failure, at the present line. Returns false. */
+    bool fail(const std::string& what, int status = trace::kStatusBadInput) {
+        *mFailure = Failure{trace::at(mReader->name(), mReader->lineNumber()) + what, status};
+        return false;
     }
 
     void passTime() {
@@ -124,6 +137,7 @@ private:
             return true;
         }
         passTime();
+        if (storeFailed()) return false;
         if (const auto* call = std::get_if<trace::Call>(&mLine.action)) return make(*call);
         if (const auto* variables = std::get_if<trace::VariableWrites>(&mLine.action)) {
             return write(*variables);
@@ -133,7 +147,9 @@ private:
                 platform::setDeviceProperty(name, value);
             }
         } else if (const auto* display = std::get_if<platform::DisplayChange>(&mLine.action)) {
-            platform::changeDisplay(*display);
+            if (const auto error = platform::changeDisplay(*display)) {
+                return fail(*error, trace::kStatusFailed);
+            }
         }
         return true;
     }
