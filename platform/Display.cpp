@@ -1,100 +1,167 @@
 #include "platform/Display.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cstring>
 #include <mutex>
 #include <new>
 
-#include <log/log.h>
+#include <fcntl.h>
 #include <sys/mman.h>
+#include <unistd.h>
 
 namespace platform {
 
 namespace {
 
 constexpr size_t kPixelBytes = 4;
-constexpr size_t kMaxPictureBytes = kPixelBytes * Picture::kMaxSide * Picture::kMaxSide;
 
-/** What forked processes share, the picture's pixels behind it. */
-struct SharedDisplay {
+/** What the display is, but for a picture's pixels. */
+struct State {
     DisplaySize size = {1080, 2400};
     Color color = {};
     bool showsPicture = false;
     uint32_t rowPadding = 0;
     DisplayFault fault = DisplayFault::kNone;
+};
 
-    uint8_t* picture() { return reinterpret_cast<uint8_t*>(this + 1); }
+std::optional<std::string> noMemory(const char* what, int error) {
+    return std::string("no memory for ") + what + ": " + std::strerror(error);
+}
 
-    /** Pages of shared memory that are never touched cost nothing. */
-    static SharedDisplay& get() {
-        static auto* const instance = [] {
-            void* memory =
-                    mmap(nullptr, sizeof(SharedDisplay) + kMaxPictureBytes, PROT_READ | PROT_WRITE,
-                         MAP_SHARED | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
-            LOG_ALWAYS_FATAL_IF(memory == MAP_FAILED, "cannot map the display");
-            return new (memory) SharedDisplay;
-        }();
+/** A picture's pixels in memory that forked processes share, mapped as far as they are needed. */
+class Pixels {
+public:
+    /** Before this nothing can be shown. */
+    bool create() {
+        if (mFd < 0) mFd = memfd_create("display", MFD_CLOEXEC);
+        return mFd >= 0;
+    }
+
+    std::optional<std::string> show(const std::vector<uint8_t>& pixels) {
+        if (!create()) return noMemory("a picture", errno);
+        // Memory that is not there would otherwise show as a signal, when it is first touched.
+        if (const int error = posix_fallocate(mFd, 0, static_cast<off_t>(pixels.size()))) {
+            return noMemory("a picture", error);
+        }
+        if (!map(pixels.size())) return noMemory("a picture", errno);
+        std::memcpy(mPixels, pixels.data(), pixels.size());
+        // Gives back what a larger picture had.
+        return ftruncate(mFd, static_cast<off_t>(pixels.size())) == 0
+                       ? std::nullopt
+                       : noMemory("a picture", errno);
+    }
+
+    bool map(size_t bytes) {
+        if (bytes <= mMapped) return true;
+        void* memory = mmap(nullptr, bytes, PROT_READ | PROT_WRITE, MAP_SHARED, mFd, 0);
+        if (memory == MAP_FAILED) return false;
+        if (mPixels != nullptr) munmap(mPixels, mMapped);
+        mPixels = static_cast<uint8_t*>(memory);
+        mMapped = bytes;
+        return true;
+    }
+
+    const uint8_t* data() const { return mPixels; }
+
+private:
+    int mFd = -1;
+    uint8_t* mPixels = nullptr;
+    size_t mMapped = 0;  // bytes
+};
+
+/** Never destroyed: a capture may read it until the process is gone. */
+struct Display {
+    std::mutex mutex;  // orders this process's threads; guards the rest
+    State own;
+    State* state = &own;  // or in memory that forked processes share
+    Pixels pixels;
+
+    bool map() {
+        return !state->showsPicture ||
+               pixels.map(kPixelBytes * state->size.width * state->size.height);
+    }
+
+    static Display& get() {
+        static auto* const instance = new Display;
         return *instance;
     }
 };
 
-/** Orders this process's threads. */
-std::mutex gMutex;
+void fillRow(uint8_t* row, size_t count, const Color& color) {
+    const uint8_t pixel[kPixelBytes] = {color.red, color.green, color.blue, 0xff};
+    for (size_t x = 0; x < count; ++x) std::memcpy(row + x * kPixelBytes, pixel, sizeof(pixel));
+}
 
 }  // namespace
 
-void shareDisplay() {
-    SharedDisplay::get();
+std::optional<std::string> shareDisplay() {
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
+    if (display.state != &display.own) return std::nullopt;
+    void* memory =
+            mmap(nullptr, sizeof(State), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+    if (memory == MAP_FAILED || !display.pixels.create()) return noMemory("the display", errno);
+    display.state = new (memory) State(display.own);
+    return std::nullopt;
 }
 
-void changeDisplay(const DisplayChange& change) {
-    const std::lock_guard lock(gMutex);
-    SharedDisplay& display = SharedDisplay::get();
-    if (change.size) display.size = *change.size;
-    if (change.color) display.color = *change.color;
-    if (change.size || change.color) display.showsPicture = false;
+std::optional<std::string> changeDisplay(const DisplayChange& change) {
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
     if (change.picture) {
-        display.size = {change.picture->width, change.picture->height};
-        display.showsPicture = true;
-        std::memcpy(display.picture(), change.picture->pixels.data(),
-                    change.picture->pixels.size());
+        if (auto error = display.pixels.show(change.picture->pixels)) return error;
     }
-    if (change.rowPadding) display.rowPadding = *change.rowPadding;
-    if (change.fault) display.fault = *change.fault;
+    State& state = *display.state;
+    if (change.size) state.size = *change.size;
+    if (change.color) state.color = *change.color;
+    if (change.size || change.color) state.showsPicture = false;
+    if (change.picture) {
+        state.size = {change.picture->width, change.picture->height};
+        state.showsPicture = true;
+    }
+    if (change.rowPadding) state.rowPadding = *change.rowPadding;
+    if (change.fault) state.fault = *change.fault;
+    return std::nullopt;
 }
 
 DisplayFault displayFault() {
-    const std::lock_guard lock(gMutex);
-    return SharedDisplay::get().fault;
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
+    return display.state->fault;
 }
 
 uint32_t displayRowPadding() {
-    const std::lock_guard lock(gMutex);
-    return SharedDisplay::get().rowPadding;
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
+    return display.state->rowPadding;
+}
+
+bool mapDisplay() {
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
+    return display.map();
 }
 
 void copyDisplay(const android::Rect& area, uint8_t* pixels, size_t rowBytes) {
-    const std::lock_guard lock(gMutex);
-    SharedDisplay& display = SharedDisplay::get();
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
+    const State& state = *display.state;
     const int64_t left = std::max(area.left, 0);
     const int64_t top = std::max(area.top, 0);
-    const int64_t right = std::min<int64_t>(area.right, display.size.width);
-    const int64_t bottom = std::min<int64_t>(area.bottom, display.size.height);
-    if (left >= right) return;
+    const int64_t right = std::min<int64_t>(area.right, state.size.width);
+    const int64_t bottom = std::min<int64_t>(area.bottom, state.size.height);
+    if (left >= right || !display.map()) return;
+    const auto count = static_cast<size_t>(right - left);
     for (int64_t y = top; y < bottom; ++y) {
         uint8_t* const row = pixels + static_cast<size_t>(y - area.top) * rowBytes +
                              static_cast<size_t>(left - area.left) * kPixelBytes;
-        const size_t count = static_cast<size_t>(right - left);
-        if (display.showsPicture) {
+        if (state.showsPicture) {
             const size_t first =
-                    static_cast<size_t>(y) * display.size.width + static_cast<size_t>(left);
-            std::memcpy(row, display.picture() + first * kPixelBytes, count * kPixelBytes);
+                    static_cast<size_t>(y) * state.size.width + static_cast<size_t>(left);
+            std::memcpy(row, display.pixels.data() + first * kPixelBytes, count * kPixelBytes);
         } else {
-            const uint8_t pixel[kPixelBytes] = {display.color.red, display.color.green,
-                                                display.color.blue, 0xff};
-            for (size_t x = 0; x < count; ++x) {
-                std::memcpy(row + x * kPixelBytes, pixel, sizeof(pixel));
-            }
+            fillRow(row, count, state.color);
         }
     }
 }

@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <optional>
+#include <string>
 
 #include <ui/Rect.h>
 
@@ -51,16 +52,25 @@ struct DisplayChange {
     std::optional<DisplayFault> fault;
 };
 
-void shareDisplay();
+/**
+ * Shares the display with the processes forked from here on. Returns nothing, or why it cannot be
+ * shared: one line.
+ */
+std::optional<std::string> shareDisplay();
 
-void changeDisplay(const DisplayChange& change);
+/** Returns nothing, or why the picture cannot be shown: one line, and nothing has changed. */
+std::optional<std::string> changeDisplay(const DisplayChange& change);
 
 DisplayFault displayFault();
 uint32_t displayRowPadding();
 
+/** Makes what the display shows readable here. Returns false if there is no memory for it. */
+bool mapDisplay();
+
 /**
  * Copies the pixels of `area`, 4 bytes each as in `Picture`, into `pixels`, whose rows begin
- * `rowBytes` apart. What lies outside the display is left as it was.
+ * `rowBytes` apart. What lies outside the display is left as it was, and so is
+ * everything while the display cannot be mapped.
  */
 void copyDisplay(const android::Rect& area, uint8_t* pixels, size_t rowBytes);
 

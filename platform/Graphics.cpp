@@ -124,7 +124,9 @@ private:
         signal->given.notify_all();
     }
 
+    /** Null if there is no memory for it, or for reading the display. */
     static sp<GraphicBuffer> makeBuffer(const Request& request) {
+        if (!mapDisplay()) return nullptr;
         const auto width = static_cast<uint32_t>(request.area.getWidth());
         const auto height = static_cast<uint32_t>(request.area.getHeight());
         const sp<GraphicBuffer> buffer = new GraphicBuffer(

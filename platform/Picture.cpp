@@ -7,7 +7,9 @@
 #include <cstring>
 #include <memory>
 
+#include <fcntl.h>
 #include <png.h>
+#include <sys/stat.h>
 
 namespace platform {
 
@@ -34,7 +36,10 @@ public:
         picture->width = png_get_image_width(mPng, mInfo);
         picture->height = png_get_image_height(mPng, mInfo);
         if (picture->width > Picture::kMaxSide || picture->height > Picture::kMaxSide) {
-            png_error(mPng, "a side is longer than 16384 pixels");
+            return refuse("a side is longer than 16384 pixels");
+        }
+        if (uint64_t{picture->width} * picture->height > Picture::kMaxPixels) {
+            return refuse("more than 64 million pixels");
         }
         png_set_expand(mPng);
         png_set_scale_16(mPng);
@@ -55,8 +60,17 @@ public:
 
 private:
     [[noreturn]] static void takeError(png_structp png, png_const_charp message) {
-        static_cast<std::string*>(png_get_error_ptr(png))->assign(message);
+        errorOf(png) = std::string("not a sound PNG picture: ") + message;
         png_longjmp(png, 1);
+    }
+
+    static std::string& errorOf(png_structp png) {
+        return *static_cast<std::string*>(png_get_error_ptr(png));
+    }
+
+    bool refuse(const char* what) {
+        errorOf(mPng) = what;
+        return false;
     }
 
     static void ignoreWarning(png_structp, png_const_charp) {}
@@ -68,12 +82,15 @@ private:
 }  // namespace
 
 std::optional<std::string> readPng(const std::string& path, Picture* picture) {
-    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(std::fopen(path.c_str(), "rbe"),
-                                                               std::fclose);
-    if (file == nullptr) return std::string("cannot open: ") + std::strerror(errno);
+    // A pipe or a device is never opened for long enough to block, or to do what its driver does.
+    struct stat status {};
+    if (stat(path.c_str(), &status) == 0 && !S_ISREG(status.st_mode)) return "not a regular file";
+    const int fd = open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
+    if (fd < 0) return std::string("cannot open: ") + std::strerror(errno);
+    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(fdopen(fd, "rb"), std::fclose);
     std::string error;
     if (PngFile(file.get(), &error).read(picture)) return std::nullopt;
-    return "not a sound PNG picture: " + error;
+    return error;
 }
 
 }  // namespace platform

@@ -9,8 +9,9 @@ namespace platform {
 
 /** A picture's pixels row by row, 4 bytes each: red, green, blue, alpha. */
 struct Picture {
-    /** What a side has at most, in pixels. */
+    /** Largest side and largest area, in pixels. */
     static constexpr uint32_t kMaxSide = 16384;
+    static constexpr uint64_t kMaxPixels = 64'000'000;
 
     uint32_t width = 0;
     uint32_t height = 0;

@@ -21,15 +21,31 @@
 namespace platform {
 
 /**
- * Keeps the properties in the SQLite file `path`, made if it is missing. Returns nothing, or what
- * is wrong: one line that names the file, and the properties stay where they were.
+ * Fixes which file `path` is, in this process and in those that it forks later: `openProperties`
+ * fails if the path names another file by then, or none. Makes the file if it is missing. A second
+ * call for the same path fails likewise. Returns nothing, or why the file cannot keep properties:
+ * one line that names it.
+ */
+std::optional<std::string> pinPropertyFile(const std::string& path);
+
+/**
+ * Keeps the properties in the file `path` from now on. A missing or an empty file becomes a store;
+ * a store is taken; anything else is refused and stays as it is, to the byte. Returns nothing, or
+ * what is wrong: one line that names the file, and the properties stay where they were.
  */
 std::optional<std::string> openProperties(const std::string& path);
 
-/** Lets go of the file, which then is complete by itself; the properties in memory are none. */
-void closeProperties();
+/**
+ * Lets go of the file, which is complete by itself if no other process uses it. The properties in
+ * memory are none. Returns the first error since the file was opened; that the file was deleted or
+ * replaced in that time is one.
+ */
+std::optional<std::string> closeProperties();
 
-/** What went wrong with the file since it was opened (one line that names it), if anything. */
+/**
+ * The first read or write that failed since the file was opened, if any: one line that names the
+ * file. Cheap: it looks at neither the file nor the database.
+ */
 std::optional<std::string> propertyFileError();
 
 /** Drops what does not survive a boot of the device: all but `persist.*` and `ro.*`. */

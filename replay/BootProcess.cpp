@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstring>
+#include <new>
 #include <string_view>
 
 #include <poll.h>
@@ -36,13 +37,17 @@ void playAndTell(const Boot& boot, const trace::TraceLine* first, const Device& 
         platform::restoreProperties({begin, begin + device.properties.size()});
     }
     NextBoot next;
-    if (!failure) next = play(boot, first, channels, &failure);
-    if (const auto error = platform::propertyFileError(); error && !failure) {
-        failure = Failure{*error};
+    try {
+        if (!failure) next = play(boot, first, channels, &failure);
+    } catch (const std::bad_alloc&) {
+        const trace::TraceReader& reader = *channels.reader;
+        failure = Failure{trace::at(reader.name(), reader.lineNumber()) + "not enough memory",
+                          kStatusFailed};
     }
     std::vector<unsigned char> bytes;
     if (device.propertyFile) {
-        platform::closeProperties();
+        const auto error = platform::closeProperties();
+        if (error && !failure) failure = Failure{*error};
     } else {
         bytes = platform::saveProperties();
     }

@@ -10,6 +10,7 @@
 
 #include "capture/CaptureImport.h"
 #include "report/Check.h"
+#include "platform/PropertyService.h"
 #include "report/Lines.h"
 #include "report/Summary.h"
 #include "report/Timeline.h"
@@ -85,6 +86,12 @@ std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
 
 void FilePlayer::playTrace(trace::TraceReader* reader, Device* device,
                            const trace::TraceLine& first) {
+    if (device->propertyFile) {
+        if (const auto error = platform::pinPropertyFile(*device->propertyFile)) {
+            mFailure = Failure{*error};
+            return;
+        }
+    }
     const auto run = [&](const Boot& boot, const trace::TraceLine* line) {
         return runBoot(
                 boot, line, mWantsCalls, device, reader,

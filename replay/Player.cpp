@@ -78,12 +78,13 @@ public:
                 if (const auto* kind = std::get_if<BootKind>(&mLine.action)) {
                     return endByBoot(*kind);
                 }
-                if (!carryOut()) return {};
+                if (!carryOut() || storeFailed()) return {};
             } while (readNext());
         }
         if (*mFailure) return {};
         virtual_clock::settle();
         recordCounters();
+        storeFailed();
         return {};
     }
 
@@ -94,10 +95,8 @@ private:
         const auto* boot = std::get_if<BootKind>(&mLine.action);
         const bool newClock = boot != nullptr && *boot == BootKind::kDevice;
         if (mLine.at < mLastAt && !newClock) {
-            *mFailure = Failure{trace::at(mReader->name(), mReader->lineNumber()) +
-                                R"("at" goes back, from )" + trace::formatMs(mLastAt) + " to " +
-                                trace::formatMs(mLine.at)};
-            return false;
+            return fail(R"("at" goes back, from )" + trace::formatMs(mLastAt) + " to " +
+                        trace::formatMs(mLine.at));
         }
         mLastAt = mLine.at;
         return true;
@@ -112,7 +111,20 @@ private:
         } else {
             passTime();
         }
+        if (storeFailed()) return {};
         return Boot{kind, mLine.at};
+    }
+
+    /** Fails if the store did: without it, the library is on a device that cannot exist. */
+    bool storeFailed() {
+        const auto error = platform::propertyFileError();
+        return error && !fail(*error);
+    }
+
+    /** Makes `what` the failure, at the present line. Returns false. */
+    bool fail(const std::string& what, int status = trace::kStatusBadInput) {
+        *mFailure = Failure{trace::at(mReader->name(), mReader->lineNumber()) + what, status};
+        return false;
     }
 
     void passTime() {
@@ -132,6 +144,7 @@ private:
             return true;
         }
         passTime();
+        if (storeFailed()) return false;
         if (const auto* call = std::get_if<trace::Call>(&mLine.action)) return make(*call);
         if (const auto* variables = std::get_if<trace::VariableWrites>(&mLine.action)) {
             return write(*variables);
@@ -141,7 +154,9 @@ private:
                 platform::setDeviceProperty(name, value);
             }
         } else if (const auto* display = std::get_if<platform::DisplayChange>(&mLine.action)) {
-            platform::changeDisplay(*display);
+            if (const auto error = platform::changeDisplay(*display)) {
+                return fail(*error, trace::kStatusFailed);
+            }
         }
         return true;
     }

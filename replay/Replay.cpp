@@ -1,6 +1,8 @@
 #include "replay/Replay.h"
 
+#include <csignal>
 #include <cstdio>
+#include <new>
 #include <optional>
 #include <string>
 #include <utility>
@@ -46,7 +48,13 @@ public:
 
     int run() {
         for (const std::string& name : mOptions.files) {
-            if (const int status = runFile(name)) return status;
+            int status = 0;
+            try {
+                status = runFile(name);
+            } catch (const std::bad_alloc&) {
+                status = say(Failure{name + ": not enough memory", trace::kStatusFailed});
+            }
+            if (status != 0) return status;
         }
         return mJobs.finish();
     }
@@ -77,7 +85,11 @@ private:
 }  // namespace
 
 int replayFiles(const Options& options) {
-    platform::shareDisplay();
+    // A write beyond the limit of a file's size is an error, and not the end of the tool.
+    std::signal(SIGXFSZ, SIG_IGN);
+    if (const auto error = platform::shareDisplay()) {
+        return say(Failure{*error, trace::kStatusFailed});
+    }
     return Replay(options).run();
 }
 

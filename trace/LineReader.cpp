@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <new>
 
 #include <sys/mman.h>
 #include <unistd.h>
@@ -29,11 +30,11 @@ void* mapShared(size_t size) {
 LineReader::LineReader(int fd)
       : mFd(fd),
         mState(static_cast<State*>(mapShared(sizeof(State) + kCapacity + kPadding))) {
-    if (mState == nullptr) mError = std::strerror(errno);
+    if (mState == nullptr) throw std::bad_alloc();
 }
 
 LineReader::~LineReader() {
-    if (mState != nullptr) munmap(mState, sizeof(State) + kCapacity + kPadding);
+    munmap(mState, sizeof(State) + kCapacity + kPadding);
     close(mFd);
 }
 
@@ -68,7 +69,7 @@ std::optional<std::string_view> LineReader::next() {
 }
 
 bool LineReader::hasLine() const {
-    return mState == nullptr || mState->ended ||
+    return mState->ended ||
            std::memchr(buffer() + mState->begin, '\n', mState->end - mState->begin) != nullptr;
 }
 

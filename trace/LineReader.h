@@ -21,7 +21,7 @@ public:
     /** Longest line, in bytes without its line feed. */
     static constexpr size_t kMaxLine = size_t{64} << 20;
 
-    /** Reads `fd` from where it stands; takes it over. */
+    /** Reads `fd` from where it stands; takes it over. Throws `std::bad_alloc`. */
     explicit LineReader(int fd);
     ~LineReader();
 
