@@ -1,4 +1,4 @@
-# 32-bit ARM as the device has it: Debian's cross compiler, the libraries of build/arm-sysroot (see
+# 32-bit ARM, as the device has it: Debian's cross compiler, the libraries of build/arm-sysroot (see
 # scripts/arm-sysroot), and qemu-arm to run what comes out.
 set(CMAKE_SYSTEM_NAME Linux)
 set(CMAKE_SYSTEM_PROCESSOR arm)
@@ -10,20 +10,24 @@ cmake_path(NORMAL_PATH SYSROOT)
 if(NOT EXISTS ${SYSROOT}/.stamp)
   message(FATAL_ERROR "There is no ${SYSROOT}: run scripts/arm-sysroot")
 endif()
+set(LIBRARIES ${SYSROOT}/usr/lib/${CMAKE_LIBRARY_ARCHITECTURE})
+
+# The C library and its headers are the cross compiler's own: this is no sysroot for the compiler.
 set(CMAKE_FIND_ROOT_PATH ${SYSROOT})
 set(CMAKE_FIND_ROOT_PATH_MODE_PROGRAM NEVER)
 set(CMAKE_FIND_ROOT_PATH_MODE_LIBRARY ONLY)
 set(CMAKE_FIND_ROOT_PATH_MODE_INCLUDE ONLY)
 set(CMAKE_FIND_ROOT_PATH_MODE_PACKAGE ONLY)
 set(ENV{PKG_CONFIG_SYSROOT_DIR} ${SYSROOT})
-set(ENV{PKG_CONFIG_LIBDIR}
-  ${SYSROOT}/usr/lib/${CMAKE_LIBRARY_ARCHITECTURE}/pkgconfig:${SYSROOT}/usr/share/pkgconfig)
+set(ENV{PKG_CONFIG_LIBDIR} ${LIBRARIES}/pkgconfig:${SYSROOT}/usr/share/pkgconfig)
+set(CMAKE_CXX_FLAGS_INIT
+  "-Wno-psabi -DSIMDJSON_NO_PORTABILITY_WARNING -isystem ${SYSROOT}/usr/include")
 
-# What the libraries need themselves is found when they are loaded.
-set(CMAKE_CXX_FLAGS_INIT "-Wno-psabi -DSIMDJSON_NO_PORTABILITY_WARNING")
-set(CMAKE_EXE_LINKER_FLAGS_INIT -Wl,--unresolved-symbols=ignore-in-shared-libs)
-set(CMAKE_SHARED_LINKER_FLAGS_INIT -Wl,--unresolved-symbols=ignore-in-shared-libs)
+# What a library needs itself is looked for when it is loaded.
+set(CMAKE_EXE_LINKER_FLAGS_INIT "-Wl,--unresolved-symbols=ignore-in-shared-libs -L${LIBRARIES}")
+set(CMAKE_SHARED_LINKER_FLAGS_INIT ${CMAKE_EXE_LINKER_FLAGS_INIT})
+set(CMAKE_MODULE_LINKER_FLAGS_INIT ${CMAKE_EXE_LINKER_FLAGS_INIT})
 
-# qemu's -L is not enough: it does not show the loader the sysroot's folders, only the files.
-set(LIBRARIES ${SYSROOT}/usr/lib/${CMAKE_LIBRARY_ARCHITECTURE})
-set(CMAKE_CROSSCOMPILING_EMULATOR qemu-arm -L ${SYSROOT} -E LD_LIBRARY_PATH=${LIBRARIES}:${LIBRARIES}/android:${SYSROOT}/lib/${CMAKE_LIBRARY_ARCHITECTURE}:${SYSROOT}/usr/lib/p7zip)
+# Through -L the loader sees the sysroot's files but not its folders, so that it skips them.
+set(CMAKE_CROSSCOMPILING_EMULATOR qemu-arm -L ${SYSROOT} -E
+  LD_LIBRARY_PATH=${LIBRARIES}:${LIBRARIES}/android:${SYSROOT}/usr/lib/p7zip:${SYSROOT}/lib/${CMAKE_LIBRARY_ARCHITECTURE})
