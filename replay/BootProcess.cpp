@@ -12,6 +12,7 @@
 #include <unistd.h>
 
 #include "platform/PropertyService.h"
+#include "replay/OneProcessor.h"
 
 namespace replay {
 
@@ -131,9 +132,11 @@ NextBoot runBoot(const Boot& boot, const trace::TraceLine* first, bool recordsCa
     };
     int ends[2];
     if (pipe2(ends, O_CLOEXEC) != 0) return fail("cannot make a pipe: ");
+    OneProcessor processor;
     const pid_t tool = getpid();
     const pid_t child = fork();
     if (child == 0) {
+        processor.letGo();
         prctl(PR_SET_PDEATHSIG, SIGKILL);
         if (getppid() != tool) _exit(kStatusFailed);
         close(ends[0]);
