@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cstdio>
-#include <future>
 #include <thread>
 #include <utility>
 
@@ -37,13 +36,38 @@ constexpr int kSampleArea[] = {508, 20, 572, 84};
 
 }  // namespace
 
+/** Waits at the end of the queue of the library's worker. */
+class SensorService::WorkerQueue : public android::MessageHandler {
+public:
+    /** Blocks until the worker has run all that is due. */
+    void wait() {
+        std::unique_lock lock(mMutex);
+        SensorHandlerThread::getInstance()->sendMessage(this, 0);
+        const int mine = ++mPosted;
+        mChanged.wait(lock, [this, mine] { return mRun >= mine; });
+    }
+
+private:
+    void handleMessage(const android::Message&) override {
+        const std::lock_guard lock(mMutex);
+        ++mRun;
+        mChanged.notify_all();
+    }
+
+    std::mutex mMutex;
+    std::condition_variable mChanged;
+    int mPosted = 0;  // guarded by mMutex, as the next one
+    int mRun = 0;
+};
+
 // The library is created whole at the service's start: a module loads its stored counters 2 s after
 // its creation, and what it has counted by then may be lost.
 SensorService::SensorService()
       : mSdc(SDCImpl::getInstance()),
         mFlowingData(FlowingDataException::getInstance()),
         mUltra(UltraException::getInstance()),
-        mRgb(RgbShotManager::getInstance()) {
+        mRgb(RgbShotManager::getInstance()),
+        mWorkerQueue(new WorkerQueue) {
     // Device: captures of the screen arrive on binder threads. A process that does not run them yet
     // starts them here: ProcessState::self()->startThreadPool().
     std::thread([this] { dispatchEvents(); }).detach();
@@ -91,7 +115,7 @@ void SensorService::passHour(int hour, std::chrono::milliseconds length) {
     const std::chrono::milliseconds resetDelay =
             std::min<std::chrono::milliseconds>(5s, length / 10);
     std::this_thread::sleep_for(resetDelay);
-    waitForWorker();
+    mWorkerQueue->wait();
     mSdc->notifySdcReset(hour);
     mSdc->notifyRgbShotReset(hour);
     mSdc->notifyUltraReset(hour);
@@ -191,18 +215,7 @@ void SensorService::settle() {
             return mEvents.empty() && (sampled || mIdleTurns >= idleTurns);
         });
     }
-    waitForWorker();
-}
-
-void SensorService::waitForWorker() {
-    /** A message due now: the worker runs it after all that is due already. */
-    struct Last : android::MessageHandler {
-        std::promise<void> done;
-        void handleMessage(const android::Message&) override { done.set_value(); }
-    };
-    const android::sp<Last> last = new Last;
-    SensorHandlerThread::getInstance()->sendMessage(last, 0);
-    last->done.get_future().wait();
+    mWorkerQueue->wait();
 }
 
 }  // namespace host

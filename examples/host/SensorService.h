@@ -8,6 +8,7 @@
 #include <vector>
 
 #include <hardware/sensors.h>
+#include <utils/StrongPointer.h>
 
 namespace android {
 class FlowingDataException;
@@ -65,18 +66,20 @@ public:
     void settle();
 
 private:
+    class WorkerQueue;
+
     void dispatchEvents();
     void sampleScreen();
     bool mayStillSample();
     void takeTurn();
     void wakeSampler();
-    void waitForWorker();
 
     // Constant after construction.
     android::SDCImpl* const mSdc;
     android::FlowingDataException* const mFlowingData;
     android::UltraException* const mUltra;
     android::RgbShotManager* const mRgb;
+    const android::sp<WorkerQueue> mWorkerQueue;
 
     // Guarded by mMutex, which is never held while the library is called.
     std::mutex mMutex;

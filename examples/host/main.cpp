@@ -45,7 +45,7 @@ int fail(int status, const std::string& what) {
     service->settle();
     if (const auto error = platform::propertyFileError()) status = fail(kStatusFailed, *error);
     if (std::fflush(stdout) != 0) status = fail(kStatusFailed, "cannot write the output");
-    std::_Exit(status);
+    _exit(status);
 }
 
 int runScript(const std::string& file, Session* session) {
