@@ -9,8 +9,8 @@
 #include <unistd.h>
 
 #include "capture/CaptureImport.h"
-#include "report/Check.h"
 #include "platform/PropertyService.h"
+#include "report/Check.h"
 #include "report/Lines.h"
 #include "report/Summary.h"
 #include "report/Timeline.h"

@@ -1,10 +1,8 @@
 #include "report/DayTable.h"
 
 #include <algorithm>
-#include <cstddef>
 
 #include "report/SensorNames.h"
-#include "report/Table.h"
 #include "report/Text.h"
 
 namespace report {
@@ -53,26 +51,21 @@ std::vector<DayUse> DayTable::usesOf(const Day& day) const {
     return uses;
 }
 
-std::string layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_t limit) {
+Table layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_t limit) {
     Table table({{"App", Table::Column::kCut},
                  {"Sensor", Table::Column::kCut},
                  {"Held", Table::Column::kRight},
                  {"Display on", Table::Column::kRight},
                  {"Enables", Table::Column::kRight},
                  {"Rate Hz", Table::Column::kRight},
-                 {"At the end"}});
-    const size_t shown = std::min(uses.size(), limit);
-    for (size_t i = 0; i < shown; ++i) {
-        const DayUse& use = uses[i];
+                 {"At the end"}},
+                limit);
+    for (const DayUse& use : uses) {
         table.add({use.app, nameSensor(use.type, origin), formatDuration(use.held), share(use),
                    std::to_string(use.enables), use.fastest ? formatRate(*use.fastest) : "-",
                    use.isOpen ? "still on" : ""});
     }
-    std::string text = table.text(2);
-    if (shown < uses.size()) {
-        text += "  and " + std::to_string(uses.size() - shown) + " more (--all shows them)\n";
-    }
-    return text;
+    return table;
 }
 
 }  // namespace report

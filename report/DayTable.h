@@ -7,6 +7,7 @@
 #include <utility>
 #include <vector>
 
+#include "report/Table.h"
 #include "report/Usage.h"
 #include "trace/Origin.h"
 
@@ -51,7 +52,7 @@ private:
     std::map<Day, std::map<std::pair<std::string, int32_t>, DayUse>> mUses;
 };
 
-/** The uses as a table for a terminal: the first `limit`, and how many there are besides. */
-std::string layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_t limit);
+/** The uses as a table of at most `limit` rows. */
+Table layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_t limit);
 
 }  // namespace report

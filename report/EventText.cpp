@@ -5,7 +5,6 @@
 #include <optional>
 #include <string_view>
 
-#include "report/Table.h"
 #include "report/Text.h"
 
 namespace report {
@@ -84,7 +83,7 @@ Kind kindOf(std::string_view key) {
     return Kind::kText;
 }
 
-std::string layOutList(const Field& field, size_t limit) {
+Table layOutList(const Field& field, size_t limit) {
     std::vector<Table::Column> columns;
     std::vector<std::string_view> keys;
     for (const auto& [key, title, kind] : kValues) {
@@ -96,32 +95,29 @@ std::string layOutList(const Field& field, size_t limit) {
         columns.push_back({std::string(title),
                            kind == Kind::kText ? Table::Column::kCut : Table::Column::kRight});
     }
-    Table table(columns);
-    const size_t shown = std::min(limit, field.entries.size());
-    for (size_t i = 0; i < shown; ++i) {
+    Table table(columns, limit);
+    for (const Entry& entry : field.entries) {
         std::vector<std::string> cells;
         for (const std::string_view key : keys) {
-            std::string text(valueOf(field.entries[i], key));
-            if (key == "pkg") text = shortenApp(text);
-            cells.push_back(show(kindOf(key), text));
+            const std::string text(valueOf(entry, key));
+            cells.push_back(key == "pkg" ? shortenApp(text) : show(kindOf(key), text));
         }
         table.add(cells);
     }
-    std::string text = table.text(4);
-    if (shown < field.entries.size()) {
-        text += "    and " + std::to_string(field.entries.size() - shown) + " more (--all)\n";
-    }
-    return text;
+    return table;
 }
 
-std::string layOutPlain(const Event& event, const Field& field) {
-    std::string text = "    " + std::string(describeKey(event.id, field.key)) + ": ";
+/** What a value says that is no list. */
+std::string showPlain(const Field& field) {
     const std::string_view code =
             field.key == "ultraExpired" ? lookUp(kUltraCodes, field.text) : std::string_view();
-    if (!code.empty()) return text + field.text + ", " + std::string(code) + '\n';
-    if (field.entries.empty()) return text + safe(show(kindOf(field.key), field.text)) + '\n';
-    for (const auto& [key, value] : field.entries[0]) text += key + ' ' + safe(value) + "  ";
-    text.back() = '\n';
+    if (!code.empty()) return field.text + ", " + std::string(code);
+    if (field.key == "pkg") return safe(shortenApp(field.text));
+    if (field.entries.empty()) return safe(show(kindOf(field.key), field.text));
+    std::string text;
+    for (const auto& [key, value] : field.entries[0]) {
+        text += (text.empty() ? "" : ", ") + key + ' ' + safe(value);
+    }
     return text;
 }
 
@@ -134,25 +130,30 @@ std::string shortenApp(const std::string& app) {
     return isTwice ? app.substr(0, half) : app;
 }
 
-std::string layOut(const Event& event, size_t limit) {
-    std::string text = "  " + formatTimeOfDay(event.at) + "  " + safe(event.id);
+EventText layOut(const Event& event, size_t limit) {
+    EventText text;
+    text.title = formatTimeOfDay(event.at) + "  " + safe(event.id);
     const std::string_view meaning = describeEvent(event.id, event.fields);
-    if (!meaning.empty()) text.append("  ").append(meaning);
-    text += '\n';
+    if (!meaning.empty()) text.title.append("  ").append(meaning);
     for (const Field& field : event.fields) {
-        text += field.isList ? layOutList(field, limit) : layOutPlain(event, field);
+        if (field.isList) {
+            text.lists.push_back(layOutList(field, limit));
+        } else {
+            text.values.emplace_back(safe(describeKey(event.id, field.key)), showPlain(field));
+        }
     }
     return text;
 }
 
-std::string layOutProperties(const std::map<std::string, std::string>& properties) {
+Table layOut(const std::map<std::string, std::string>& properties) {
     Table table({{"Property", Table::Column::kCut},
                  {"Value", Table::Column::kCut},
-                 {"Meaning", Table::Column::kCut}});
+                 {"Meaning", Table::Column::kCut}},
+                properties.size());
     for (const auto& [name, value] : properties) {
         table.add({name, value, std::string(lookUp(kProperties, name))});
     }
-    return table.text(2);
+    return table;
 }
 
 }  // namespace report

@@ -4,8 +4,11 @@
 #include <cstdint>
 #include <map>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "report/Payload.h"
+#include "report/Table.h"
 
 namespace report {
 
@@ -16,16 +19,20 @@ struct Event {
     Fields fields;
 };
 
-/**
- * The event for a person: its time of day, id and meaning, then its values, of a list the first
- * `limit`. Rates are in Hz, times h:mm:ss.
- */
-std::string layOut(const Event& event, size_t limit);
+/** An event laid out for a person. Rates are in Hz, times h:mm:ss. */
+struct EventText {
+    std::string title;                                        // time of day, id and meaning
+    std::vector<std::pair<std::string, std::string>> values;  // what they are, and what they say
+    std::vector<Table> lists;
+};
+
+/** Lays `event` out; its lists show at most `limit` rows. */
+EventText layOut(const Event& event, size_t limit);
 
 /** A key "pkg/opPkg" of a list, as `nameApp` names the app. */
 std::string shortenApp(const std::string& app);
 
-/** Properties with their values and their meaning, as a table. */
-std::string layOutProperties(const std::map<std::string, std::string>& properties);
+/** Properties with their values and their meaning. */
+Table layOut(const std::map<std::string, std::string>& properties);
 
 }  // namespace report

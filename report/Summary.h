@@ -2,17 +2,11 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <map>
 #include <string>
-#include <vector>
 
-#include "report/CallReader.h"
-#include "report/DayTable.h"
-#include "report/EventText.h"
-#include "report/Reasons.h"
+#include "report/Journal.h"
 #include "report/Report.h"
 #include "report/Stdout.h"
-#include "report/Usage.h"
 
 namespace report {
 
@@ -24,46 +18,23 @@ public:
 
     bool wantsCalls() const override { return true; }
     void begin(const Input& input) override;
-    void take(const Record& record) override;
+    void take(const Record& record) override { mJournal.take(record); }
     void end(bool isWhole) override;
 
 private:
-    struct BootEvent {
-        int64_t boot;
-        Event event;
-    };
-
-    void takeBoot(const Record& record);
-    void takeCall(const Record& record);
-    void endBoot();
-
     void printOrigin();
-    void printDays();
     void printDay(const Day& day);
+    void printEvent(const Event& event);
     void printReasons();
-    void printProperties();
     void printEnd(bool isWhole);
-    std::string nameDay(const Day& day) const;
-    std::string heading(const std::string& text) const;
+    void printHeading(const std::string& text);
+    std::string emphasised(const std::string& text) const;
 
     Stdout* const mOut;
     const size_t mLimit;
     const bool mHasColours;
-
-    // Of the present input.
-    Input mInput;
-    CallReader mCalls;
-    Usage mUsage;
-    DayTable mDays;
-    std::vector<BootSlice> mSlices;
-    std::vector<DailyTick> mReports;
-    std::vector<BootEvent> mEvents;
-    std::map<std::string, std::string> mProperties;  // those that the library has set
-    int64_t mBoot = -1;                              // number of the present one
-    int64_t mAt = 0;                                 // the clock, ns
-    int64_t mBootAt = 0;                             // the clock at the boot, ns
-    int64_t mPlayed = 0;                             // ns of all boots before
-    int64_t mStarted = 0;                            // real time, ns
+    Journal mJournal;
+    int64_t mStarted = 0;  // real time, ns
 };
 
 }  // namespace report

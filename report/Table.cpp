@@ -14,6 +14,10 @@ constexpr size_t kMinCut = 10;  // what a column that is cut keeps at least
 }  // namespace
 
 void Table::add(const std::vector<std::string>& cells) {
+    if (mRows.size() == mLimit) {
+        ++mLeftOut;
+        return;
+    }
     std::vector<std::string>& row = mRows.emplace_back();
     for (const std::string& cell : cells) row.push_back(safe(cell));
 }
@@ -55,7 +59,29 @@ std::string Table::text(size_t indent) const {
     };
     addLine([&](size_t i) { return mColumns[i].title; });
     for (const auto& row : mRows) addLine([&](size_t i) { return row[i]; });
+    if (mLeftOut > 0) text += std::string(indent, ' ') + more() + " (--all shows them)\n";
     return text;
+}
+
+std::string Table::html() const {
+    const auto cell = [this](const char* tag, size_t i, const std::string& text) {
+        const bool isRight = mColumns[i].layout == Column::kRight;
+        return std::string("<") + tag + (isRight ? " class=\"number\">" : ">") + escape(text) +
+               "</" + tag + '>';
+    };
+    std::string html = "<table>\n<tr>";
+    for (size_t i = 0; i < mColumns.size(); ++i) html += cell("th", i, mColumns[i].title);
+    html += "</tr>\n";
+    for (const auto& row : mRows) {
+        html += "<tr>";
+        for (size_t i = 0; i < row.size(); ++i) html += cell("td", i, row[i]);
+        html += "</tr>\n";
+    }
+    return html + "</table>\n" + (mLeftOut > 0 ? "<p>" + more() + "</p>\n" : "");
+}
+
+std::string Table::more() const {
+    return "and " + std::to_string(mLeftOut) + " more";
 }
 
 }  // namespace report

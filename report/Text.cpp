@@ -80,6 +80,32 @@ std::string cut(const std::string& text, size_t columns) {
     return result.append(rest);
 }
 
+std::string escape(std::string_view text) {
+    std::string html;
+    for (const char c : text) {
+        switch (c) {
+            case '&':
+                html += "&amp;";
+                break;
+            case '<':
+                html += "&lt;";
+                break;
+            case '>':
+                html += "&gt;";
+                break;
+            case '"':
+                html += "&quot;";
+                break;
+            case '\'':
+                html += "&#39;";
+                break;
+            default:
+                html += c;
+        }
+    }
+    return html;
+}
+
 std::string formatDuration(int64_t ns) {
     const auto seconds = static_cast<long long>(ns / kNsPerSecond);
     char text[48];

@@ -21,6 +21,9 @@ size_t width(std::string_view text);
 /** `text`, made by `safe`, in at most `columns` columns: too long, it loses its middle. */
 std::string cut(const std::string& text, size_t columns);
 
+/** `text` as HTML shows it: none of it is markup. */
+std::string escape(std::string_view text);
+
 /** `ns` as h:mm:ss; parts of a second are left out. */
 std::string formatDuration(int64_t ns);
 
