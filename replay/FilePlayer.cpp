@@ -12,6 +12,7 @@
 #include "platform/PropertyService.h"
 #include "report/Check.h"
 #include "report/Lines.h"
+#include "report/Page.h"
 #include "report/Summary.h"
 #include "report/Timeline.h"
 #include "trace/FileIo.h"
@@ -49,6 +50,7 @@ FilePlayer::FilePlayer(const Options& options, Progress* progress)
     if (options.timeline) {
         mReports.push_back(std::make_unique<report::Timeline>(*options.timeline));
     }
+    if (options.page) mReports.push_back(std::make_unique<report::Page>(*options.page));
     for (const auto& report : mReports) mWantsCalls |= report->wantsCalls();
 }
 

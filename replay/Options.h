@@ -15,6 +15,7 @@ struct Options {
     bool printTrace = false;                // print the trace made from a capture, play nothing
     bool check = false;                     // compare with "expect" lines, print no lines
     std::optional<std::string> timeline;    // the file to write trace events to
+    std::optional<std::string> page;        // the file to write an HTML page to
     int jobs = 1;                           // captures that are played at once, at least 1
     std::optional<std::string> properties;  // the file that keeps them; in memory without
     std::vector<std::string> files;         // "-" is standard input

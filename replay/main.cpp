@@ -61,14 +61,18 @@ int main(int argc, char** argv) {
                    "write the day of one input as trace events to FILE, for a timeline viewer")
             ->type_name("FILE")
             ->excludes(printTrace);
+    app.add_option("--page", options.page, "write the summary of one input as an HTML page to FILE")
+            ->type_name("FILE")
+            ->excludes(printTrace);
     bool listCalls = false;
     app.add_flag("--list-calls", listCalls, "list the calls that a trace can make, and exit");
     app.add_option("FILE", options.files, "traces and captures; - is standard input");
     try {
         app.parse(argc, argv);
         if (options.files.empty() && !listCalls) throw CLI::RequiredError("FILE");
-        if (options.files.size() > 1 && options.timeline) {
-            throw CLI::ValidationError("--timeline", "takes one input");
+        if (options.files.size() > 1 && (options.timeline || options.page)) {
+            throw CLI::ValidationError(options.timeline ? "--timeline" : "--page",
+                                       "takes one input");
         }
     } catch (const CLI::ParseError& error) {
         const int status = app.exit(error) == 0 ? 0 : trace::kStatusBadInput;
