@@ -37,8 +37,8 @@ public:
     SDCImpl();
 
     /**
-     * A sensor was enabled or disabled for a connection. Only an enable has a `rate`. First the
-     * type's module is told, then, whatever the type, the chat-call monitor.
+     * A sensor was enabled or disabled for a connection. Only an enable has a `rate`. Tells the
+     * type's module first. Then tells the chat-call monitor, whatever the type.
      */
     void enableSuccess(bool enabled, int type, const std::string& pkg, const std::string& opPkg,
                        long long rate);
@@ -56,10 +56,10 @@ public:
     /** An event was dispatched. Costs one test unless the chat app holds the proximity sensor. */
     void process(const sensors_event_t& event);
 
-    /** The system notifies. Element 0 is the kind, and the kind gives the others their meaning. */
+    /** A notification of the system. Element 0 is its kind, which gives the others a meaning. */
     void setNotification(const Vector<int>& notification);
 
-    /** 1, 2 or 3: the phone charges, in that way. Any other state: it does not charge. */
+    /** 1, 2 and 3 are kinds of charging. Any other state is not charging. */
     void sendChargeState(int state);
 
     /** 1: the device has booted. Any other state: it is going down. */
@@ -72,8 +72,8 @@ public:
     void setRgbShotCount();
 
     // The host calls each of these every hour with the hour of the day, 0 to 23. They act at the
-    // hours given here and ignore the others. Of one hour, the host must call the report before the
-    // reset.
+    // hours given here and ignore the others. The host must call an hour's reports before its
+    // resets.
 
     void notifySdcClock(int hour);          // 8: reports sensor exceptions; 23: usage, chat calls
     void notifySdcReset(int hour);          // resets the same at the same hours

@@ -19,7 +19,8 @@ namespace android {
  *
  * A session lasts while that application holds the sensor. In a voice call, the display controller
  * should hold the sensor too and switch the screen off. If the phone stays near without that, it
- * has locked up: the monitor reports at once how far the phone moved before it went near.
+ * has locked up. The monitor then reports at once how the phone moved before it went near, as the
+ * spread of its accelerometer readings.
  *
  * Four counters of the day count in voice calls only, that is in voice mode 1 (handset) or 2
  * (speaker) with a camera state other than 1. They wrap at 32 bits. They are kept in

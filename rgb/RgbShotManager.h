@@ -18,13 +18,13 @@ namespace android {
  * Rations samples of the screen's colour, and takes them.
  *
  * A budget says how many samples may be taken now. Events on the device raise it to a number, at
- * once or later; a higher budget stays. Later raises wait in a queue. One at a time is taken out of
- * it and is "pending" until it is due. The host's sampling loop asks `allowRgbShot`, samples with
- * `getScreenPixcel` if it may, and ends on `stopRgbThread`.
+ * once or after a delay. A budget that is higher stays. Delayed raises wait in a queue. One at a
+ * time is taken out of the queue and stays pending until it is due. The host's sampling loop asks
+ * `allowRgbShot`, samples with `getScreenPixcel` if it may, and ends on `stopRgbThread`.
  *
- * Any thread may call any operation. None reports an error but `getScreenPixcel`. `mLock` guards
- * the queue, for one access at a time. The other fields have no lock: calls that race may lose a
- * raise or allow a sample twice.
+ * Any thread may call any operation. Only `getScreenPixcel` reports errors. `mLock` guards the
+ * queue, for one access at a time. The other fields have no lock: calls that race may lose a raise
+ * or allow a sample twice.
  */
 class SENSOR_PRIV_EXPORT RgbShotManager {
 public:
@@ -74,14 +74,13 @@ public:
     /** Queues a raise: when it is due, as `getCurrentMs` counts, and to what. */
     void queuePush(std::pair<long long, int> entry);
 
-    /** Drops the entry due first, of those due together the smallest raise, if there is one. */
+    /** Drops the first entry, if there is one: the earliest due, of these the smallest raise. */
     void queuePop();
 
     /** Whether the queue is empty. A pending entry is not in the queue. */
     bool isEmpty();
 
-    /** Empties the queue. The pending entry and the budget stay. Logs while `mLogSwitch` is not 0.
-     */
+    /** Empties the queue. Pending entry and budget stay. Logs while `mLogSwitch` is not 0. */
     void clearQueue();
 
     /** Notes the queue's first entry, if there is one, as the next to be pending. Returns 0. */
@@ -89,8 +88,8 @@ public:
 
     /**
      * If nothing is pending, takes the first entry out of the queue. Then, if the pending entry's
-     * time is over, raises the budget; in the very millisecond it is not over yet. An entry queued
-     * later waits behind the pending one, even if it is due earlier.
+     * due time has passed, raises the budget. A due time of this very millisecond has not passed.
+     * An entry queued later waits behind the pending one, even if it is due earlier.
      */
     void isTimeToShot();
 
@@ -106,8 +105,7 @@ public:
     bool stopRgbThread();
 
     /**
-     * Averages the colours of the display within `rect` into `rgbOut`, counts the sample,
-     * returns 1.
+     * Averages the display's colours within `rect` into `rgbOut`, counts the sample, returns 1.
      *  - `rect`: left, top, right, bottom, in pixels. Right and bottom are exclusive.
      *  - `rgbOut`: red, green, blue, 0 to 255.
      *
