@@ -4,16 +4,16 @@
 
 namespace android {
 
-/** A counter's place in the system properties. May be used from any thread; takes no lock. */
+/** A counter that lives in a system property. Any thread may use it. It takes no lock. */
 class CounterProperty {
 public:
-    /** `name` must outlive the object; a string literal is meant. */
+    /** `name` must outlive the object: pass a string literal. */
     constexpr explicit CounterProperty(const char* name) : mName(name) {}
 
-    /** The stored number, read by `parseInt32`; 0 if the property is unset or holds no number. */
+    /** The stored number as `parseInt32` reads it, or 0 if there is none. */
     int32_t load() const;
 
-    /** Writes `value` as decimal text. Whether the write succeeds is not looked at. */
+    /** Stores `value` as decimal text. A failed write goes unnoticed. */
     void store(int32_t value) const;
 
 private:

@@ -1,10 +1,10 @@
 #pragma once
 
 /**
- * Marks the classes and variables that the host links against. Everything else in the library is
- * hidden; `sensor-priv.map` keeps instances of other libraries' templates out of the exported list.
+ * Exports a class or a variable to the host. Everything else is hidden. `core/sensor-priv.map` must
+ * name it too: the map keeps instances of other libraries' templates from being exported.
  */
 #define SENSOR_PRIV_EXPORT __attribute__((visibility("default")))
 
-/** Marks what is nested in an exported class but is no business of the host's. */
+/** Hides a member of an exported class that does not concern the host. */
 #define SENSOR_PRIV_HIDDEN __attribute__((visibility("hidden")))

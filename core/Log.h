@@ -3,12 +3,12 @@
 #include <android/log.h>
 
 /**
- * The host's switch for the library's detailed log lines: they are written while it is not 0. It
- * lives in the vendor's sensor configuration library and is read without a lock.
+ * While this is not 0, the library writes its detailed log lines. The vendor's sensor configuration
+ * library defines it, the host writes it, and the library reads it without a lock.
  */
 extern int mLogSwitch;
 
-/** The one tag of all log lines of the library. */
+/** The tag of every log line of the library. */
 #define SENSOR_PRIV_LOG_TAG "_Z_ZSensorFusion"
 
 #define SENSOR_PRIV_LOGD(...) \

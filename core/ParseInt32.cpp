@@ -7,6 +7,7 @@
 namespace android {
 
 void parseInt32(const char* text, int32_t* value) {
+    // `strtol` would clamp at other numbers where a `long` has 64 bits.
     char* end = nullptr;
     const long long number = std::strtoll(text, &end, 10);
     if (end == text) return;

@@ -5,12 +5,9 @@
 namespace android {
 
 /**
- * Reads the decimal number at the start of `text` into `*value`. Blanks and a sign may precede it,
- * anything may follow it.
+ * Reads the decimal number at the start of `text` into `*value`. Blanks and a sign may precede it.
  *  - A number that does not fit 32 bits reads as the nearest one that does.
  *  - Text that does not start with a number leaves `*value` as it was.
- *
- * Every stored number is read here, so that it reads the same on 32-bit and 64-bit machines.
  */
 void parseInt32(const char* text, int32_t* value);
 

@@ -50,6 +50,8 @@ SDCImpl* SDCImpl::getInstance() {
     return mSDC;
 }
 
+// The order of creation is fixed. Modules post their first messages in it, and messages that are
+// due together run in it.
 SDCImpl::SDCImpl()
       : mRgbShot(RgbShot::getInstance()),
         mFlowingDataException(FlowingDataException::getInstance()),
@@ -100,6 +102,7 @@ void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
 }
 
 void SDCImpl::cleanupConnection(const String8& pkg, const String8& opPkg, int type) {
+    // [sic] The test guards the first use only. A `String8` is never null, so both uses are safe.
     if (pkg.string() != nullptr) handleCleanupConnection(type, pkg.string(), opPkg.string());
     mWechatProxException->enableSuccess(false, type, pkg.string(), opPkg.string());
 }
@@ -108,11 +111,13 @@ void SDCImpl::handleCleanupConnection(int type, std::string pkg, std::string opP
     handleDisable(type, pkg, opPkg);
 }
 
+// The host dispatches every event through here, so nothing else belongs here.
 void SDCImpl::process(const sensors_event_t& event) {
     mWechatProxException->process(event);
 }
 
 void SDCImpl::setNotification(const Vector<int>& notification) {
+    // Both see every notification. Each takes the kinds that it knows.
     mWechatProxException->setNotification(notification);
     mRegisterInfo->setNotification(notification);
 }
@@ -147,6 +152,7 @@ void SDCImpl::notifySdcReset(int hour) {
     if (hour == kExceptionHour) {
         mFlowingDataException->notifyFlowReset();
     } else if (hour == kNightHour) {
+        // These resets act at once. A report of this hour that is still posted sees their effect.
         mMagneticUseIf->notifyMagReset();
         mWechatProxException->resetWechatCount();
         mRegisterInfo->notifyRegisterInfoReset();
@@ -161,6 +167,7 @@ void SDCImpl::notifyRgbShotReset(int hour) {
     if (hour == kMorningHour) mRgbShot->notifyRgbShotReset();
 }
 
+// `UltraException` is no member, so that its first use creates it.
 void SDCImpl::putPhoneOpenUltraTally(int hour) {
     if (hour == kMorningHour) UltraException::getInstance()->putPhoneOpenUltraTally();
 }

@@ -18,86 +18,69 @@ class RgbShot;
 class WechatProxException;
 
 /**
- * The object through which the sensor service feeds the statistics modules: it routes each call by
- * sensor type or by hour of the day, and keeps no state of its own.
+ * The sensor service's entrance to the statistics modules. It routes each call by sensor type or by
+ * hour of the day and keeps no state of its own.
  *
- * All operations may be called from any thread and take no lock but those of the modules that they
- * reach. None reports an error.
+ * Any thread may call any operation. Only the modules behind it lock. None reports an error.
  *
- * `pkg` is the connection's package name (of a component of the system server, its listener's class
- * name), `opPkg` the package that owns it; `type` is a sensor type of the platform. Types without a
- * route do nothing.
+ * What the arguments mean:
+ *  - `pkg`: the connection's package name; for a component of the system server, the class name of
+ *    its listener.
+ *  - `opPkg`: the package that owns the connection.
+ *  - `type`: the platform's sensor type. Types without a route are ignored.
  */
 class SENSOR_PRIV_EXPORT SDCImpl {
 public:
-    /**
-     * The single instance; the first call creates it and with it, in the order of its members, the
-     * modules, and with the first of these the worker thread. Locks `sLock`.
-     */
+    /** The single instance. The first call creates it, its modules and the worker thread. */
     static SDCImpl* getInstance();
 
     SDCImpl();
 
     /**
-     * A sensor was enabled, or disabled, for a connection; `rate` belongs to an enable only. After
-     * the module of the type's route, the chat-call monitor sees it, whatever the type.
+     * A sensor was enabled or disabled for a connection. Only an enable has a `rate`. Tells the
+     * type's module first. Then tells the chat-call monitor, whatever the type.
      */
     void enableSuccess(bool enabled, int type, const std::string& pkg, const std::string& opPkg,
                        long long rate);
 
+    // These tell the type's module only.
     void handleEnable(int type, std::string pkg, std::string opPkg, long long rate);
     void handleDisable(int type, std::string pkg, std::string opPkg);
 
-    /** A connection was closed that still had `type` enabled: counts as a disable. */
+    /** A connection closed while it had `type` enabled. Counts as a disable. */
     void cleanupConnection(const String8& pkg, const String8& opPkg, int type);
 
+    /** Does what `handleDisable` does. */
     void handleCleanupConnection(int type, std::string pkg, std::string opPkg);
 
-    /**
-     * Hands on an event that the host dispatches. It is called for every one of them: unless the
-     * chat application holds the proximity sensor it costs one test of a flag.
-     */
+    /** An event was dispatched. Costs one test unless the chat app holds the proximity sensor. */
     void process(const sensors_event_t& event);
 
-    /**
-     * Hands on a notification, to the chat-call monitor first: element 0 is its kind, the rest is
-     * as the kind has it.
-     */
+    /** A notification of the system. Element 0 is its kind, which gives the others a meaning. */
     void setNotification(const Vector<int>& notification);
 
-    /** The charge state: 1, 2 and 3 are kinds of charging, any other is none. */
+    /** 1, 2 and 3 are kinds of charging. Any other state is not charging. */
     void sendChargeState(int state);
 
-    /** 1: the device has booted; any other: it is going down. */
+    /** 1: the device has booted. Any other state: it is going down. */
     void sendBootShutdownRebootState(int state);
 
-    /** The host's count of days. */
+    /** The host's day counter. */
     void sendUsedTime(int uds);
 
     /** Counts one screen sample. */
     void setRgbShotCount();
 
-    // The host calls each of these once an hour with the hour of the day, 0 to 23; they act on one
-    // or two hours each and ignore the rest. Reports come before the resets of the same hour
-    // because the host calls them in that order; nothing here enforces it.
+    // The host calls each of these every hour with the hour of the day, 0 to 23. They act at the
+    // hours given here and ignore the others. The host must call an hour's reports before its
+    // resets.
 
-    /** 8: the daily report of sensor exceptions. 23: the daily reports. */
-    void notifySdcClock(int hour);
-
-    /** 8: the daily reset of sensor exceptions. 23: the daily resets. */
-    void notifySdcReset(int hour);
-
-    /** 7: the daily report of screen samples. */
-    void putRgbShotTally(int hour);
-
-    /** 7: the daily reset of screen samples. */
-    void notifyRgbShotReset(int hour);
-
-    /** 7: the daily report of the ultrasonic proximity sensor. */
-    void putPhoneOpenUltraTally(int hour);
-
-    /** 7: the daily reset of the ultrasonic proximity sensor. */
-    void notifyUltraReset(int hour);
+    void notifySdcClock(int hour);          // 8: reports sensor exceptions; 23: usage, chat calls
+    void notifySdcReset(int hour);          // resets the same at the same hours
+    void putRgbShotTally(int hour);         // 7: reports screen samples
+    void notifyRgbShotReset(int hour);      // 7: resets them
+    void putPhoneOpenUltraTally(int hour);  // 7: reports the ultrasonic proximity sensor
+    void notifyUltraReset(int hour);        // 7: resets it
 
 private:
     // Constant after construction.

@@ -11,55 +11,49 @@
 namespace android {
 
 /**
- * The library's one worker thread, "sensor_native_handler". Every statistics module does its slow
- * work there: it posts small message codes to its own `MessageHandler`, whose `handleMessage` then
- * runs on the worker, one message at a time, in the order of due times and, for equal due times, in
- * the order of posting.
+ * The library's one worker thread, "sensor_native_handler". The statistics modules do their slow
+ * work on it: they post message codes, and the worker runs their handlers, one message at a time.
+ * Messages run in order of their due times, those due at the same time in order of posting.
  *
- * All operations may be called from any thread, the worker included. None reports an error, none
- * takes a lock of this class; the Looper's own lock orders them. Each wakes the loop first and then
- * changes the queue.
+ * Any thread may call any operation, the worker included. The Looper's own lock orders them. No
+ * operation reports an error.
  *
  * How a module uses it:
- *  - it nests a handler class without state, created in its constructor and kept in a member `sp`;
- *  - the handler switches on `message.what`, fetches the module by `getInstance()` and calls one of
- *    its members; codes that it does not know are ignored;
- *  - a code that must be pending at most once is removed before it is posted again.
+ *  - It nests a `MessageHandler` without state, creates it in its constructor and keeps an `sp`.
+ *  - The handler switches on `message.what` and calls a member of `getInstance()`. It ignores codes
+ *    that it does not know.
+ *  - To keep at most one message of a code pending, the module removes the code before posting it.
  */
 class SENSOR_PRIV_EXPORT SensorHandlerThread : public Thread {
 public:
-    /** The single instance; the first call creates it and so starts the thread. Locks `sLock`. */
+    /** The single instance. The first call creates it and starts the thread. Locks `sLock`. */
     static SensorHandlerThread* getInstance();
 
     /**
-     * Starts the thread at once, with that name and priority and the default stack size. If the
-     * thread cannot be created, an error goes to the log, messages queue up and are never
-     * delivered, and the object is never destroyed.
+     * Starts the thread with the default stack size. If no thread can be created, the log gets an
+     * error, messages queue up undelivered, and the object is never destroyed.
      */
     SensorHandlerThread(const char* name, int priority);
 
-    /** Ends the loop as `quit()` does; does not wait for the thread. */
+    /** Quits. Does not wait for the thread. */
     ~SensorHandlerThread() override;
 
     /** Posts `what`, due now. */
     void sendMessage(const sp<MessageHandler>& handler, int what);
 
-    /** Posts `what`, due in `delayMs` milliseconds of the monotonic clock; at once if negative. */
+    /** Posts `what`, due in `delayMs` monotonic milliseconds. A negative delay is due now. */
     void sendMessageDelayed(const sp<MessageHandler>& handler, int what, int delayMs);
 
-    /** Drops every pending `what` of `handler`, delayed ones included, and nothing else. */
+    /** Drops the handler's pending messages with the code `what`, delayed ones too. */
     void removeMessage(const sp<MessageHandler>& handler, int what);
 
-    /** Drops every pending message of `handler`; those of other handlers stay. */
+    /** Drops all pending messages of the handler. */
     void removeAllMessages(const sp<MessageHandler>& handler);
 
-    /** Runs messages until `quit()` or `requestExit()`; always returns false. */
+    /** Runs messages until `quit()` or `requestExit()`. Returns false. */
     bool threadLoop() override;
 
-    /**
-     * Lets the loop end after what is due now. Messages that are still queued, or posted later, are
-     * never delivered. A second call does nothing.
-     */
+    /** Ends the loop after what is due now. No later message is delivered. Safe to call twice. */
     void quit();
 
 private:
@@ -67,7 +61,7 @@ private:
     const sp<Looper> mLooper;
     String8 mText;  // part of the class's layout; always empty
 
-    // Written by the quitting thread and read by the worker after a wake, without a lock.
+    // Written by the threads that quit and read by the worker, without a lock.
     bool mQuit;
 
     static Mutex sLock;

@@ -15,6 +15,7 @@ void SharedText::set(const std::string& text) {
 }
 
 std::string SharedText::get() const {
+    // During a `set`, bytes that it has not reached yet are those of an older name, or 0.
     std::string text(mSize.load(std::memory_order_relaxed), '\0');
     for (size_t i = 0; i < text.size(); ++i) text[i] = mBytes[i].load(std::memory_order_relaxed);
     return text;

@@ -8,13 +8,11 @@
 namespace android {
 
 /**
- * A name that several threads write and read without a lock.
+ * A name that threads write and read without a lock. Holds up to 1023 bytes and cuts longer names
+ * there.
  *
- * It holds up to 1023 bytes, NULs included. A longer name is cut there.
- *
- * All operations may be called from any thread at any time and never wait. A call that runs beside
- * a `set` may return a mix of the old name and the new one. Two `set`s that run at once may leave
- * such a mix behind until the next `set`.
+ * Any thread may call any operation. None waits. A `get` during a `set` may return a mix of both
+ * names. Two `set`s at once may leave a mix behind.
  */
 class SharedText {
 public:

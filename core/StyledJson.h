@@ -6,7 +6,7 @@
 
 namespace android {
 
-/** `value` as jsoncpp's styled writer lays it out, without the line breaks: indentation stays. */
+/** `value` in jsoncpp's styled layout without its line breaks. The indentation stays. */
 std::string styledOnOneLine(const Json::Value& value);
 
 }  // namespace android

@@ -39,6 +39,7 @@ void TallyCommon::trackEvent(std::string eventId, std::map<std::string, std::str
 }
 
 void TallyCommon::setTally(DataWrapper data) {
+    // [sic] The line has an error's level, although nothing is wrong.
     if (mLogSwitch != 0) SENSOR_PRIV_LOGE("SDC Event = %s", data.eventId.c_str());
     track_event(mModuleId.c_str(), data.eventId.c_str(), data.payload.c_str());
 }
@@ -68,19 +69,24 @@ void TallyCommon::splitStr(const std::string& text, const std::string& delimiter
                            std::vector<std::string>& out) {
     std::vector<std::string> pieces;  // `text` and `delimiter` may lie in `out`
     size_t begin = 0;
+    // [sic] The first cut looks for any character of the delimiter, the others look for all of it.
+    // A delimiter of one character makes no difference.
     size_t end = delimiter.empty() ? std::string::npos : text.find_first_of(delimiter);
     while (end != std::string::npos) {
         pieces.push_back(text.substr(begin, end - begin));
         begin = end + delimiter.size();
         end = text.find(delimiter, begin);
     }
+    // `begin` may lie past the end, as the first cut skips more than the one character it found.
     pieces.push_back(text.substr(std::min(begin, text.size())));
     out = std::move(pieces);
 }
 
 void TallyCommon::BootNotFinish() {
+    // Another thread may set the flag during the nap.
     while (!mBootFinished) {
         char text[PROP_VALUE_MAX] = {};
+        // [sic] "unkown": any text would do that is no number.
         property_get("service.bootanim.exit", text, "unkown");
         int32_t exited = 0;
         parseInt32(text, &exited);

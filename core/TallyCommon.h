@@ -10,35 +10,32 @@
 
 namespace android {
 
-/** One telemetry event, ready to be handed over. */
+/** A telemetry event. */
 struct DataWrapper {
-    std::string eventId;  // in full: the module id, a bar and five digits, as in "N273|10009"
-    std::string payload;  // as `TallyCommon::convertMapToTally` builds it
+    std::string eventId;  // module id, bar and five digits, as in "N273|10009"
+    std::string payload;  // see `TallyCommon::convertMapToTally`
 };
 
 /**
- * The one place through which statistics modules send telemetry, with the text helpers that they
- * share. May be called from any thread; apart from `getInstance()` nothing locks.
+ * Sends the telemetry of all statistics modules, and holds the text helpers that they share. Any
+ * thread may call any operation. Only `getInstance()` locks.
  */
 class SENSOR_PRIV_EXPORT TallyCommon {
 public:
-    /** The single instance, created by the first call. Locks `sLock`. */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static TallyCommon* getInstance();
 
     TallyCommon();
 
-    /**
-     * Sends `params` as the event `eventId`, on the caller's thread. Nothing is reported back and
-     * nothing is kept for a retry.
-     */
+    /** Sends an event on the caller's thread. An event that fails is lost without a word. */
     void trackEvent(std::string eventId, std::map<std::string, std::string> params);
 
-    /** Logs the event id while `mLogSwitch` is on, then hands the event to `track_event`. */
+    /** Hands an event to `track_event`. While `mLogSwitch` is not 0, logs its id first. */
     void setTally(DataWrapper data);
 
     /**
-     * `params` as key:value pairs joined by "&", in ascending bytewise order of the keys. Nothing
-     * is escaped: keys and values must do without ":" and "&". An empty map gives an empty text.
+     * Joins `params` as "key:value" pairs with "&", in bytewise order of the keys. Nothing is
+     * escaped, so keys and values must do without ":" and "&". An empty map gives an empty text.
      */
     std::string convertMapToTally(std::map<std::string, std::string> params);
 
@@ -47,23 +44,23 @@ public:
     std::string longToStr(long value);
 
     /**
-     * Cuts `text` at every `delimiter` and puts the pieces, empty ones included, into `out`, which
-     * then holds at least one piece. `text` and `delimiter` may lie in `out`. Meant for delimiters
-     * of one character: of a longer one, the first cut is made at any of its characters.
+     * Cuts `text` at every `delimiter` into `out`: one piece or more, empty ones included. `text`
+     * and `delimiter` may be elements of `out`. Use delimiters of one character: with a longer one,
+     * the first cut is at the first occurrence of any of its characters.
      */
     void splitStr(const std::string& text, const std::string& delimiter,
                   std::vector<std::string>& out);
 
     /**
-     * Blocks the caller until the property "service.bootanim.exit" reads 1, looking every 200 ms
-     * for as long as it takes. Returns at once if any earlier call has seen that.
+     * Blocks until the property "service.bootanim.exit" reads 1. Looks every 200 ms, without a
+     * time-out. Returns at once after any call has seen the 1.
      */
     void BootNotFinish();
 
 private:
     const std::string mModuleId;  // constant after construction
 
-    // Set once and never cleared; read and written by every waiting thread without a lock.
+    // Every waiting thread reads it and may set it, without a lock. Nothing clears it.
     bool mBootFinished;
 
     static Mutex sLock;

@@ -21,6 +21,7 @@ namespace android {
 
 namespace {
 
+// The codes 8 and 9 mean nothing.
 enum : int {
     MSG_LOAD = 1,
     MSG_COUNT = 2,    // plus the slot
@@ -28,7 +29,10 @@ enum : int {
     MSG_RESET = 16,
 };
 
-/** By slot; the first type stands for the family in reports, 0 is none. */
+/**
+ * By slot. The first type stands for the family in reports. 0 is no type. The slots are in the
+ * order of the stored record, which is not that of the types.
+ */
 constexpr struct {
     int sensorTypes[4];
     const char* eventId;
@@ -50,7 +54,7 @@ constexpr int kResetDelayMs = 2000;
 
 constexpr char kRecordProperty[] = "persist.zuno.flow.detect.count";
 constexpr char kNoRecord[] = "unknown";
-constexpr size_t kRecordLimit = 90;  // what fits a property's value
+constexpr size_t kRecordLimit = 90;  // what fits a property; six numbers never reach it
 
 constexpr int32_t kReportedSeconds = 1800;
 constexpr const char* kSystemPackages[] = {"com.android.incallui", "com.android.mms",
@@ -58,6 +62,7 @@ constexpr const char* kSystemPackages[] = {"com.android.incallui", "com.android.
                                            "com.zuno"};
 
 int slotOfType(int sensorType) {
+    // Type 0 would match the unused places of the table.
     if (sensorType <= 0) return kNoSlot;
     for (size_t slot = 0; slot < std::size(kFamilyTable); ++slot) {
         const auto& types = kFamilyTable[slot].sensorTypes;
@@ -120,6 +125,7 @@ void FlowingDataException::putDetectTally() {
     SensorHandlerThread* thread = SensorHandlerThread::getInstance();
     for (int slot = 0; slot < kFamilies; ++slot) thread->sendMessage(mHandler, MSG_REPORT + slot);
     thread->sendMessage(mHandler, MSG_RESET);
+    // The second reset clears what is counted after the first one.
     thread->sendMessageDelayed(mHandler, MSG_RESET, kResetDelayMs);
 }
 
@@ -135,6 +141,7 @@ void FlowingDataException::notifyPutTally(int code) {
 }
 
 void FlowingDataException::putFamilyTally(int slot) {
+    // `notifyPutTally` reads the count here while the worker may write it, on purpose.
     setSensorException(kFamilyTable[slot].sensorTypes[0], mDetectCount[slot]);
 }
 
@@ -145,6 +152,7 @@ void FlowingDataException::initDetectCount() {
         resetDetectCount();
         return;
     }
+    // The counts take the fields at once. A wrong number of fields resets them in the end.
     int fields = 0;
     char* rest = nullptr;
     for (char* field = strtok_r(text, ",", &rest); field != nullptr;
@@ -166,6 +174,7 @@ void FlowingDataException::updateDetectCountByType(int code) {
 }
 
 void FlowingDataException::resetDetectCount() {
+    // Written while `mLogSwitch` is 0 too.
     SENSOR_PRIV_LOGD("sd resetDetectCount");
     std::fill(std::begin(mDetectCount), std::end(mDetectCount), 0);
     storeDetectCount();
@@ -183,6 +192,7 @@ void FlowingDataException::storeDetectCount() {
 void FlowingDataException::setSensorException(int sensorType, int count) {
     const int slot = slotOfType(sensorType);
     if (slot == kNoSlot || count == 0) return;
+    // [sic] The key is "reason", although the value is a count.
     TallyCommon::getInstance()->trackEvent(kFamilyTable[slot].eventId,
                                            {{"reason", convertIntToString(count)}});
 }
@@ -197,9 +207,11 @@ std::string FlowingDataException::convertIntToString(int value) {
 }
 
 void FlowingDataException::setProxEnable(std::string pkg, std::string opPkg) {
+    // Read before the lock, so that the wait for it does not count.
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
     Mutex::Autolock lock(mProxLock);
     ProxInfo& info = mProxInfoMap[connectionKey(pkg, opPkg)];
+    // Each nesting loses the fraction of a second, on purpose.
     if (info.startTime != 0) {
         info.duration = addWrapped(info.duration, secondsBetween(info.startTime, now));
     }

@@ -82,6 +82,7 @@ public:
 
 Mutex UltraException::sLock;
 UltraException* UltraException::mUltraException = nullptr;
+// Decided while the library is loaded. A property that is set later changes nothing.
 const bool UltraException::isOverseas = getOverseas();
 
 UltraException* UltraException::getInstance() {
@@ -102,11 +103,13 @@ UltraException::~UltraException() = default;
 bool UltraException::getOverseas() {
     char value[PROP_VALUE_MAX] = {};
     property_get("ro.zuno.product.overseas", value, "no");
+    // Two letters decide, so "none" means no as well.
     return strncasecmp(value, "no", 2) != 0;
 }
 
 void UltraException::doAction(int code, const UltraExceptionInfo& info) {
     if (isOverseas) return;
+    // These act at once. Actions that still wait for the worker see their effect.
     if (code == MSG_PHONE_STATE) {
         mPhoneState = info.phoneState;
     } else if (code == MSG_ENABLED) {
@@ -139,6 +142,7 @@ void UltraException::resetUltraStatus() {
 void UltraException::putPhoneOpenUltraTally() {
     if (mPhoneEnableCount == 0) return;
     sendEvent(kEventId, DAILY, mInvalidCount, mPhoneEnableCount);
+    // Posted, so that it follows the actions that still wait for the worker.
     notifyUltraReset();
 }
 
@@ -154,6 +158,7 @@ void UltraException::initUltraSoundCount() {
     mDeviceInvalidCount = kDeviceInvalidProperty.load();
     mRouteInvalidCount = kRouteInvalidProperty.load();
     mRxCloseCount = kRxCloseProperty.load();
+    // Written while `mLogSwitch` is 0 too.
     SENSOR_PRIV_LOGD("PF, enable:%d device:%d route:%d close:%d.", mEnableCount,
                      mDeviceInvalidCount, mRouteInvalidCount, mRxCloseCount);
 }
@@ -161,6 +166,7 @@ void UltraException::initUltraSoundCount() {
 void UltraException::increaseEnableUltrasoundCount() {
     if (mPhoneState != 0) mUltraOpenedInCall = true;
     if (mEnableCount <= kLastCounted) ++mEnableCount;
+    // A full count has not risen, but is stored again.
     kEnableProperty.store(mEnableCount);
 }
 
@@ -189,6 +195,7 @@ void UltraException::countFailure(int32_t* count, int code, const CounterPropert
     updateUltraInvalid();
     if (*count > kLastCounted) return;
     ++*count;
+    // The order is fixed: first the event, then the property.
     trackEvent(kEventId, code, *count);
     property.store(*count);
 }
@@ -198,6 +205,7 @@ void UltraException::trackEvent(std::string eventId, int code, int count) {
 }
 
 void UltraException::sendEvent(std::string eventId, int code, int32_t failures, int32_t uses) {
+    // [sic] The key "TempInvalidRate" begins with a capital letter.
     TallyCommon::getInstance()->trackEvent(
             std::move(eventId), {{"pkg", mPackageName.get()},
                                  {"ultraExpired", std::to_string(code)},
@@ -207,12 +215,14 @@ void UltraException::sendEvent(std::string eventId, int code, int32_t failures, 
 
 void UltraException::updatePhoneOpenUltraCount() {
     if (mPhoneState != 0) {
+        // Only the whole text "unknown" means that no app is known.
         if (mPackageName.get() != kUnknownPackage) mUltraOpenedInCall = true;
         return;
     }
     mInvalidCountedInCall = false;
     if (!mUltraOpenedInCall) return;
     mUltraOpenedInCall = false;
+    // This count wraps, unlike the others, which stop.
     mPhoneEnableCount = addWrapped(mPhoneEnableCount, 1);
     kPhoneEnableProperty.store(mPhoneEnableCount);
 }

@@ -15,126 +15,101 @@ namespace android {
 
 class CounterProperty;
 
-/** What the host tells with an action of the ultrasonic proximity sensor. */
+/** What comes with an action of the ultrasonic proximity sensor. */
 struct UltraExceptionInfo {
-    // The app that uses the sensor; read with an enable (3). Bytes past 1023 are cut.
-    std::string packageName;
-    int32_t phoneState = 0;  // 0: no phone call; read with a change of the phone state (6)
+    std::string packageName;  // of the enabling app; bytes after the 1023rd are cut; for action 3
+    int32_t phoneState = 0;   // 0: no phone call; for action 6
 };
 
-/** For the actions that read nothing of it. Each source file that includes this has its own. */
+/** For the other actions. Each source file that includes this header has its own. */
 const UltraExceptionInfo kNoUltraExceptionInfo;
 
 /**
- * Watches the ultrasonic proximity sensor: counts its enables, its failures, the phone calls that
- * use it and those among them that see a failure. Reports each failure at once and the calls once a
- * day, all as "N273|10011", with the latest energies that the sensor has told.
+ * Watches the ultrasonic proximity sensor. All its events are "N273|10011" and carry the latest
+ * energies. A failure is reported at once, calls are reported daily. Each count has a property:
  *
- * Each count is kept in a property of its own and written when it is counted:
+ *     enables                      "persist.zuno.ultra.enable.count"
+ *     calls that used the sensor   "persist.zuno.ultra.phone.enable.count"
+ *     calls that saw a failure     "persist.zuno.ultra.invalid.count"
+ *     invalid devices              "persist.zuno.device.invalid.count"
+ *     invalid routes               "persist.zuno.route.invalid.count"
+ *     receiver closures            "persist.zuno.rx.close.count"
  *
- *     enables            "persist.zuno.ultra.enable.count"
- *     calls              "persist.zuno.ultra.phone.enable.count"
- *     calls that failed  "persist.zuno.ultra.invalid.count"
- *     invalid devices    "persist.zuno.device.invalid.count"
- *     invalid routes     "persist.zuno.route.invalid.count"
- *     receiver closures  "persist.zuno.rx.close.count"
+ * The daily reset zeroes the two counts of calls. The others grow for the life of the device. The
+ * calls that used the sensor wrap at 32 bits; the others stop at 2147483646.
  *
- * The daily reset takes the two counts of calls; the other four grow for the life of the device.
- * Each stops at 2147483646, but for the calls, which wrap at 32 bits.
+ * On an overseas device nothing is watched. This is decided when the library is loaded.
  *
- * On a device for an overseas market nothing is watched: `isOverseas` has the answer of
- * `getOverseas()` at the time when the library was loaded.
- *
- * The operations that the worker thread runs say so; the host may call them too. The others are the
- * host's, from any thread. But for `getInstance()` nothing locks.
+ * Any thread may call any operation. Only `getInstance()` locks.
  */
 class SENSOR_PRIV_EXPORT UltraException {
 public:
-    /**
-     * The single instance; the first call creates it and, unless overseas, posts the load of the
-     * stored counts, due 2000 ms later. Locks `sLock`.
-     */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static UltraException* getInstance();
 
+    /** Posts the load of the stored counts, due in 2000 ms, unless overseas. */
     UltraException();
     virtual ~UltraException();
 
-    /**
-     * Whether the property "ro.zuno.product.overseas", read anew, makes this an overseas device:
-     * any value but one that begins with "no" in any case does. Unset it does not.
-     */
+    /** Whether "ro.zuno.product.overseas" is set now and does not begin with "no" in any case. */
     static bool getOverseas();
 
     /**
-     * Takes an action of the sensor; nothing if overseas. An enable takes the package and a change
-     * of the phone state takes that state, at once on the caller's thread. Then the action is
-     * posted, after one with the same code that still waits has been dropped: the two run as one.
+     * Takes an action of the sensor, unless overseas. 3 notes the package and 6 the phone state, at
+     * once. Then the code is posted. If the same code still waits, it is dropped: two count as one.
      *
      *     1  load                   4  device invalid       7  daily reset
-     *     2  receiver closed        5  route invalid        other codes are posted and ignored
+     *     2  receiver closed        5  route invalid        other codes do nothing
      *     3  enabled                6  phone state changed
      */
     void doAction(int code, const UltraExceptionInfo& info);
 
     /**
-     * Takes an energy from a sensor event whose `data[3]` tells which: 301 the background's, 302
-     * the fluctuant one. `data[4]` is the energy. Both are truncated to 32-bit integers. Other
-     * events are ignored; nothing is taken if overseas. Logs the energy while `mLogSwitch` is on.
+     * Takes the energy `data[4]` of a sensor event, unless overseas. `data[3]` tells which: 301
+     * background, 302 fluctuant, other: none. Both are truncated to 32 bits. Logs the energy while
+     * `mLogSwitch` is not 0.
      */
     void setUltraEnergy(const sensors_event_t& event);
 
     /** Sets the energies to 0 and the package to "unknown". */
     void resetUltraStatus();
 
-    /**
-     * Unless no call has been counted: sends the daily report on the caller's thread and posts the
-     * reset, which runs after all that has been posted before.
-     */
+    /** If a call was counted: sends the daily report on the caller's thread, posts the reset. */
     void putPhoneOpenUltraTally();
 
     /** Posts the reset of the calls, overseas too. */
     void notifyUltraReset();
 
+    // The worker thread runs the rest. The host may call it too.
+
     /**
-     * Worker thread: loads the stored counts, 0 for what is no number. What was counted before is
-     * lost unless it has by then replaced the stored count.
+     * Loads the stored counts. Text that is no number reads as 0. A count that rose before the load
+     * has already overwritten the stored one.
      */
     void initUltraSoundCount();
 
-    /**
-     * Worker thread: counts an enable; during a call, the call then counts as one that uses the
-     * sensor. The count is stored even if it did not rise.
-     */
+    /** Counts an enable and stores the count. In a call: marks the call as using the sensor. */
     void increaseEnableUltrasoundCount();
 
-    // Worker thread: the failures, in events with the code 102, 101 and 100. Each does what
-    // `updateUltraInvalid` does first. Then, unless its count has reached its limit, it raises the
-    // count, sends it by `trackEvent` and only then stores it.
-
+    // Failures, with the codes 102, 101 and 100. Each first runs `updateUltraInvalid`. Unless its
+    // count is full, it then raises the count, sends it by `trackEvent` and stores it.
     void recordRxClose();
     void setUltraDeviceInvalid();
     void setUltraRouteInvalid();
 
     /**
-     * Worker thread: while there is a call, and an app has enabled the sensor since it was reset,
-     * the call counts as one that uses the sensor. When there is none, the last one has ended: it
-     * is counted if it did, and the next call can fail again.
+     * In a call: marks it as using the sensor if an app is known. Otherwise: counts the call that
+     * ended, if it was marked, and rearms failure counting.
      */
     void updatePhoneOpenUltraCount();
 
-    /** Worker thread: sets the calls and the failed calls to 0 and stores both, in this order. */
+    /** Sets calls and failed calls to 0 and stores them, in this order. */
     void resetPhoneOpenUltraCount();
 
-    /**
-     * Worker thread: counts a failed call and stores the count, at most once until a call ends.
-     * Only if the package's name contains that of the in-call screen, "com.android.incallui".
-     */
+    /** Counts the call as failed and stores that, once a call, if the in-call screen is the app. */
     void updateUltraInvalid();
 
-    /**
-     * Sends an event with `code` as "ultraExpired", the share of `count` in the enables as
-     * "TempInvalidRate", the package and the energies.
-     */
+    /** Sends `code`, the ratio of `count` to all enables, the package and the energies. */
     void trackEvent(std::string eventId, int code, int count);
 
 private:
@@ -148,11 +123,10 @@ private:
     // Constant after construction.
     const sp<UltraExceptionHandler> mHandler;
 
-    // What follows is read and written by the host's calls and by the worker thread without a lock,
-    // on purpose: no call of the host's waits for the worker.
+    // The host's threads and the worker share the rest without a lock, so that no host call waits.
     int64_t mLoadTime = -1;  // elapsed real time of the load, ns; -1: not loaded
 
-    // Part of the class's layout; nothing reads them.
+    // Nothing reads these. They are part of the class's layout.
     [[maybe_unused]] const int64_t mDayMs = 86'400'000;
     [[maybe_unused]] const int64_t mDayNs = 86'400'000'000'000;
     [[maybe_unused]] const int64_t mDayTime = -1;
@@ -167,8 +141,8 @@ private:
     int32_t mBackgroundEnergy = 0;
     SharedText mPackageName;             // of the latest enable, "unknown": none
     int32_t mPhoneState = 0;             // 0: no phone call
-    bool mUltraOpenedInCall = false;     // the present call uses the sensor
-    bool mInvalidCountedInCall = false;  // the present call has been counted as failed
+    bool mUltraOpenedInCall = false;     // this call uses the sensor
+    bool mInvalidCountedInCall = false;  // this call was counted as failed
 
     static Mutex sLock;
     static UltraException* mUltraException GUARDED_BY(sLock);

@@ -25,7 +25,7 @@ enum : int { MSG_LOAD = 1, MSG_CHECK = 2, MSG_SAVE = 3, MSG_REPORT = 4 };
 constexpr int kLoadDelayMs = 2000;
 constexpr int kCheckDelayMs = 100;
 constexpr int kLastCheck = 5;
-constexpr int64_t kMinSampleSpanNs = 20'000'001;
+constexpr int64_t kMinSampleSpanNs = 20'000'001;  // more than 20 ms: 20 ms itself is too short
 
 constexpr int kNear = 0;
 constexpr int kFar = 5;
@@ -79,6 +79,7 @@ WechatProxException::~WechatProxException() = default;
 void WechatProxException::enableSuccess(bool enabled, int type, const std::string& pkg,
                                         const std::string& opPkg) {
     const bool isChatApp = nameHolds(opPkg, kChatApp);
+    // Clears the readings, but not their count.
     if (type == SENSOR_TYPE_ACCELEROMETER && enabled && isChatApp) mAccSamples.fill({});
     if (type != SENSOR_TYPE_PROXIMITY) return;
     handleProxWakeLock(pkg, enabled);
@@ -91,6 +92,7 @@ void WechatProxException::enableSuccess(bool enabled, int type, const std::strin
         mWechatProxEnabled = true;
         return;
     }
+    // Not tested for an open session: a second disable counts the last session again.
     mAccCount = 0;
     mWechatProxEnabled = false;
     if (mNearSeen) mTotalCount = addWrapped(mTotalCount, 1);
@@ -106,6 +108,7 @@ void WechatProxException::handleProxWakeLock(const std::string& pkg, bool enable
     if (mWechatProxEnabled && enabled && isVoiceCall()) mLockCount = addWrapped(mLockCount, 1);
 }
 
+// The host calls this for every event that it dispatches, so the flag is read without a lock.
 void WechatProxException::process(const sensors_event_t& event) {
     if (!mWechatProxEnabled) return;
     if (event.type == SENSOR_TYPE_ACCELEROMETER) {
@@ -144,6 +147,7 @@ void WechatProxException::notifyDayNight() {
 void WechatProxException::resetWechatCount() {
     SensorHandlerThread* thread = SensorHandlerThread::getInstance();
     thread->removeMessage(mHandler, MSG_SAVE);
+    // These act at once. A report that is still posted finds no session and sends nothing.
     mTotalCount = 0;
     mInvalidCount = 0;
     mLockCount = 0;
@@ -152,11 +156,12 @@ void WechatProxException::resetWechatCount() {
 }
 
 void WechatProxException::getAccData(const sensors_event_t& event) {
+    // Keeps the readings from before the near period.
     if (mLastProxValue == kNear) return;
     if (systemTime(SYSTEM_TIME_MONOTONIC) - mLastAccTime < kMinSampleSpanNs) return;
     std::copy_backward(mAccSamples.begin(), mAccSamples.end() - 1, mAccSamples.end());
     mAccSamples[0] = {event.data[0], event.data[1], event.data[2]};
-    mAccCount = addWrapped(mAccCount, 1);
+    mAccCount = addWrapped(mAccCount, 1);  // beyond 20 too; `checkProxLock` limits it
     mLastAccTime = systemTime(SYSTEM_TIME_MONOTONIC);
 }
 
@@ -166,7 +171,7 @@ void WechatProxException::processProxEvent(const sensors_event_t& event) {
     mLastProxValue = value;
     if (value == kFar) {
         mAccCount = 0;
-        return;  // the check that is pending stays: it ends the near period
+        return;  // the pending check stays: it ends the near period
     }
     if (value == kNear && isVoiceCall()) {
         mNearSeen = true;
@@ -184,7 +189,7 @@ void WechatProxException::initialize() {
     std::vector<std::string> pieces;
     TallyCommon::getInstance()->splitStr(text, "_", pieces);
     int* const counters[] = {&mTotalCount, &mInvalidCount, &mLockCount, &mNearCount};
-    if (pieces.size() < std::size(counters)) return;
+    if (pieces.size() < std::size(counters)) return;  // further pieces are ignored
     for (size_t i = 0; i < std::size(counters); ++i) {
         int32_t count = 0;
         parseInt32(pieces[i].c_str(), &count);
@@ -194,6 +199,7 @@ void WechatProxException::initialize() {
 
 void WechatProxException::checkProxLock() {
     SensorHandlerThread* thread = SensorHandlerThread::getInstance();
+    // Before the second check there is no spread to report.
     if (mCheckCount >= 2 && mLastProxValue == kFar) {
         recordAccVariance();
     } else if (mLastProxValue == kNear && mWechatProxEnabled && isVoiceCall() &&
@@ -207,6 +213,7 @@ void WechatProxException::checkProxLock() {
             recordAccVariance();
             return;
         }
+        // Nothing to remove first: the pending check is the one that runs.
         thread->sendMessageDelayed(mHandler, MSG_CHECK, kCheckDelayMs);
         ++mCheckCount;
     }
@@ -247,6 +254,7 @@ std::string WechatProxException::getVariance(int from, int to, float& sx, float&
 
     const auto spread = [&](size_t axis) {
         float mean = 0;
+        // In the order of the readings and in `float`, as any other way rounds differently.
         for (int i = begin; i < end; ++i) mean += mAccSamples[i][axis];
         if (count != 0) mean /= count;
         float sum = 0;

@@ -15,58 +15,49 @@
 namespace android {
 
 /**
- * Watches the chat application "com.tencent.mm" while it holds the proximity sensor, a session. In
- * a voice call the display controller is expected to hold the sensor too and to switch the screen
- * off; a phone that stays near without that has locked up, and the monitor reports at once how it
- * moved before it went near, the spread of its accelerometer readings. It keeps four counters of
- * the day in "persist.zuno.wechat.count.info" and reports them daily. Both go out as "N273|10013".
+ * Watches the proximity sensor during calls of the chat application "com.tencent.mm".
  *
- * The counters count in voice calls only: voice mode 1 (handset) or 2 (speaker), and a camera state
- * other than 1. They wrap at 32 bits.
+ * A session lasts while that application holds the sensor. In a voice call, the display controller
+ * should hold the sensor too and switch the screen off. If the phone stays near without that, it
+ * has locked up. The monitor then reports at once how the phone moved before it went near, as the
+ * spread of its accelerometer readings.
  *
- * Applications are told by containment: a name that has the one looked for anywhere in it is it.
+ * Four counters of the day count in voice calls only, that is in voice mode 1 (handset) or 2
+ * (speaker) with a camera state other than 1. They wrap at 32 bits. They are kept in
+ * "persist.zuno.wechat.count.info" and reported daily. Both reports are "N273|10013".
  *
- * The host calls from its own threads, through `SDCImpl`; the operations under "on the worker" run
- * on the worker thread. Apart from `getInstance()` nothing locks: see the members.
+ * Names match by substring.
+ *
+ * Any thread may call what the worker thread does not run. Only `getInstance()` locks.
  */
 class SENSOR_PRIV_EXPORT WechatProxException {
 public:
-    /**
-     * The single instance; the first call creates it and posts the load of the stored counters, due
-     * 2000 ms later. Locks `sLock`.
-     */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static WechatProxException* getInstance();
 
+    /** Posts the load of the stored counters, due in 2000 ms. */
     WechatProxException();
     virtual ~WechatProxException();
 
     /**
-     * An enable, or a disable or clean-up, of a sensor of any type.
-     *  - Accelerometer (type 1), enabled by the chat application: clears the kept readings, not
-     *    their count.
-     *  - Proximity (type 8): first as `handleProxWakeLock`. Then, by the chat application, an
-     *    enable starts a session, in which the last distance is unknown. A disable ends it, counts
-     *    it if it went near, and again as invalid if it was reported, and stores the counters at
-     *    once, on the worker. A second disable does the same again.
+     * A sensor was enabled or disabled. A clean-up counts as a disable.
+     *  - Accelerometer, enabled by the chat application: clears the readings, but not their count.
+     *  - Proximity, by any application: runs `handleProxWakeLock`.
+     *  - Proximity, enabled by the chat application: starts a session.
+     *  - Proximity, disabled by it: ends the session and posts the save of the counters. Counts the
+     *    session if it went near, and as invalid if it was reported. A second disable counts again.
      */
     void enableSuccess(bool enabled, int type, const std::string& pkg, const std::string& opPkg);
 
-    /**
-     * The proximity sensor was enabled or disabled for `pkg`: notes whether the display controller
-     * holds it, and counts each of its enables in a voice call within a session.
-     */
+    /** Notes whether the display controller holds the sensor. Counts its enables in a session. */
     void handleProxWakeLock(const std::string& pkg, bool enabled);
 
-    /**
-     * Takes accelerometer (type 1) and proximity (type 8) events during a session. Outside one it
-     * only tests a flag: the host calls this for every event that it dispatches.
-     */
+    /** Takes accelerometer and proximity events during a session. Otherwise only tests a flag. */
     void process(const sensors_event_t& event);
 
     /**
      * Takes the voice mode from element 7 of a notification of kind 7, and the camera state from
-     * element 11 of one of kind 10; element 0 is the kind. Other kinds, and lists too short for
-     * theirs, are ignored.
+     * element 11 of one of kind 10. Ignores other kinds and lists that are too short.
      */
     void setNotification(const Vector<int>& notification);
 
@@ -79,59 +70,48 @@ public:
     /** Posts the daily report. */
     void notifyDayNight();
 
-    /**
-     * Sets the counters to 0 at once, on the caller's thread, and then stores them on the worker.
-     * A report that is still posted finds no session and sends nothing.
-     */
+    /** Sets the counters to 0 on the caller's thread and posts their save. */
     void resetWechatCount();
 
-    /**
-     * Keeps the first three values of an accelerometer event as the newest reading and counts it,
-     * unless the phone is near or the last reading was kept less than 20000001 ns ago.
-     */
+    /** Keeps a reading, unless the phone is near or 20 ms or less have passed since the last. */
     void getAccData(const sensors_event_t& event);
 
     /**
-     * Takes the distance, the first value of a proximity event truncated to an integer; the same
-     * one again does nothing. Far (5) starts a new count of readings. Near (0) counts in a voice
-     * call. Any distance but far starts the checks anew: the first is due 100 ms later, instead of
-     * one that is pending.
+     * Takes a distance, truncated to an integer. The same one again does nothing.
+     *  - Far (5): starts a new count of readings.
+     *  - Near (0): counts in a voice call.
+     *  - All but far: start the checks anew, the first one due in 100 ms.
      */
     void processProxEvent(const sensors_event_t& event);
 
-    // On the worker.
+    // The worker thread runs the rest. The host must not call it.
 
-    /** Replaces the counters by the stored ones, or leaves them if fewer than four are stored. */
+    /** Loads the counters, or leaves them if fewer than four are stored. */
     void initialize();
 
     /**
-     * The check of a near period, every 100 ms. It computes the spread while the phone is near in a
-     * voice call and the display controller does not hold the sensor, until the session has been
-     * reported; the fifth check in a row reports it. If the phone went far after the first check,
-     * the next one reports what the last one computed. Going far ends the checks.
+     * Checks a near period every 100 ms.
+     *  - Near in a voice call, the display controller without the sensor, no report yet: computes
+     *    the spread. The fifth check in a row reports it.
+     *  - Gone far after the first check: reports the spread of the last check, and ends.
      */
     void checkProxLock();
 
     /** Stores the counters: total, invalid, lock and near, joined by "_". */
     void updatePropertyValue();
 
-    /** Reports the counters of the day, unless no session was counted; they stay as they are. */
+    /** Reports the counters, unless no session was counted. They stay as they are. */
     void putWechatTally();
 
-    /**
-     * Reports the last computed spread, whatever it is, and marks the session as reported, which
-     * ends its checks.
-     */
+    /** Reports the last computed spread, marks the session as reported and ends its checks. */
     void recordAccVariance();
 
     /**
-     * The spread of the kept readings `from` to `to` - 1, 0 being the newest: the population
-     * standard deviation of each axis, over `to` - `from` readings, into `sx`, `sy` and `sz`.
-     * Returns them as text, six decimals each, joined by "/". There are 20 readings; what lies
-     * outside them adds nothing. No readings have a spread of 0, of -0 if `to` is below `from`.
-     *
-     * All is computed in `float`, in the order of the readings, so that it comes out alike on
-     * every platform; a NaN is printed without a sign.
+     * The standard deviation of each axis over readings `from` to `to` - 1 of 20, the newest being
+     * 0. Writes it to `sx`, `sy`, `sz` and returns it as text: six decimals each, joined by "/".
+     *  - Readings outside the 20 add nothing, but count in the divisor `to` - `from`.
+     *  - No readings: 0. `to` below `from`: -0.
+     *  - A NaN has no sign. All is computed in `float`, alike on every platform.
      */
     std::string getVariance(int from, int to, float& sx, float& sy, float& sz);
 
@@ -145,10 +125,9 @@ private:
     // Constant after construction.
     const sp<MessageHandler> mHandler;
 
-    // The rest is shared by the host's threads and the worker without a lock, on purpose: readings
-    // and resets may interleave, and the events' path stays free of locks.
+    // The host's threads and the worker share the rest without a lock, so that no event waits.
 
-    // Counters of the day, as stored and reported.
+    // Counters of the day.
     int mNearCount = 0;     // near events
     int mInvalidCount = 0;  // sessions of which the spread was reported
     int mLockCount = 0;     // enables by the display controller
@@ -164,11 +143,10 @@ private:
     std::array<AccSample, 20> mAccSamples{};  // newest first
     int64_t mLastAccTime = -1;                // monotonic ns; of the newest reading
 
-    // Of the session: whether a near event was counted, whether the spread was reported.
-    bool mNearSeen = false;
-    bool mVarianceReported = false;
+    bool mNearSeen = false;          // a near event was counted in this session
+    bool mVarianceReported = false;  // the spread was reported in this session
 
-    int mCheckCount = 0;        // number of the next check in this near period, from 1
+    int mCheckCount = 0;        // the next check's number in this near period, from 1
     int mAccCount = 0;          // readings kept since the last far, those shifted out included
     std::string mVarianceText;  // the last computed spread; the worker's own
 

@@ -2,8 +2,8 @@
  * Calls everything that a trace can call, at random and from eight threads at once, in real time:
  * food for the sanitizers. The argument is the number of calls of each thread.
  *
- * First and last come two plain flags that the library shares between threads: the end of the boot
- * and of the worker.
+ * Before that, the threads race on the flag of the end of the boot and on names that grow. At the
+ * end they race on the flag that ends the worker.
  */
 
 #include <cstdio>

@@ -4,7 +4,7 @@
 #include <cstddef>
 #include <cstring>
 
-// Where the processor may have wider registers than the compiler may count on.
+// Where the processor may have wider registers than the compiler assumes.
 #if defined(__x86_64__) && !defined(SENSOR_PRIV_BASELINE)
 #define SENSOR_PRIV_AVX2
 #endif
@@ -18,26 +18,27 @@ static_assert(__BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__, "a pixel's first byte i
 /** A step of the walk: the bytes of one pixel in the usual formats. */
 constexpr size_t kStepBytes = 4;
 
-/** What there is to average, none of it 0 but, perhaps, `rowBytes`. */
+/** What there is to average. Only `rowBytes` may be 0. */
 struct Walk {
     const uint8_t* base;
     size_t steps;  // of each row
     size_t rows;
     size_t rowBytes;  // from one row's begin to the next one's
-    uint32_t count;   // of pixels, to divide by
+    uint32_t count;   // of pixels; the divisor
 };
 
-/** A vector register of that many bytes, each 32-bit lane a pixel. */
+/** A vector register of that many bytes. Each 32-bit lane holds a pixel. */
 template <size_t Bytes>
 struct PixelVector {
     typedef uint32_t Type __attribute__((vector_size(Bytes)));
 };
 
 /**
- * In each lane, `all` sums whole pixels and `redBlue` their even bytes. Both are 16-bit sums side
- * by side, so that the even bytes' sums can be read from `redBlue`, and the odd bytes' sums from
- * the difference. 256 pixels fit 16 bits: 256 * 255 < 2^16. What alpha adds leaves the lane at its
- * upper end. Two registers of each keep a processor's adders busy.
+ * In each lane, `all` sums whole pixels and `redBlue` their even bytes. Each holds two 16-bit sums
+ * side by side. The even bytes' sums are in `redBlue`, the odd bytes' sums in the difference.
+ *  - A sum of 256 pixels fits 16 bits: 256 * 255 < 2^16.
+ *  - The sum of alpha overflows at the lane's upper end and is lost.
+ *  - Two registers of each keep a processor's adders busy.
  */
 template <size_t VectorBytes>
 __attribute__((always_inline)) inline void average(const Walk& walk, int32_t* rgb) {
@@ -54,7 +55,7 @@ __attribute__((always_inline)) inline void average(const Walk& walk, int32_t* rg
     uint32_t blue = 0;
     for (size_t row = 0; row < walk.rows; ++row) {
         const uint8_t* next = walk.base + row * walk.rowBytes;
-        // The last step is none of a block's: its fourth byte may lie outside the buffer.
+        // The last step belongs to no block: its fourth byte may lie outside the buffer.
         size_t blocks = (walk.steps - 1) / kBlockSteps;
         while (blocks > 0) {
             Vector all[kVectors] = {};

@@ -4,12 +4,9 @@
 
 #include "core/Export.h"
 
-/**
- * State of the display, the brightness and the light that the host's light-sensor modules share:
- * plain variables that the host writes and reads under these bare names, from any thread and
- * without a lock. The library only keeps them; it reads `policy` alone. Their meaning is the
- * host's, and so are their units.
- */
+// Display, brightness and light as the host's light-sensor modules share them. The host reads and
+// writes these variables from any thread, without a lock. Their meanings and units are the host's.
+// The library defines them and reads `policy` only.
 
 extern SENSOR_PRIV_EXPORT int32_t frameworkLux;
 extern SENSOR_PRIV_EXPORT int32_t ACL;
@@ -20,7 +17,7 @@ extern SENSOR_PRIV_EXPORT bool screenOnFirstLight;
 extern SENSOR_PRIV_EXPORT bool displayChanged;
 extern SENSOR_PRIV_EXPORT bool useFrontLightOnly;
 
-/** While this is 0, `RgbShotManager` allows no sample outside its test mode. */
+/** While this is 0, `RgbShotManager` allows samples in its test mode only. */
 extern SENSOR_PRIV_EXPORT int32_t policy;
 
 extern SENSOR_PRIV_EXPORT int32_t brightness;

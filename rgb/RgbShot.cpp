@@ -61,6 +61,7 @@ void RgbShot::setRgbShotCount() {
 }
 
 void RgbShot::initRgbShotCount() {
+    // Not locked, on purpose: the load overwrites earlier samples in any case.
     mRgbShotCount = kCountProperty.load();
 }
 
@@ -77,7 +78,7 @@ void RgbShot::putRgbShotTally() {
     std::map<std::string, std::string> params{{"count", tally->intToStr(mRgbShotCount)}};
     mLock.unlock();
     tally->trackEvent(kEventId, std::move(params));
-    // Samples counted while the report was being sent go with the reset.
+    // This drops samples that were counted while the report was sent. The stored count stays.
     Mutex::Autolock lock(mLock);
     mRgbShotCount = 0;
 }

@@ -11,29 +11,25 @@
 namespace android {
 
 /**
- * Counts the screen samples taken, keeps the count in "persist.zuno.rgb.shot.count" and reports it
- * once a day as "N273|10009". `SDCImpl` calls it.
+ * Counts screen samples, keeps the count in "persist.zuno.rgb.shot.count" and reports it daily as
+ * "N273|10009". `SDCImpl` calls it.
  *
- * All operations may be called from any thread. `mLock` is held for the count only, never while a
- * message is posted, a property is touched or telemetry is sent.
+ * Any thread may call any operation. `mLock` is held only to read or change the count.
  */
 class SENSOR_PRIV_EXPORT RgbShot {
 public:
-    /**
-     * The single instance; the first call creates it and posts the load of the stored count, due
-     * 2000 ms later. Locks `sLock`.
-     */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static RgbShot* getInstance();
 
+    /** Posts the load of the stored count, due in 2000 ms. */
     RgbShot();
 
-    /** Counts one sample; the count is stored 500 ms after the last sample of a burst. */
+    /** Counts one sample. The count is stored 500 ms after the last sample of a burst. */
     void setRgbShotCount();
 
     /**
-     * Replaces the count by the stored one, 0 if there is none, without `mLock`. Samples counted
-     * before are lost unless they have been stored, in which case they have replaced what was
-     * stored before.
+     * Loads the stored count, 0 if there is none. Samples not yet saved are lost; saved ones have
+     * already overwritten the stored count.
      */
     void initRgbShotCount();
 
@@ -41,18 +37,18 @@ public:
     void updateRgbShotCount();
 
     /**
-     * Reports the count, 0 included, on the caller's thread, then sets it to 0. The stored count
-     * stays until the next sample is stored: a restart in between loads what was reported.
+     * Reports the count on the caller's thread, 0 too, and sets it to 0. The stored count stays
+     * until the next sample is saved, so a restart before that loads the reported count again.
      */
     void putRgbShotTally();
 
-    /** Sets the count to 0 without a report; the stored count stays as for `putRgbShotTally`. */
+    /** Sets the count to 0 without a report. The stored count stays likewise. */
     void notifyRgbShotReset();
 
 private:
     class RgbShotHandler;
 
-    // Samples since the last report or reset; loaded without the lock (see initRgbShotCount).
+    // Samples since the last report or reset. The load alone writes it without the lock.
     int32_t mRgbShotCount;
     Mutex mLock;
 

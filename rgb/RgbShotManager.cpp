@@ -29,12 +29,14 @@ RgbShotManager::RgbShotManager()
         mPendingShots(0),
         mNameList(new Vector<String8>) {
     isTestMode();
+    // Nothing in the library reads the list.
     mNameList->push_back(String8("__qk_displaysamplelayer@1999__"));
 }
 
 void RgbShotManager::isTestMode() {
     char text[PROP_VALUE_MAX];
     property_get("persist.sys.skip_restrict", text, "0");
+    // Text that is no number leaves the mode as it was.
     parseInt32(text, &mTestMode);
     SENSOR_PRIV_LOGI("UL: isTestMode = %d", mTestMode);
 }
@@ -72,6 +74,7 @@ void RgbShotManager::policyChange() {
     setRgbShotDelay(5, 200);
 }
 
+// The sum has 64 bits, the clock 32: the clock wraps, due times do not.
 void RgbShotManager::setRgbShotDelay(int shots, int delayMs) {
     queuePush({getCurrentMs() + delayMs, shots});
 }
@@ -90,6 +93,7 @@ bool RgbShotManager::skipLux() {
 long long RgbShotManager::getCurrentMs() {
     timespec now;
     clock_gettime(CLOCK_MONOTONIC, &now);
+    // The clock wraps at 32 bits, on purpose. Unsigned numbers do so without undefined behaviour.
     const uint32_t seconds = static_cast<uint32_t>(now.tv_sec);
     return static_cast<int32_t>(seconds * 1000 + static_cast<uint32_t>(now.tv_nsec / 1'000'000));
 }
@@ -101,7 +105,7 @@ void RgbShotManager::queuePush(Entry entry) {
 
 void RgbShotManager::queuePop() {
     Mutex::Autolock lock(mLock);
-    // Another thread may have taken the entry that this one has seen.
+    // Callers ask `isEmpty` first, but another thread may have emptied the queue since.
     if (!mShotQueue.empty()) mShotQueue.pop();
 }
 
@@ -113,12 +117,13 @@ bool RgbShotManager::isEmpty() {
 void RgbShotManager::clearQueue() {
     Mutex::Autolock lock(mLock);
     while (!mShotQueue.empty()) mShotQueue.pop();
+    // The one call to the outside under the lock.
     if (mLogSwitch != 0) SENSOR_PRIV_LOGI("UL: clearQueue");
 }
 
 int RgbShotManager::getWaitCount() {
     noteFirst();
-    return 0;
+    return 0;  // the status of an unlock, which cannot fail
 }
 
 bool RgbShotManager::noteFirst() {
@@ -131,12 +136,13 @@ bool RgbShotManager::noteFirst() {
 
 void RgbShotManager::isTimeToShot() {
     const long long now = getCurrentMs();
-    // Each access locks for itself. Between them another thread may empty the queue, and then
-    // nothing becomes pending, or push an entry, which may be dropped in another's place.
+    // Each access locks for itself, so another thread may come in between. If it empties the queue,
+    // nothing becomes pending. If it pushes an earlier entry, `queuePop` drops that one.
     if (!mHasPending && !isEmpty() && noteFirst()) {
         mHasPending = true;
         queuePop();
     }
+    // Not `<=`: an entry that is due in this millisecond is not over yet.
     if (mHasPending && mPendingTime < now) {
         setRgbShot(mPendingShots);
         mHasPending = false;

@@ -15,40 +15,35 @@
 namespace android {
 
 /**
- * Rations the samples of the screen's colour that the host's light-sensor code takes, and takes
- * them. A budget says how many may be taken now; what happens on the device raises it, at once or,
- * through a queue, later. The host reports what happens, asks `allowRgbShot` in each turn of its
- * sampling loop, samples with `getScreenPixcel` if it may, and ends the loop on `stopRgbThread`.
+ * Rations samples of the screen's colour, and takes them.
  *
- * To raise the budget to a number is to set it to that number if it is smaller.
+ * A budget says how many samples may be taken now. Events on the device raise it to a number, at
+ * once or after a delay. A budget that is higher stays. Delayed raises wait in a queue. One at a
+ * time is taken out of the queue and stays pending until it is due. The host's sampling loop asks
+ * `allowRgbShot`, samples with `getScreenPixcel` if it may, and ends on `stopRgbThread`.
  *
- * All operations may be called from any thread; none reports an error. `mLock` is held for one
- * access to the queue at a time and never while calling out, but for the log line of `clearQueue`.
- * The other fields are plain ones without a lock: when calls race, a raise may be lost or a sample
- * be allowed twice.
- *
- * Times are milliseconds of the monotonic clock as `getCurrentMs` gives them.
+ * Any thread may call any operation. Only `getScreenPixcel` reports errors. `mLock` guards the
+ * queue, for one access at a time. The other fields have no lock: calls that race may lose a raise
+ * or allow a sample twice.
  */
 class SENSOR_PRIV_EXPORT RgbShotManager {
 public:
-    /** The single instance, created by the first call. Locks `sLock`. */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static RgbShotManager* getInstance();
 
-    /** Starts without budget, with an empty queue, in the mode that `isTestMode` reads. */
+    /** Starts with a budget of 0 and reads the test mode. */
     RgbShotManager();
 
     /**
-     * Reads the property "persist.sys.skip_restrict", 0 if it is unset, and logs the result: any
-     * number but 0 is test mode, in which every sample is allowed. Text that is no number leaves
-     * the mode as it was.
+     * Reads the test mode from "persist.sys.skip_restrict" and logs it. 0 or unset: off. Any other
+     * number: on, and every sample is allowed. Other text leaves the mode as it was.
      */
     void isTestMode();
 
     /** Raises the budget to `shots`. */
     void setRgbShot(int shots);
 
-    // What happened on the device, and the budget that it raises, now or in the given time.
-
+    // Events, and what they raise the budget to.
     void onTouchChange();   // 1
     void luxChange();       // 2
     void colorChange();     // 3
@@ -57,85 +52,78 @@ public:
     void eyeChange();       // 1 in 2000 ms
     void policyChange();    // 5 in 200 ms
 
-    /** Raises the budget to `shots` in `delayMs`; a negative delay is over already. */
+    /** Raises the budget to `shots` in `delayMs`. A negative delay is over already. */
     void setRgbShotDelay(int shots, int delayMs);
 
     /**
-     * 0: no sample is allowed until another status comes. Any other: that is over, and the budget
-     * is raised to 2 now and to 2 in 8000 ms.
+     * 0 blocks sampling. Any other status unblocks it and raises the budget to 2, now and again in
+     * 8000 ms.
      */
     void onTransitionStatusChange(int status);
 
-    /** Whether a transition status of 0 keeps samples from being taken. */
+    /** Whether a transition status blocks sampling. */
     bool skipLux();
 
     /**
-     * The monotonic clock in milliseconds, computed in 32 bits: from 2^31 - 1, 24.8 days after the
-     * device's boot, it goes to -2^31. Due times do not wrap with it: an entry due behind that
-     * moment, once pending, stays so for as long as the process lives. This is meant so.
+     * The monotonic clock in milliseconds, as a 32-bit number: after 2^31 - 1, which is 24.8 days,
+     * comes -2^31. Due times do not wrap: an entry that is pending across that moment may stay so
+     * for the life of the process. This is intended.
      */
     long long getCurrentMs();
 
-    /** Queues a raise: when it is due, and to what. */
+    /** Queues a raise: when it is due, as `getCurrentMs` counts, and to what. */
     void queuePush(std::pair<long long, int> entry);
 
-    /**
-     * Drops the entry that is due first; of several, the smallest raise. Callers ask `isEmpty`
-     * first; if another thread has come in between and nothing is left, nothing happens.
-     */
+    /** Drops the first entry, if there is one: the earliest due, of these the smallest raise. */
     void queuePop();
 
-    /** Whether nothing is queued; what is pending is not. */
+    /** Whether the queue is empty. A pending entry is not in the queue. */
     bool isEmpty();
 
-    /**
-     * Drops all that is queued; logs it while `mLogSwitch` is on. What `isTimeToShot` has taken out
-     * of the queue stays pending, and the budget stays.
-     */
+    /** Empties the queue. Pending entry and budget stay. Logs while `mLogSwitch` is not 0. */
     void clearQueue();
 
-    /**
-     * Notes the entry that `queuePop` would drop as the pending one's time and budget, without
-     * making it pending. An empty queue is treated as there. Returns 0.
-     */
+    /** Notes the queue's first entry, if there is one, as the next to be pending. Returns 0. */
     int getWaitCount();
 
     /**
-     * If nothing is pending, takes the first entry out of the queue; if the pending entry's time is
-     * over (not if it is this very millisecond), raises the budget by it. One entry is pending at a
-     * time: one queued later waits behind it even if it is due earlier.
+     * If nothing is pending, takes the first entry out of the queue. Then, if the pending entry's
+     * due time has passed, raises the budget. A due time of this very millisecond has not passed.
+     * An entry queued later waits behind the pending one, even if it is due earlier.
      */
     void isTimeToShot();
 
     /**
-     * Whether a sample may be taken now; takes it off the budget. Always in test mode, which takes
-     * nothing off. Otherwise never while `policy` is 0 or `skipLux`, and the queue then stands
-     * still; else calls `isTimeToShot` and answers by the budget.
+     * Whether a sample may be taken now. If so, takes it off the budget.
+     *  - In test mode: always, and takes nothing off.
+     *  - While `policy` is 0 or `skipLux()`: never, and the queue stands still.
+     *  - Otherwise: runs `isTimeToShot`, then answers by the budget.
      */
     bool allowRgbShot();
 
-    /** Whether nothing is left to sample: no budget, nothing queued, nothing pending. */
+    /** Whether nothing is left to sample: no budget, an empty queue, nothing pending. */
     bool stopRgbThread();
 
     /**
-     * Samples the display: averages the colours of the rectangle `rect` (left, top, right and
-     * bottom in the display's pixels, the last two exclusive) into `rgbOut` (red, green and blue, 0
-     * to 255), counts the sample and returns 1. Blocks until the capture is there, for as long as
-     * it takes; the process must run the platform's binder threads. Takes no lock and no budget;
-     * calls from several threads do not touch each other.
+     * Averages the display's colours within `rect` into `rgbOut`, counts the sample, returns 1.
+     *  - `rect`: left, top, right, bottom, in pixels. Right and bottom are exclusive.
+     *  - `rgbOut`: red, green, blue, 0 to 255.
      *
-     * Returns 0, logs why and leaves `rgbOut` as it is, if all of `rect` is 0, or the display has
-     * no token, or the capture, its result or the access to its pixels fails.
+     * Returns 0, logs why and leaves `rgbOut` alone if `rect` is all 0, the display has no token,
+     * or the capture, its result or the access to its pixels fails.
+     *
+     * Blocks until the capture arrives, without a time-out: the process must run binder threads.
+     * Takes no lock and no budget. Calls on several threads are independent.
      */
     int getScreenPixcel(int* rgbOut, int* rect);
 
 private:
     using Entry = std::pair<long long, int>;  // when due, the budget that it raises to
 
-    /** `getWaitCount`, but returns whether there was an entry to note. */
+    /** Does what `getWaitCount` does, and returns whether there was an entry. */
     SENSOR_PRIV_HIDDEN bool noteFirst();
 
-    // Plain fields, read and written by every caller without a lock (see above).
+    // Read and written by every caller without a lock.
     int32_t mShotBudget;
     int32_t mTestMode;
     bool mHasPending;
@@ -147,7 +135,7 @@ private:
     std::priority_queue<Entry, std::vector<Entry>, std::greater<Entry>> mShotQueue
             GUARDED_BY(mLock);
 
-    // Constant after construction. Held for the object's life and never freed; nothing reads it.
+    // Constant after construction. Never freed. Nothing in the library reads it.
     Vector<String8>* const mNameList;
 
     static Mutex sLock;

@@ -20,9 +20,10 @@
 
 namespace android {
 
-// What the operation holds it releases in the order: buffer, results, listener, request, token.
+// One piece, so that it releases in this order: buffer, results, listener, request, token.
 int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
     if (std::all_of(rect, rect + 4, [](int value) { return value == 0; })) {
+        // [sic] Written while `mLogSwitch` is 0 too.
         SENSOR_PRIV_LOGD("ic scope is 0. not support pixcel");
         return 0;
     }
@@ -37,6 +38,7 @@ int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
     args.sourceCrop = Rect(rect[0], rect[1], rect[2], rect[3]);
     args.captureSecureLayers = true;
     args.displayToken = token;
+    // Unsigned, as the difference of two signed numbers may overflow.
     args.width = static_cast<uint32_t>(rect[2]) - static_cast<uint32_t>(rect[0]);
     args.height = static_cast<uint32_t>(rect[3]) - static_cast<uint32_t>(rect[1]);
     args.useIdentityTransform = true;
@@ -53,9 +55,11 @@ int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
         return 0;
     }
 
+    // Not tested for null: a good result has a buffer.
     const sp<GraphicBuffer> buffer = results.buffer;
     void* base = nullptr;
     if (buffer->lock(GRALLOC_USAGE_SW_READ_OFTEN, &base) != OK || base == nullptr) {
+        // Unlocks even if the lock failed. [sic] The text ends in a blank.
         buffer->unlock();
         SENSOR_PRIV_LOGE("UL: rgb update fail, base is NULL ");
         return 0;
@@ -64,7 +68,8 @@ int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
     const uint32_t height = buffer->getHeight();
     const uint32_t stride = buffer->getStride();
     const PixelFormat format = buffer->getPixelFormat();
-    // The mapping outlives the lock: it goes with the buffer, which is held until the return.
+    // The pixels are read after the unlock: the mapping lasts as long as the buffer, which is held
+    // until the return.
     buffer->unlock();
     averageColor(base, width, height, stride, format, rgbOut);
 

@@ -14,7 +14,7 @@ binder::Status SyncScreenCaptureListener::onScreenCaptureCompleted(
 
 gui::ScreenCaptureResults SyncScreenCaptureListener::waitForResults() {
     gui::ScreenCaptureResults results = mResults.get_future().get();
-    results.fence->waitForever("");
+    results.fence->waitForever("");  // a name for the platform's log; none is needed
     return results;
 }
 

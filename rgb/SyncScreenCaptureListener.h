@@ -14,18 +14,15 @@ namespace android {
 // keeps the two apart where a file or a process holds both.
 inline namespace sensor_priv {
 
-/** Lets one thread wait for one capture, which the platform completes on another. */
+/** Lets one thread wait for one capture that the platform completes on another thread. */
 class SENSOR_PRIV_HIDDEN SyncScreenCaptureListener : public gui::BnScreenCaptureListener {
 public:
-    /**
-     * Takes the results and lets the waiting thread go on. The platform calls it once, on a binder
-     * thread; a second call ends the process.
-     */
+    /** The platform calls this once, on a binder thread. A second call ends the process. */
     binder::Status onScreenCaptureCompleted(const gui::ScreenCaptureResults& results) override;
 
     /**
-     * Blocks until the results are there and their buffer's contents are complete, without a
-     * time-out. To be called once; a second call ends the process.
+     * Blocks until the results are there and their buffer is complete, without a time-out. A second
+     * call ends the process.
      */
     gui::ScreenCaptureResults waitForResults();
 

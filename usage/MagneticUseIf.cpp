@@ -47,7 +47,7 @@ public:
     }
 };
 
-// In the order in which they are loaded and stored; the first five are the buckets 1 to 5.
+// In the order of loading and storing. The first five are the buckets 1 to 5.
 const MagneticUseIf::Total MagneticUseIf::kTotals[] = {
         {"persist.sys.fc_oriut", "fastChargeTime", &MagneticUseIf::mZunoFastChargeUT},
         {"persist.sys.uc_oriut", "usbChargeTime", &MagneticUseIf::mUsbChargeUT},
@@ -66,6 +66,7 @@ MagneticUseIf* MagneticUseIf::getInstance() {
     return mMagneticUseIf;
 }
 
+// [sic] "unknow" stands for no package in reports.
 MagneticUseIf::MagneticUseIf() : mLastPkg("unknow"), mHandler(new MagneticUseIfHandler) {}
 
 void MagneticUseIf::sendChargeState(int state) {
@@ -75,10 +76,12 @@ void MagneticUseIf::sendChargeState(int state) {
     mCurrentPCState = state;
     if (state != mLastPCState) {
         const bool charging = state >= FAST_CHARGE && state <= OTHER_CHARGE;
+        // Stays when charging ends: a span that closes then belongs to this kind.
         if (charging) mChargeType = state;
         mLastPCState = state;
         mIsChargeState = charging;
     }
+    // A repeated state comes here too, and restarts or books charge spans again.
     dealWithChargeForPkgInfo();
     dealWithChargeAndOrientationEnableState();
 }
@@ -115,6 +118,7 @@ void MagneticUseIf::setOrientationEnable(std::string pkg, std::string opPkg) {
 
 void MagneticUseIf::setOrientationDisable(std::string pkg, std::string opPkg) {
     if (mEnableNumbers == 1 && !pkg.empty()) mLastPkg.set(pkg);
+    // Not limited to 0; see `dealWithOrientationTotalTime`.
     mEnableNumbers = addWrapped(mEnableNumbers, -1);
     if (mLogSwitch != 0) SENSOR_PRIV_LOGD("Disable mEnableNumbers = %d", mEnableNumbers);
     dealWithOrientationEnableDisable(std::move(pkg), std::move(opPkg), false);
@@ -146,6 +150,7 @@ void MagneticUseIf::dealWithChargeForPkgInfo() {
         if (mIsChargeState) {
             it->second.chargeBeginTime = now;
         } else {
+            // The begin stays, even if it is old or 0, so the same state books again.
             updateChargeTime(it, now);
         }
     }
@@ -157,6 +162,7 @@ void MagneticUseIf::dealWithChargeAndOrientationEnableState() {
                          mEnableNumbers, mBeginCountTime);
     }
     const bool counts = mIsChargeState && mEnableNumbers > 0;
+    // An open span stays open when the kind of charging changes.
     if (counts && !mBeginCountTime) {
         mBeginTime = systemTime(SYSTEM_TIME_MONOTONIC);
         mBeginCountTime = true;
@@ -180,6 +186,7 @@ void MagneticUseIf::dealWithOrientationEnableDisable(std::string pkg, std::strin
             addSeconds(&info.totalTime, info.beginTime, now);
         }
         info.beginTime = now;
+        // Otherwise the begin stays as it was, old or 0.
         if (mIsChargeState) info.chargeBeginTime = now;
         nestEnable(&info.enableCount);
     } else {
@@ -210,10 +217,12 @@ void MagneticUseIf::dealWithOrientationTotalTime() {
         }
     } else if (mTotalBeginCountTime) {
         mTotalEndTime = systemTime(SYSTEM_TIME_MONOTONIC);
+        // A span below 1 s adds 0, but may bring the day's report.
         const int64_t seconds = secondsBetween(mTotalBeginTime, mTotalEndTime);
         mTotalOrientationUT = addWrapped(mTotalOrientationUT, seconds);
         calCurretTime(mLastPkg.get());
         if (mLogSwitch != 0) SENSOR_PRIV_LOGD("oritt == %d", static_cast<int32_t>(seconds));
+        // The only place that lifts a count below 0. Without an open span it stays below.
         if (mEnableNumbers < 0) mEnableNumbers = 0;
         mTotalBeginTime = 0;
         mTotalEndTime = 0;
@@ -224,6 +233,7 @@ void MagneticUseIf::dealWithOrientationTotalTime() {
 void MagneticUseIf::recordTime() {
     mEndTime = systemTime(SYSTEM_TIME_MONOTONIC);
     const int64_t seconds = secondsBetween(mBeginTime, mEndTime);
+    // Shorter spans are dropped here, unlike in the table of connections.
     if (seconds >= 1) {
         calCurretUseTotalTime(mLastPkg.get(), static_cast<long>(seconds), mChargeType);
         if (mLogSwitch != 0) {
@@ -237,9 +247,11 @@ void MagneticUseIf::calCurretTime(std::string pkg) {
     if (mLogSwitch != 0) {
         SENSOR_PRIV_LOGD("mUD=%d, mLastUD=%d, mLastRUD=%d", mUD, mLastUD, mLastRUD);
     }
+    // After a restart `mLastRUD` is 0, so the first span that closes reports again.
     if (mUD <= mLastRUD) return;
     mLastRUD = mUD;
-    mTotalD = addWrapped(mTotalD, int64_t{mUD} - mLastUD);  // back, if the counter went back
+    // Takes days off again if the counter went back.
+    mTotalD = addWrapped(mTotalD, int64_t{mUD} - mLastUD);
     mLastUD = mUD;
     setOrientationTally(std::move(pkg));
 }
@@ -256,6 +268,7 @@ void MagneticUseIf::setOrientationTally(std::string pkg) {
 
 void MagneticUseIf::getPersistStatistics() {
     for (const Total& total : kTotals) {
+        // An unset total becomes 0. Text that is no number leaves it as it was.
         property_get(total.property, mPropValue, "0");
         parseInt32(mPropValue, &(this->*total.value));
     }
@@ -271,6 +284,7 @@ void MagneticUseIf::recordPkgInfoTally() {
     std::vector<std::pair<std::string, PkgInfo>> ended;
     {
         Mutex::Autolock lock(mPkgLock);
+        // Enabled connections stay for a later day's report.
         ended = takeOut(&mPkgInfoMap, [](const PkgInfo& info) { return info.beginTime == 0; });
     }
     TallyCommon* tally = TallyCommon::getInstance();
@@ -310,7 +324,7 @@ std::string MagneticUseIf::convertLongToString(long value) {
 }
 
 std::string MagneticUseIf::convertIntToString(int value) {
-    return TallyCommon::getInstance()->longToStr(value);
+    return TallyCommon::getInstance()->longToStr(value);  // [sic] gives the same text
 }
 
 void MagneticUseIf::logTotals(const char* verb) const {

@@ -15,7 +15,7 @@
 
 namespace android {
 
-/** What is known of one connection's use of the orientation sensors. Times are in seconds. */
+/** One connection's use of the orientation sensors. Times are seconds unless they say otherwise. */
 struct PkgInfo {
     int64_t beginTime = 0;        // monotonic ns; start of the open span; 0: not enabled
     int64_t chargeBeginTime = 0;  // monotonic ns; start of the charge span; kept when it ends
@@ -27,55 +27,45 @@ struct PkgInfo {
 };
 
 /**
- * Measures how long the orientation-type sensors (sensor types 3, orientation, and 11, rotation
- * vector) are enabled, and how much of that while the phone charges, by kind of charging: charge
- * states 1 (fast), 2 (USB) and 3 (other); any other state is not charging. `SDCImpl` calls it.
+ * Measures how long the orientation and the rotation vector sensor are enabled, and how much of
+ * that the phone charges. Charge state 1 is fast charging, 2 USB, 3 other; any other state is not
+ * charging. `SDCImpl` calls it.
+ *  - Totals of all connections are kept in "persist.sys.*_oriut". They are reported as "N273|10012"
+ *    once for each new value of the host's day counter, and never reset.
+ *  - A table has each connection's times. It is not stored, and reported daily as "N273|10012".
  *
- * All connections together: running totals, kept in "persist.sys.*_oriut" and reported as
- * "N273|10012" once for each new value of the host's day counter. They are never reset.
- * Each connection by itself: a table, not persisted, reported once a day under the same event id.
- *
- * All operations may be called from any thread. `mPkgLock` guards the table and is held for it
- * only; the totals and the state are not locked (see the members). Times are read from the
- * monotonic clock; spans count as whole seconds, truncated. Numbers wrap at 32 bits. State changes
- * are logged at debug level while `mLogSwitch` is on.
+ * Any thread may call any operation. `mPkgLock` guards the table only; nothing else is locked.
+ * Spans are whole seconds of the monotonic clock, truncated. Numbers wrap at 32 bits. While
+ * `mLogSwitch` is not 0, state changes are logged.
  */
 class SENSOR_PRIV_EXPORT MagneticUseIf {
 public:
-    /** The single instance, created by the first call. Locks `sLock`. */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static MagneticUseIf* getInstance();
 
     MagneticUseIf();
 
-    // What the host tells.
-
     /**
-     * Takes the charge state. A new one decides whether the phone charges and, if so, the kind that
-     * time is booked to from then on. Every one, also one that is not new, then goes through
-     * `dealWithChargeForPkgInfo` and `dealWithChargeAndOrientationEnableState`.
+     * Takes the charge state. A new one decides whether the phone charges, and to which kind time
+     * is booked. Every one then runs `dealWithChargeForPkgInfo` and
+     * `dealWithChargeAndOrientationEnableState`.
      */
     void sendChargeState(int state);
 
-    /**
-     * 1, the device has booted: posts the load of the totals. Any other state, it is going down:
-     * posts their store, unless no boot was ever seen, as the totals were then never loaded.
-     */
+    /** 1 (booted): posts the load of the totals. Any other: posts their save if a boot was seen. */
     void sendBootShutdownRebootState(int state);
 
-    /**
-     * Takes the host's day counter. The days since the highest one so far are added to the days of
-     * the totals; a value that is not higher adds none.
-     */
+    /** Takes the day counter. Adds the days since its highest value so far to the totals. */
     void sendUsedTime(int uds);
 
     /**
-     * A connection was enabled, or disabled: counts it, then runs
+     * A connection was enabled or disabled. Counts that, then runs
      * `dealWithOrientationEnableDisable`, `dealWithChargeAndOrientationEnableState` and
-     * `dealWithOrientationTotalTime`, in this order. The `pkg` of the disable that takes the count
-     * from 1 to 0 is the one that the report names, unless it is empty, cut at 1023 bytes.
-     *
-     * Surplus disables take the count below 0, and it is set back only when an enabled span closes:
-     * if they come while none is open, the next enables start no span until the count is 1 again.
+     * `dealWithOrientationTotalTime`.
+     *  - The totals' report names the `pkg` of the last disable that took the count from 1 to 0,
+     *    unless that is empty. It cuts the name after 1023 bytes.
+     *  - Surplus disables while no span is open take the count below 0. Then the next enables open
+     *    no span until the count is 1.
      */
     void setOrientationEnable(std::string pkg, std::string opPkg);
     void setOrientationDisable(std::string pkg, std::string opPkg);
@@ -83,67 +73,53 @@ public:
     /** Posts the daily report of the connections. */
     void notifyDayNight();
 
-    /**
-     * Forgets all connections, enabled ones too, at once, on the caller's thread: before a report
-     * that is still posted. The totals stay.
-     */
+    /** Empties the table on the caller's thread, enabled connections too. The totals stay. */
     void notifyMagReset();
 
     /**
-     * Adds `seconds`, its low 32 bits, to a total: 1 fast, 2 USB, 3 other charging, 4 shock and
-     * charge, 5 all enabled time, after which `calCurretTime(pkg)` follows. Other numbers: nothing.
+     * Adds the low 32 bits of `seconds` to a total. `bucket` 1, 2 and 3 are the kinds of charging,
+     * 4 is shock and charge, 5 all enabled time, which also runs `calCurretTime`. Other: nothing.
      */
     void calCurretUseTotalTime(std::string pkg, long seconds, int bucket);
 
-    // The steps of these.
-
     /**
-     * Brings the connections that are enabled in line with the charge state. Charging: restarts
-     * their charge spans and drops what had run up. Not charging: books the spans but leaves their
-     * begin, so that the same again books the same time again. A connection whose span never began
-     * is booked the whole monotonic time, if there has been charging at all.
+     * Applies the charge state to the enabled connections.
+     *  - Charging: restarts their charge spans without booking them.
+     *  - Not charging: books each span but keeps its begin, so a repeat books it again. A span that
+     *    never began is booked as the whole monotonic time, if the phone ever charged.
      */
     void dealWithChargeForPkgInfo();
 
     /**
-     * Opens the charging-and-enabled span, or closes it by `recordTime`, as charge state and count
-     * have it. A change from one kind of charging to another does neither: all of the span goes to
-     * the kind in force when it closes.
+     * Opens the charging-and-enabled span, or closes it and runs `recordTime`. Another kind of
+     * charging does neither, so the whole span goes to the kind in force when it closes.
      */
     void dealWithChargeAndOrientationEnableState();
 
     /**
-     * Enable: restarts the span of the connection pkg/opPkg, crediting the one that is open, and
-     * adds an enable. Disable: takes an enable from a connection that is enabled and, with the last
-     * one, credits and ends its span; others are ignored. Charge time is booked where time is
-     * credited, while the phone charges. Locks `mPkgLock`.
+     * Updates the connection in the table. Locks `mPkgLock`.
+     *  - Enable: credits an open span, starts a new one and adds an enable.
+     *  - Disable: takes an enable off; the last one credits and ends the span. Connections that are
+     *    not enabled are ignored.
+     *  - While the phone charges, crediting a span books its charge time too.
      */
     void dealWithOrientationEnableDisable(std::string pkg, std::string opPkg, bool enable);
 
-    /**
-     * Opens the enabled span, or closes it as the count has it. Closing adds its seconds to the
-     * total, runs `calCurretTime` for the last package, and sets a count below 0 to 0.
-     */
+    /** Opens the enabled span, or closes it: adds it to the total and runs `calCurretTime`. */
     void dealWithOrientationTotalTime();
 
-    /**
-     * Books the charging-and-enabled span up to now to the last kind of charging, unless it was
-     * shorter than a second.
-     */
+    /** Books the charging-and-enabled span to the last kind of charging, from 1 s on. */
     void recordTime();
 
-    /**
-     * If the day counter is past its value at the last report: brings the days of the totals to it,
-     * back too if the counter went back, and reports the totals.
-     */
+    /** If the day counter has risen since the last report: sets the days to it and reports. */
     void calCurretTime(std::string pkg);
 
-    /** Sends the report of the totals, which names `pkg`, and posts their store. */
+    /** Reports the totals with `pkg` and posts their save. */
     void setOrientationTally(std::string pkg);
 
     /**
-     * Replaces each total by the stored one, 0 if it is unset; what is no number leaves the total
-     * as it was. Time counted since the start of the process is lost.
+     * Loads the totals; what was counted since the start of the process is lost. A total that is
+     * not stored becomes 0. A stored text that is no number leaves the total as it was.
      */
     void getPersistStatistics();
 
@@ -152,15 +128,11 @@ public:
 
     /**
      * Takes the connections that are not enabled out of the table and reports the 50 with the
-     * longest time, if there are any; the rest of them are dropped. `mPkgLock` is released before
-     * the list is made.
+     * longest time. The others are dropped. Without any: no report.
      */
     void recordPkgInfoTally();
 
-    /**
-     * Books the seconds from the record's `chargeBeginTime` to `now`, monotonic ns, to the last
-     * kind of charging. For a record of the table `mPkgLock` must be held.
-     */
+    /** Books the charge span up to `now`, in ns, to the last charge kind. Needs `mPkgLock`. */
     void updateChargeTime(std::unordered_map<std::string, PkgInfo>::iterator it, long long now);
 
     /** Whether `a` has the longer time. */

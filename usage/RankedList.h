@@ -12,10 +12,10 @@
 
 namespace android {
 
-// The daily lists of connections: a module takes the ended ones out of its table under its lock and
-// makes the list of its own copies, with the lock released.
+// The daily lists of connections. A module takes the ended connections out of its table under its
+// lock, releases the lock, and makes the list of what it took.
 
-/** Moves the connections for which `isEnded(info)` holds out of `table`, in the table's order. */
+/** Moves the connections for which `isEnded(info)` out of `table`, in the table's order. */
 template <typename Info, typename IsEnded>
 std::vector<std::pair<std::string, Info>> takeOut(std::unordered_map<std::string, Info>* table,
                                                   IsEnded isEnded) {
@@ -32,10 +32,9 @@ std::vector<std::pair<std::string, Info>> takeOut(std::unordered_map<std::string
 }
 
 /**
- * The 50 connections that come first by `comp`, as a JSON text on one line: an object whose "list"
- * has an object for each, with its key as "pkg" and what `describe(info, &entry)` puts beside it.
- * Where `comp` sees no difference, the keys decide, so that ties come out alike on every platform.
- * Empty if there are no connections.
+ * The 50 connections that are first by `comp`, as JSON on one line; empty if there are none. "list"
+ * has an object for each: its key as "pkg", and what `describe(info, &entry)` adds. The keys decide
+ * ties, so that the list is the same on every platform.
  */
 template <typename Info, typename Comp, typename Describe>
 std::string rankedList(std::vector<std::pair<std::string, Info>> connections, Comp comp,

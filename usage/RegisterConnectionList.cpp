@@ -36,7 +36,8 @@ void RegisterConnectionList::handleEnable(const std::string& pkg, const std::str
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
     Mutex::Autolock lock(mLock);
 
-    // Only one of those at the current rate earns the time, whoever comes first in the table.
+    // Of those at the current rate, the first in the table earns the time. The others restart
+    // without credit, on purpose.
     bool credited = false;
     for (auto& [key, info] : mConnections) {
         if (info.beginTime == 0) continue;
@@ -53,6 +54,7 @@ void RegisterConnectionList::handleEnable(const std::string& pkg, const std::str
 
     if (mCurrentRate == kNoRate || rate < mCurrentRate) mCurrentRate = rate;
 
+    // A known connection keeps its first rate.
     const auto [it, inserted] = mConnections.try_emplace(connectionKey(pkg, opPkg));
     PkgRegInfo& info = it->second;
     if (inserted) info.rate = rate;
@@ -70,6 +72,7 @@ void RegisterConnectionList::handleDisable(const std::string& pkg, const std::st
     PkgRegInfo& ended = it->second;
     if (!unnestEnable(&ended.enableCount)) return;
 
+    // A connection that did not set the rate earns nothing.
     if (ended.rate != mCurrentRate) {
         ended.beginTime = 0;
         ended.onBeginTime = 0;
@@ -77,6 +80,7 @@ void RegisterConnectionList::handleDisable(const std::string& pkg, const std::st
     }
     addSeconds(&ended.time, ended.beginTime, now);
     ended.beginTime = 0;
+    // [sic] Not tested for 0, unlike in `handleEnable`.
     if (isDisplayOn()) addSeconds(&ended.ontime, ended.onBeginTime, now);
     ended.onBeginTime = 0;
 
@@ -90,6 +94,7 @@ void RegisterConnectionList::handleDisable(const std::string& pkg, const std::st
 }
 
 void RegisterConnectionList::setDisplayState(int state) {
+    // Compared and stored before the lock, on purpose.
     if (state == mDisplayState) return;
     mDisplayState = state;
     handleDisplayStateChanged();
@@ -121,6 +126,7 @@ std::string RegisterConnectionList::getRegisterConnectionInfo() {
     {
         Mutex::Autolock lock(mLock);
         ended = takeOut(&mConnections, [](const PkgRegInfo& info) {
+            // Without credited time they stay until `clear`.
             return info.beginTime == 0 && info.time != 0;
         });
     }
@@ -138,6 +144,8 @@ bool RegisterConnectionList::comp(const std::pair<std::string, PkgRegInfo>& a,
 
 void RegisterConnectionList::clear() {
     Mutex::Autolock lock(mLock);
+    // The current rate stays. If nobody has it any more, nobody is credited until an enable brings
+    // a smaller one.
     mConnections.clear();
 }
 

@@ -11,7 +11,7 @@
 
 namespace android {
 
-/** What is known of one connection, an app's use of one of the two motion sensors. */
+/** One connection's use of a motion sensor. */
 struct PkgRegInfo {
     int64_t beginTime = 0;    // monotonic ns; start of the span being counted; 0: not enabled
     int32_t time = 0;         // seconds credited while the sensor ran at this connection's rate
@@ -22,49 +22,51 @@ struct PkgRegInfo {
 };
 
 /**
- * The connections that registered one sensor, and the rate that it runs at: the smallest rate value
- * of the enabled ones. Time is credited only to a connection whose own rate is that rate, and at
- * any moment to one of them only, so that a report tells who keeps the sensor running fast.
+ * The connections that registered one sensor. The sensor's current rate is the smallest rate value
+ * among the enabled ones. At any moment, time is credited to one connection only, and only to one
+ * at the current rate: the report tells who keeps the sensor running fast.
  *
- * All operations may be called from any thread and hold `mLock` throughout, but for the comparison
- * in `setDisplayState` and the sorting and formatting of `getRegisterConnectionInfo`. Times are
- * read from the monotonic clock before the lock is taken; spans count as whole seconds, truncated.
+ * Any thread may call any operation. All hold `mLock` throughout, except that `setDisplayState`
+ * compares first and `getRegisterConnectionInfo` sorts and formats afterwards. Spans are whole
+ * seconds of the monotonic clock, truncated.
  */
 class SENSOR_PRIV_EXPORT RegisterConnectionList {
 public:
     RegisterConnectionList();
     ~RegisterConnectionList();
 
-    /** `handleEnable`, or `handleDisable`, to which `rate` means nothing. */
+    /** Runs `handleEnable` or `handleDisable`. Only an enable has a `rate`. */
     void update(const std::string& pkg, const std::string& opPkg, bool enable, long long rate);
 
     /**
-     * Credits the first enabled connection, in the table's order, that holds the current rate;
-     * restarts the spans of all enabled ones, the others' time being lost; lowers the current rate
-     * to `rate`; then starts the connection pkg/opPkg or, if it is known, adds an enable to it. The
-     * rate of its first enable stays.
+     * In this order:
+     *  1. Credits the first enabled connection of the table that has the current rate.
+     *  2. Restarts the spans of all enabled ones. The time of the others is lost.
+     *  3. Lowers the current rate to `rate`.
+     *  4. Starts the connection, or adds an enable to it. Its first rate stays.
      */
     void handleEnable(const std::string& pkg, const std::string& opPkg, long long rate);
 
     /**
-     * Takes an enable from the connection, below zero too. When none is left it ends: credited if
-     * it holds the current rate, in which case that rate is found anew and the spans of those still
-     * enabled restart without credit; else with nothing. Unknown connections are ignored.
+     * Takes an enable off a known connection, below zero too. With the last one it ends:
+     *  - At the current rate: it is credited, the rate is found anew, and the spans of the enabled
+     *    ones restart without credit.
+     *  - At another rate: nothing is credited.
      */
     void handleDisable(const std::string& pkg, const std::string& opPkg);
 
-    /** Takes a new display state: 2 is on, any other is not. The same one again does nothing. */
+    /** Takes the display state; 2 is on. The same one again does nothing. */
     void setDisplayState(int state);
 
     /**
-     * Display on: starts the display-on span of every enabled connection. Otherwise ends all of
-     * them, crediting the first one, in the table's order, that holds the current rate.
+     * On: starts the display-on spans of the enabled connections. Otherwise: ends them all, and
+     * credits the first one of the table that has the current rate.
      */
     void handleDisplayStateChanged();
 
     /**
-     * Takes the ended connections with credited time out of the list and returns the 50 with the
-     * longest as JSON text on one line; the rest of them are dropped. Empty if there are none.
+     * Takes the ended connections with credited time out of the list. Returns the 50 with the
+     * longest time as JSON on one line, or an empty text. The others are dropped.
      */
     std::string getRegisterConnectionInfo();
 
@@ -72,10 +74,7 @@ public:
     static bool comp(const std::pair<std::string, PkgRegInfo>& a,
                      const std::pair<std::string, PkgRegInfo>& b);
 
-    /**
-     * Forgets all connections, enabled ones too. The current rate and the display state stay, so
-     * that a rate which nobody holds any more may keep others from being credited.
-     */
+    /** Forgets all connections, enabled ones too. The current rate and the display state stay. */
     void clear();
 
 private:

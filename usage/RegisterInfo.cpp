@@ -56,6 +56,7 @@ void RegisterInfo::handleDisable(int type, std::string pkg, std::string opPkg) {
 }
 
 void RegisterInfo::setNotification(const Vector<int>& values) {
+    // Element 1 is not read.
     if (values.size() > kDisplayElement && values[0] == kDisplayNotification) {
         setDisplayState(values[kDisplayElement]);
     }
@@ -76,6 +77,7 @@ void RegisterInfo::putPkgInfoTally() {
 }
 
 void RegisterInfo::notifyRegisterInfoReset() {
+    // Acts at once. A report that is still posted finds empty lists.
     mAccConnections->clear();
     mGyroConnections->clear();
 }

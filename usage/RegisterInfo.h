@@ -14,47 +14,47 @@ namespace android {
 class RegisterConnectionList;
 
 /**
- * Watches which connections register the accelerometer (sensor types 1 and 35) and the gyroscope (4
- * and 16), at which rate and for how long, and reports the longest ones once a day: "N273|10003"
- * for the accelerometer, "N273|10004" for the gyroscope. Nothing is persisted. `SDCImpl` calls it.
+ * Watches which connections register the accelerometer and the gyroscope, calibrated or not, at
+ * which rate and for how long. Reports the longest ones daily: "N273|10003" for the accelerometer,
+ * "N273|10004" for the gyroscope. Nothing is stored. `SDCImpl` calls it.
  *
- * All operations may be called from any thread; each list locks itself, never both at once.
+ * Any thread may call any operation. Each list locks itself; both are never locked at once.
  */
 class SENSOR_PRIV_EXPORT RegisterInfo {
 public:
-    /** The single instance, created by the first call. Locks `sLock`. */
+    /** The single instance. The first call creates it. Locks `sLock`. */
     static RegisterInfo* getInstance();
 
     RegisterInfo();
 
-    /** Notes an enable at `rate`, in the host's unit: the smaller the faster. Other types: none. */
+    /** Notes an enable at `rate`, in the host's unit; smaller is faster. Ignores other types. */
     void handleEnable(int type, std::string pkg, std::string opPkg, long long rate);
 
     /** Notes a disable or a clean-up. */
     void handleDisable(int type, std::string pkg, std::string opPkg);
 
     /**
-     * Takes the display state from element 2 of a notification whose element 0, its kind, is 2.
-     * Other kinds, and lists too short for theirs, are ignored.
+     * Takes the display state from element 2 of a notification of kind 2; element 0 is the kind.
+     * Ignores other kinds and lists that are too short.
      */
     void setNotification(const Vector<int>& values);
 
-    /** Passes the display state (2: on) to both lists. */
+    /** Passes the display state to both lists; 2 is on. */
     void setDisplayState(int state);
 
-    /** Posts the daily report to the worker thread. */
+    /** Posts the daily report. */
     void notifyDayNight();
 
-    /** Sends the daily report of each list that has something to report, accelerometer first. */
+    /** Reports each list that has something to report, the accelerometer's first. */
     void putPkgInfoTally();
 
-    /** Empties both lists at once, on the caller's thread: before a report that is still posted. */
+    /** Empties both lists on the caller's thread. */
     void notifyRegisterInfoReset();
 
 private:
     class RegisterHandler;
 
-    /** The list for `type`, null if none. */
+    /** The list for `type`, or null. */
     SENSOR_PRIV_HIDDEN RegisterConnectionList* listFor(int type) const;
 
     // Constant after construction.
