@@ -40,6 +40,8 @@ int main(int argc, char** argv) {
     options.jobs = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     CLI::App app(kExamples, "sensor-replay");
     app.footer(kStatuses);
+    app.set_version_flag("--version", "sensor-replay " SENSOR_REPLAY_VERSION,
+                         "print the version and exit");
     auto* log = app.add_flag("--log", options.log, "print what happens, a line each, as it comes");
     auto* json =
             app.add_flag("--json", options.json, "print the same as JSON Lines")->excludes(log);
