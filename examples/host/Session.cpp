@@ -185,7 +185,7 @@ Session::Error Session::show(int red, int green, int blue) {
 }
 
 Session::Error Session::setProperty(const std::string& name, const std::string& value) {
-    const Error error = platform::refuseProperty(name, value);
+    Error error = platform::refuseProperty(name, value);
     if (!error) platform::setDeviceProperty(name, value);
     return error;
 }

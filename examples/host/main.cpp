@@ -119,14 +119,18 @@ int run(const Options& options) {
         const auto error = platform::openProperties(options.properties);
         if (error) return fail(kStatusBadInput, *error);
     }
+    int listener = -1;
+    if (!options.socket.empty()) {
+        listener = listenAt(options.socket);
+        if (listener < 0) {
+            return fail(kStatusBadInput, options.socket + ": " + std::strerror(errno));
+        }
+    }
     const milliseconds hour(options.hourMs);
     auto* const service = new SensorService;
-    if (!options.socket.empty()) {
-        const int listener = listenAt(options.socket);
-        if (listener < 0)
-            return fail(kStatusBadInput, options.socket + ": " + std::strerror(errno));
-        std::printf("listening\n");
+    if (listener >= 0) {
         std::thread(acceptClients, listener, service, hour).detach();
+        std::printf("listening\n");
     }
     if (options.script.empty()) runClock(service, hour);
     int status = 0;
