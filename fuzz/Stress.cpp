@@ -74,7 +74,7 @@ std::vector<Argument> makeArguments(Random& random) {
 }
 
 constexpr std::vector<Argument> (*kArguments[])(Random&) = {
-#define CALL(Class, operation) makeArguments<decltype(&android::Class::operation)>,
+#define CALL(Class, operation, parameters) makeArguments<decltype(&android::Class::operation)>,
 #define VARIABLE(name)
 #include "trace/calls.inc"
 #undef CALL

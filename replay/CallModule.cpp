@@ -100,7 +100,7 @@ std::optional<std::string> call(const std::vector<Argument>& arguments) {
 
 std::optional<std::string> callByIndex(size_t index, const std::vector<Argument>& arguments) {
     constexpr std::optional<std::string> (*kCalls[])(const std::vector<Argument>&) = {
-#define CALL(Class, operation) call<&android::Class::operation>,
+#define CALL(Class, operation, parameters) call<&android::Class::operation>,
 #define VARIABLE(name)
 #include "trace/calls.inc"
 #undef CALL
@@ -111,7 +111,7 @@ std::optional<std::string> callByIndex(size_t index, const std::vector<Argument>
 
 void setByIndex(size_t index, int32_t value) {
     constexpr void (*kSetters[])(int32_t) = {
-#define CALL(Class, operation)
+#define CALL(Class, operation, parameters)
 #define VARIABLE(name) [](int32_t number) { ::name = static_cast<decltype(::name)>(number); },
 #include "trace/calls.inc"
 #undef CALL

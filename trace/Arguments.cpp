@@ -79,7 +79,7 @@ struct ReadersOf<std::tuple<Types...>> {
 };
 
 constexpr Readers kCallReaders[] = {
-#define CALL(Class, operation) \
+#define CALL(Class, operation, parameters) \
     ReadersOf<typename ArgumentsOf<decltype(&android::Class::operation)>::type>::kReaders,
 #define VARIABLE(name)
 #include "trace/calls.inc"
@@ -96,7 +96,7 @@ Error readTyped(element json, int32_t* value) {
 }
 
 constexpr Error (*kVariableReaders[])(element, int32_t*) = {
-#define CALL(Class, operation)
+#define CALL(Class, operation, parameters)
 #define VARIABLE(name) readTyped<decltype(::name)>,
 #include "trace/calls.inc"
 #undef CALL

@@ -53,7 +53,7 @@ struct Call {
 };
 
 constexpr Call kCalls[] = {
-#define CALL(Class, operation) \
+#define CALL(Class, operation, parameters) \
     {#Class "." #operation, describeArguments<decltype(&android::Class::operation)>},
 #define VARIABLE(name)
 #include "trace/calls.inc"
@@ -62,7 +62,7 @@ constexpr Call kCalls[] = {
 };
 
 constexpr std::string_view kVariables[] = {
-#define CALL(Class, operation)
+#define CALL(Class, operation, parameters)
 #define VARIABLE(name) #name,
 #include "trace/calls.inc"
 #undef CALL

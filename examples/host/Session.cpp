@@ -153,7 +153,7 @@ Session::Error Session::change(const std::string& what) {
 }
 
 Session::Error Session::set(const std::string& name, int value) {
-#define CALL(Class, operation)
+#define CALL(Class, operation, parameters)
 #define VARIABLE(variable)                                     \
     if (name == #variable) {                                   \
         ::variable = static_cast<decltype(::variable)>(value); \

@@ -1,0 +1,288 @@
+#include "record/Recorder.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <ctime>
+
+#include <android/log.h>
+#include <cutils/properties.h>
+#include <pthread.h>
+#include <unistd.h>
+
+#include "record/Arguments.h"
+#include "record/JsonText.h"
+#include "record/Log.h"
+
+namespace record {
+
+namespace {
+
+constexpr size_t kDefaultMegabytes = 16;
+
+/** What a part keeps free for what the library does after a call has found room. */
+constexpr size_t kReserve = size_t{32} << 10;
+
+/** A setting: an environment variable or, without it, a property. */
+std::string setting(const char* variable, const char* property) {
+    if (const char* value = std::getenv(variable)) return value;
+    char value[PROPERTY_VALUE_MAX] = {};
+    property_get(property, value, "");
+    return value;
+}
+
+int64_t monotonicNow() {
+    timespec now{};
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    return int64_t{now.tv_sec} * 1'000'000'000 + now.tv_nsec;
+}
+
+/** For a person who looks for something that happened at a time of the day. */
+std::string date() {
+    const time_t now = time(nullptr);
+    tm parts{};
+    char text[32] = {};
+    gmtime_r(&now, &parts);
+    strftime(text, sizeof(text), "%Y-%m-%dT%H:%M:%SZ", &parts);
+    return text;
+}
+
+}  // namespace
+
+std::atomic<Recorder*> Recorder::sWriting{nullptr};
+std::atomic<Recorder*> Recorder::sStarted{nullptr};
+std::atomic<bool> Recorder::sWantsEvents{false};
+
+/** Tells the recorder when a message of the library's runs. */
+class Recorder::Courier : public android::MessageHandler {
+public:
+    Courier(Recorder* recorder, android::sp<android::MessageHandler> handler)
+          : mRecorder(recorder),
+            mHandler(std::move(handler)) {}
+
+    void handleMessage(const android::Message& message) override {
+        PlainRun run;
+        if (!mRecorder->beginMessage(&run, mHandler.get(), message.what)) return;
+        {
+            const Run::Scope scope(&run);
+            mHandler->handleMessage(message);
+        }
+        mRecorder->end(&run);
+    }
+
+private:
+    Recorder* const mRecorder;
+    const android::sp<android::MessageHandler> mHandler;
+};
+
+Recorder* Recorder::get() {
+    static const bool started = (start(), true);
+    return started ? sWriting.load(std::memory_order_acquire) : nullptr;
+}
+
+Recorder* Recorder::getOnceStarted() {
+    return sStarted.load(std::memory_order_acquire);
+}
+
+void Recorder::start() {
+    const std::string folder = setting("SENSOR_PRIV_RECORD", "persist.debug.sensor_priv.record");
+    if (folder.empty()) return;
+    const std::string megabytes =
+            setting("SENSOR_PRIV_RECORD_MB", "persist.debug.sensor_priv.record_mb");
+    const std::string redact =
+            setting("SENSOR_PRIV_RECORD_REDACT", "persist.debug.sensor_priv.record_redact");
+    std::unique_ptr<Names> names;
+    std::optional<std::string> error;
+    if (!redact.empty() && redact != "0") {
+        const auto key = Names::loadKey(folder);
+        if (key) names = std::make_unique<Names>(*key);
+        if (!key) error = folder + " keeps no key";
+    }
+    auto* const recorder = new Recorder(std::move(names));  // never destroyed: the worker uses it
+    const size_t limit = std::strtoul(megabytes.c_str(), nullptr, 10);
+    if (!error) error = recorder->begin(folder, (limit > 0 ? limit : kDefaultMegabytes) << 20);
+    if (error) {
+        __android_log_print(ANDROID_LOG_ERROR, kLogTag, "nothing is recorded: %s", error->c_str());
+        delete recorder;
+        return;
+    }
+    sStarted.store(recorder, std::memory_order_release);
+    sWriting.store(recorder, std::memory_order_release);
+    // A child would write into its parent's record, and may have got the lock locked.
+    pthread_atfork(nullptr, nullptr, [] {
+        sWriting = nullptr;
+        sStarted = nullptr;
+        sWantsEvents = false;
+    });
+}
+
+std::optional<std::string> Recorder::begin(const std::string& folder, size_t bytes) {
+    const android::Mutex::Autolock lock(mLock);
+    if (auto error = mParts.open(folder, bytes)) return error;
+    if (mParts.isFullFor(kReserve)) {
+        if (auto error = mParts.startNext()) return error;
+    }
+    mText = "# " + date() + ": process " + std::to_string(getpid()) + " begins\n";
+    appendStart(mTimeline.next(monotonicNow()));
+    if (auto error = mParts.write(mText)) return error;
+    mText.clear();
+    __android_log_print(ANDROID_LOG_INFO, kLogTag, "recording to %s", mParts.path().c_str());
+    return {};
+}
+
+std::string Recorder::maskName(const std::string& name) {
+    return mNames != nullptr ? mNames->replace(name) : name;
+}
+
+void Recorder::beginCall(Run* run, const Call& call) {
+    const android::Mutex::Autolock lock(mLock);
+    if (!mParts.isOpen()) return;
+    const int64_t at = mTimeline.next(monotonicNow());
+    if (mParts.isFullFor(call.body.size() + kReserve)) startPart(at);
+    if (call.readsProperties) appendAny(at, mSurroundings.takeProperties());
+    appendAny(at, mSurroundings.takeVariables());
+    if (call.isSample) appendAny(at, mScreen.take(call.rgb, call.rect));
+    append(at, call.body);
+    write();
+    run->now = at;
+    run->clockStands = true;
+    mRuns.begin(run);
+}
+
+bool Recorder::beginMessage(Run* run, const android::MessageHandler* handler, int what) {
+    const android::Mutex::Autolock lock(mLock);
+    if (!mParts.isOpen()) return true;
+    // A worker that had already taken the message out when the library took it back is late.
+    const std::optional<int64_t> now = mTimeline.start(handler, what);
+    if (!now) return false;
+    run->now = *now;
+    run->clockStands = true;
+    run->isMessage = true;
+    run->tellsMoment = true;
+    mRuns.begin(run);
+    return true;
+}
+
+void Recorder::end(Run* run) {
+    const android::Mutex::Autolock lock(mLock);
+    appendAll(mRuns.end(run), run->now);
+    write();
+}
+
+void Recorder::expectEvent(Run* run, const char* module, const char* id, const char* payload) {
+    const std::string text = mNames != nullptr ? mNames->replaceAll(payload) : payload;
+    std::string body = R"("expect": {"event": {"module": )";
+    appendText(&body, module);
+    body += R"(, "id": )";
+    appendText(&body, id);
+    body += R"(, "payload": )";
+    appendText(&body, text);
+    expect(run, body + "}}");
+}
+
+void Recorder::expectProperty(Run* run, const char* name, const char* value) {
+    std::string body = R"("expect": {"property": {"name": )";
+    appendText(&body, name);
+    body += R"(, "value": )";
+    appendText(&body, value);
+    expect(run, body + "}}");
+    const android::Mutex::Autolock lock(mLock);
+    mSurroundings.noteProperty(name, value);
+}
+
+void Recorder::expect(Run* run, std::string_view body) {
+    const android::Mutex::Autolock lock(mLock);
+    if (!mParts.isOpen()) return;
+    std::string lines;
+    // A line without an action lets a replay come to the message's moment, also at a trace's end.
+    if (run->tellsMoment) lines += '\n';
+    run->tellsMoment = false;
+    lines.append(body).append("\n");
+    if (!mRuns.mayWrite(run, lines)) return;
+    appendAll(lines, run->now);
+    write();
+}
+
+android::sp<android::MessageHandler> Recorder::post(
+        const Run& run, const android::sp<android::MessageHandler>& handler, int what,
+        int delayMs) {
+    const android::Mutex::Autolock lock(mLock);
+    android::sp<android::MessageHandler>& courier = mCouriers[handler.get()];
+    if (courier == nullptr) courier = new Courier(this, handler);
+    mTimeline.post(handler.get(), what, run.clockStands ? run.now : monotonicNow(), delayMs,
+                   run.isMessage);
+    return courier;
+}
+
+android::sp<android::MessageHandler> Recorder::remove(
+        const android::sp<android::MessageHandler>& handler, std::optional<int> what) {
+    const android::Mutex::Autolock lock(mLock);
+    mTimeline.remove(handler.get(), what);
+    const auto courier = mCouriers.find(handler.get());
+    return courier != mCouriers.end() ? courier->second : handler;
+}
+
+void Recorder::noteSingleton(const char* name) {
+    const android::Mutex::Autolock lock(mLock);
+    mSingletons.push_back(name);
+}
+
+void Recorder::noteProximity(bool enabled, const std::string& client) {
+    const android::Mutex::Autolock lock(mLock);
+    if (enabled) {
+        mProximityClients.insert(client);
+    } else {
+        mProximityClients.erase(client);
+    }
+    sWantsEvents = !mProximityClients.empty();
+}
+
+void Recorder::append(int64_t at, std::string_view body) {
+    mText += R"({"at": )";
+    appendMs(&mText, at);
+    if (!body.empty()) mText.append(", ").append(body);
+    mText += "}\n";
+}
+
+void Recorder::appendAny(int64_t at, std::string_view body) {
+    if (!body.empty()) append(at, body);
+}
+
+void Recorder::appendAll(std::string_view bodies, int64_t now) {
+    while (!bodies.empty()) {
+        const size_t end = bodies.find('\n');
+        append(mTimeline.tell(now), bodies.substr(0, end));
+        bodies.remove_prefix(end + 1);
+    }
+}
+
+void Recorder::appendStart(int64_t at) {
+    append(at, R"("boot": "device")");
+    append(at, mSurroundings.takeProperties());
+    appendAny(at, mSurroundings.takeVariables());
+}
+
+void Recorder::startPart(int64_t at) {
+    if (const auto error = mParts.startNext()) return stop(*error);
+    mSurroundings.forget();
+    mScreen.forget();
+    mText += "# " + date() + ": process " + std::to_string(getpid()) + " goes on in a new part\n";
+    appendStart(at);
+    for (const char* singleton : mSingletons) append(at, callBody(singleton));
+    mText += "# end of its start\n";
+}
+
+void Recorder::write() {
+    if (mParts.isOpen() && !mText.empty()) {
+        if (const auto error = mParts.write(mText)) stop(*error);
+    }
+    mText.clear();
+}
+
+void Recorder::stop(const std::string& error) {
+    __android_log_print(ANDROID_LOG_ERROR, kLogTag, "the record has ended: %s", error.c_str());
+    mParts.close();
+    sWriting = nullptr;
+    sWantsEvents = false;
+}
+
+}  // namespace record

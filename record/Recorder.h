@@ -1,0 +1,136 @@
+#pragma once
+
+#include <atomic>
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <optional>
+#include <set>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include <utils/Looper.h>
+#include <utils/Mutex.h>
+#include <utils/StrongPointer.h>
+
+#include "record/Names.h"
+#include "record/Parts.h"
+#include "record/Run.h"
+#include "record/RunOrder.h"
+#include "record/Screen.h"
+#include "record/Surroundings.h"
+#include "record/Timeline.h"
+
+namespace record {
+
+/**
+ * Writes a process's trace. The first call decides, by the settings (docs/recording.md), whether
+ * there is one; it begins with a boot line and with the properties and variables that the library
+ * reads.
+ *
+ * All operations may be called from any thread. One lock guards all; it is never held while the
+ * library, the host or the device's telemetry runs. What cannot be written ends the record, with
+ * one line in the log, and nothing else.
+ */
+class Recorder {
+public:
+    /** The process's recorder; null if nothing is recorded, or not any more. */
+    static Recorder* get();
+
+    /**
+     * The recorder as long as the process lives, also after the record has ended: messages that
+     * were posted through it are still on their way. Null if there never was one.
+     */
+    static Recorder* getOnceStarted();
+
+    /** Whether events matter: a client holds the proximity sensor. */
+    static bool wantsEvents() { return sWantsEvents.load(std::memory_order_relaxed); }
+
+    /** A stand-in for `name`, if names are to be replaced. */
+    std::string maskName(const std::string& name);
+
+    /** A call from outside, as its line tells it. */
+    struct Call {
+        std::string body;
+        bool readsProperties = false;  // the library reads properties on account of it
+        bool isSample = false;         // of the screen
+        const int* rgb = nullptr;      // a sample's averages; null: it has failed
+        const int* rect = nullptr;     // a sample's rectangle
+    };
+
+    /** `run`, a call from outside, begins: its lines are written. */
+    void beginCall(Run* run, const Call& call) EXCLUDES(mLock);
+
+    /** `run`, a message, begins. False if the library has taken it back meanwhile. */
+    bool beginMessage(Run* run, const android::MessageHandler* handler, int what) EXCLUDES(mLock);
+
+    /** `run` ends. */
+    void end(Run* run) EXCLUDES(mLock);
+
+    // The library is about to send telemetry, or to set a property, in `run`.
+    void expectEvent(Run* run, const char* module, const char* id, const char* payload)
+            EXCLUDES(mLock);
+    void expectProperty(Run* run, const char* name, const char* value) EXCLUDES(mLock);
+
+    /**
+     * The library posts `what` in `run`. Returns the handler to post it to, which tells the
+     * recorder when the message runs.
+     */
+    android::sp<android::MessageHandler> post(const Run& run,
+                                              const android::sp<android::MessageHandler>& handler,
+                                              int what, int delayMs) EXCLUDES(mLock);
+
+    /**
+     * The library takes messages of `handler` back. Returns the handler that they were posted to.
+     */
+    android::sp<android::MessageHandler> remove(const android::sp<android::MessageHandler>& handler,
+                                                std::optional<int> what) EXCLUDES(mLock);
+
+    /** The singleton that the call `name` creates is there. */
+    void noteSingleton(const char* name) EXCLUDES(mLock);
+
+    /** The client `client` has enabled, or disabled, the proximity sensor. */
+    void noteProximity(bool enabled, const std::string& client) EXCLUDES(mLock);
+
+private:
+    class Courier;
+
+    explicit Recorder(std::unique_ptr<Names> names) : mNames(std::move(names)) {}
+
+    static void start();
+
+    std::optional<std::string> begin(const std::string& folder, size_t bytes) EXCLUDES(mLock);
+    void expect(Run* run, std::string_view body) EXCLUDES(mLock);
+
+    // Lines are gathered and then written at once.
+    void append(int64_t at, std::string_view body) REQUIRES(mLock);
+    void appendAny(int64_t at, std::string_view body) REQUIRES(mLock);
+    void appendAll(std::string_view bodies, int64_t now) REQUIRES(mLock);
+    void appendStart(int64_t at) REQUIRES(mLock);
+    void startPart(int64_t at) REQUIRES(mLock);
+    void write() REQUIRES(mLock);
+    void stop(const std::string& error) REQUIRES(mLock);
+
+    static std::atomic<Recorder*> sWriting;  // null again when the record has ended
+    static std::atomic<Recorder*> sStarted;
+    static std::atomic<bool> sWantsEvents;
+
+    const std::unique_ptr<Names> mNames;  // null: names are written as they are
+
+    android::Mutex mLock;
+    Parts mParts GUARDED_BY(mLock);
+    Timeline mTimeline GUARDED_BY(mLock);
+    RunOrder mRuns GUARDED_BY(mLock);
+    Surroundings mSurroundings GUARDED_BY(mLock);
+    Screen mScreen GUARDED_BY(mLock);
+    std::string mText GUARDED_BY(mLock);  // to be written
+    std::vector<const char*> mSingletons GUARDED_BY(mLock);
+    std::set<std::string> mProximityClients GUARDED_BY(mLock);
+    // By the library's handler.
+    std::map<const android::MessageHandler*, android::sp<android::MessageHandler>> mCouriers
+            GUARDED_BY(mLock);
+};
+
+}  // namespace record

@@ -1,0 +1,7 @@
+#include "record/Run.h"
+
+namespace record {
+
+thread_local Run* Run::tCurrent = nullptr;
+
+}  // namespace record

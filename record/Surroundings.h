@@ -1,0 +1,43 @@
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace record {
+
+/**
+ * What the library reads of the device beside its calls: the exported variables and the system
+ * properties. Says what of it a replay does not know yet. Not safe for threads by itself.
+ */
+class Surroundings {
+public:
+    Surroundings();
+
+    /** Looks at the variables. Returns a "set" line's body for those that have changed, or "". */
+    std::string takeVariables();
+
+    /** Looks at the properties. Returns a "property" line's body likewise. */
+    std::string takeProperties();
+
+    /** The library sets a property. A replay lets it succeed, whatever the device says. */
+    void noteProperty(const std::string& name, const std::string& value);
+
+    /** A replay that begins now knows nothing. */
+    void forget();
+
+private:
+    struct Variable {
+        const char* name;
+        const void* address;  // null: the host's library does not have it
+        bool isBool;
+        std::optional<int32_t> known;
+    };
+
+    std::vector<Variable> mVariables;
+    std::map<std::string, std::string> mKnownProperties;  // unset: ""
+};
+
+}  // namespace record
