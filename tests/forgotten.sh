@@ -23,12 +23,12 @@ for class in $(sed -n 's/^class SENSOR_PRIV_EXPORT \([A-Za-z]*\).*/\1/p' \
 done
 
 for operation in $(nm -D --defined-only --demangle "$2" |
-    sed -n 's/.* android::SDCImpl::\([a-z][A-Za-z]*\)(.*/\1/p' | grep -v '^handle'); do  # its own steps
-    expect "CALL(SDCImpl, $operation)" trace/calls.inc "the facade's operation $operation"
+    sed -n 's/.* android::SDCImpl::\([a-z][A-Za-z]*\)(.*/\1/p' | grep -Ev '^(handle|getInstance)'); do  # its own steps
+    expect "CALL(SDCImpl, $operation, " trace/calls.inc "the facade's operation $operation"
 done
 
-for call in $(sed -n 's/^CALL(\(.*\), \(.*\))/\1.\2/p' trace/calls.inc); do
-    [ "${call#*.}" = getInstance ] || expect "| \`$call\` |" docs/trace.md "the call $call"
+for call in $(sed -n 's/^CALL(\([^,]*\), \([^,]*\), .*/\1.\2/p' trace/calls.inc); do
+    expect "| \`$call\` |" docs/trace.md "the call $call"
 done
 
 strings() {
