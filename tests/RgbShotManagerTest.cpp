@@ -22,14 +22,14 @@ thread_local int locksUntilThen = 0;
 }  // namespace
 
 /** The sanitizers' own `pthread_mutex_lock`, in their builds. */
-extern "C" int __interceptor_pthread_mutex_lock(pthread_mutex_t* mutex) __attribute__((weak));
+extern "C" int sanitizersLock(pthread_mutex_t* mutex) asm("__interceptor_pthread_mutex_lock")
+        __attribute__((weak));
 
 extern "C" int pthread_mutex_lock(pthread_mutex_t* mutex) noexcept {
     static const auto libcLock =
             reinterpret_cast<int (*)(pthread_mutex_t*)>(dlsym(RTLD_NEXT, "pthread_mutex_lock"));
     if (locksUntilThen > 0 && --locksUntilThen == 0) (*otherThread)();
-    if (__interceptor_pthread_mutex_lock != nullptr) return __interceptor_pthread_mutex_lock(mutex);
-    return libcLock(mutex);
+    return sanitizersLock != nullptr ? sanitizersLock(mutex) : libcLock(mutex);
 }
 
 namespace android {
