@@ -4,6 +4,8 @@
 #include <vector>
 
 #include <cutils/properties.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
 
 #include "platform/PropertyService.h"
 #include "tests/ReplayTool.h"
@@ -298,6 +300,40 @@ TEST_F(ReplayTest, NamesFilesThatItCannotUse) {
         EXPECT_NE(played.err.find(what), std::string::npos) << played.err;
     }
     EXPECT_EQ(run("--json trace missing").out.empty(), false);
+}
+
+TEST_F(ReplayTest, StopsAtTheLineAtWhichTheStoreCannotBeWritten) {
+    Lines samples;
+    for (int i = 0; i < 40; ++i) samples.push_back(sample(std::to_string(1000 * i)));
+    write("trace", joined(samples));
+    rlimit limit{};
+    getrlimit(RLIMIT_FSIZE, &limit);
+    const rlimit full{60'000, limit.rlim_max};
+    setrlimit(RLIMIT_FSIZE, &full);
+    const Played played = run("--json --properties store trace");
+    setrlimit(RLIMIT_FSIZE, &limit);
+    EXPECT_EQ(played.status, 2);
+    // The count of one line is saved while time passes to the next.
+    const size_t saves = happened(played).size();
+    EXPECT_GT(saves, 3u);
+    EXPECT_EQ(played.err, "trace:" + std::to_string(saves + 2) +
+                                  ": store: cannot keep properties in this file: disk I/O error\n");
+    EXPECT_EQ(storedIn("store", "persist.zuno.rgb.shot.count"), std::to_string(saves));
+}
+
+TEST_F(ReplayTest, AStoreThatGoesAwayWhileTheReplayRunsIsAnError) {
+    ASSERT_EQ(mkfifo("pipe", 0600), 0);
+    for (const auto& [deed, status] : std::vector<std::pair<std::string, int>>{
+                 {":", 0}, {"rm store", 2}, {"cp store new; mv new store", 2}}) {
+        for (const char* next : {"", R"({"at": 9, "boot": "process"})"}) {
+            // The trace goes on once the first line was carried out.
+            const Played played =
+                    run("--json --properties store pipe >lines 2>errors & exec 3>pipe; echo '" +
+                        report("9") + "' >&3; until grep -q event lines; do :; done; " + deed +
+                        "; echo '" + next + "' >&3; exec 3>&-; wait $!");
+            EXPECT_EQ(played.status, status) << deed << next;
+        }
+    }
 }
 
 TEST_F(ReplayTest, ReadsLinesLongerThanABlock) {

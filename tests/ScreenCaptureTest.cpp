@@ -1,11 +1,9 @@
 #include <algorithm>
 #include <array>
-#include <cstdio>
 #include <random>
 
 #include <binder/Status.h>
 #include <gui/SurfaceComposerClient.h>
-#include <png.h>
 
 #include "core/Log.h"
 #include "platform/Display.h"
@@ -163,42 +161,6 @@ TEST_F(ScreenCaptureTest, APictureGivesTheDisplayItsSizeUntilAColorOrASizeEndsIt
     change.size = {1, 1};
     changeDisplay(change);
     EXPECT_EQ(sample({0, 0, 1, 2}), (Rgb{5, 10, 15}));
-}
-
-/** Writes `pixels` as a picture of 3 x 1 that libpng's `format` describes. */
-std::string writePng(const char* name, uint32_t format, const std::vector<uint8_t>& pixels) {
-    std::string path = ::testing::TempDir() + name;
-    png_image image{};
-    image.version = PNG_IMAGE_VERSION;
-    image.width = 3;
-    image.height = 1;
-    image.format = format;
-    EXPECT_NE(png_image_write_to_file(&image, path.c_str(), 0, pixels.data(), 0, nullptr), 0);
-    return path;
-}
-
-TEST(PictureTest, PixelsAreTakenAsTheyAreStored) {
-    const struct {
-        uint32_t format;
-        std::vector<uint8_t> stored;
-        std::vector<uint8_t> taken;
-    } kCases[] = {
-            {PNG_FORMAT_RGBA,
-             {9, 8, 7, 1, 200, 3, 4, 0, 5, 6, 7, 255},
-             {9, 8, 7, 1, 200, 3, 4, 0, 5, 6, 7, 255}},
-            {PNG_FORMAT_RGB,
-             {9, 8, 7, 200, 3, 4, 5, 6, 7},
-             {9, 8, 7, 255, 200, 3, 4, 255, 5, 6, 7, 255}},
-            {PNG_FORMAT_GA, {9, 1, 200, 0, 5, 255}, {9, 9, 9, 1, 200, 200, 200, 0, 5, 5, 5, 255}},
-    };
-    for (const auto& [format, stored, expected] : kCases) {
-        const std::string path = writePng("stored.png", format, stored);
-        Picture picture;
-        EXPECT_EQ(platform::readPng(path, &picture), std::nullopt);
-        EXPECT_EQ(picture.width, 3u);
-        EXPECT_EQ(picture.pixels, expected);
-        std::remove(path.c_str());
-    }
 }
 
 }  // namespace
