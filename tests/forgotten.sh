@@ -3,7 +3,7 @@
 # sensor-replay:
 #  - a class that is marked as exported and has no entry in the map;
 #  - an operation of the facade that no trace can call, nor the stress run, which makes every call;
-#  - a call without a row in docs/trace.md;
+#  - a call without a row in docs/trace.md, and its class in the recorder's map;
 #  - an event id or a property without a row in docs/output.md;
 #  - an event id whose payload report/Payload.cpp does not take apart;
 #  - an option of sensor-replay that its manual or the completion does not have, and the reverse;
@@ -26,12 +26,15 @@ for class in $(sed -n 's/^class SENSOR_PRIV_EXPORT \([A-Za-z]*\).*/\1/p' \
 done
 
 for operation in $(nm -D --defined-only --demangle "$2" |
-    sed -n 's/.* android::SDCImpl::\([a-z][A-Za-z]*\)(.*/\1/p' | grep -v '^handle'); do  # its own steps
-    expect "CALL(SDCImpl, $operation)" trace/calls.inc "the facade's operation $operation"
+    sed -n 's/.* android::SDCImpl::\([a-z][A-Za-z]*\)(.*/\1/p' | grep -v -e '^handle' -e '^getInstance'); do  # its own steps
+    expect "(SDCImpl, $operation," trace/calls.inc "the facade's operation $operation"
 done
 
-for call in $(sed -n 's/^CALL(\(.*\), \(.*\))/\1.\2/p' trace/calls.inc); do
-    [ "${call#*.}" = getInstance ] || expect "| \`$call\` |" docs/trace.md "the call $call"
+for call in $(sed -n 's/^CALL(\([A-Za-z]*\), \([A-Za-z]*\), .*/\1.\2/p' trace/calls.inc); do
+    expect "| \`$call\` |" docs/trace.md "the call $call"
+done
+for class in $(sed -n 's/^SINGLETON(\([A-Za-z]*\))/\1/p' trace/calls.inc); do
+    expect "    android::$class::*;" record/sensor-priv-record.map "the class $class, which hosts call"
 done
 
 strings() {
