@@ -1,10 +1,13 @@
 #!/bin/sh
-# Names what a change to the project in folder $1 has forgotten; $2 is the built library:
+# Names what a change to the project in folder $1 has forgotten; $2 and $3 are the built library and
+# sensor-replay:
 #  - a class that is marked as exported and has no entry in the map;
 #  - an operation of the facade that no trace can call, nor the stress run, which makes every call;
-#  - a call without a row in docs/trace.md;
+#  - a call without a row in docs/trace.md, and its class in the recorder's map;
 #  - an event id or a property without a row in docs/output.md;
-#  - an event id whose payload report/Payload.cpp does not take apart.
+#  - an event id whose payload report/Payload.cpp does not take apart;
+#  - an option of sensor-replay that its manual or the completion does not have, and the reverse;
+#  - a version that the list of changes does not have.
 # shellcheck disable=SC2013  # no line has a blank
 set -eu
 cd "$1"
@@ -23,12 +26,15 @@ for class in $(sed -n 's/^class SENSOR_PRIV_EXPORT \([A-Za-z]*\).*/\1/p' \
 done
 
 for operation in $(nm -D --defined-only --demangle "$2" |
-    sed -n 's/.* android::SDCImpl::\([a-z][A-Za-z]*\)(.*/\1/p' | grep -Ev '^(handle|getInstance)'); do  # its own steps
-    expect "CALL(SDCImpl, $operation, " trace/calls.inc "the facade's operation $operation"
+    sed -n 's/.* android::SDCImpl::\([a-z][A-Za-z]*\)(.*/\1/p' | grep -v -e '^handle' -e '^getInstance'); do  # its own steps
+    expect "(SDCImpl, $operation," trace/calls.inc "the facade's operation $operation"
 done
 
-for call in $(sed -n 's/^CALL(\([^,]*\), \([^,]*\), .*/\1.\2/p' trace/calls.inc); do
+for call in $(sed -n 's/^CALL(\([A-Za-z]*\), \([A-Za-z]*\), .*/\1.\2/p' trace/calls.inc); do
     expect "| \`$call\` |" docs/trace.md "the call $call"
+done
+for class in $(sed -n 's/^SINGLETON(\([A-Za-z]*\))/\1/p' trace/calls.inc); do
+    expect "    android::$class::*;" record/sensor-priv-record.map "the class $class, which hosts call"
 done
 
 strings() {
@@ -44,4 +50,27 @@ for property in $(strings '(persist|ro|service)\.[a-z._]+'); do
     suffix=${property#*.*.}
     expect "$suffix\`" docs/output.md "the property $property"
 done
+
+options=$("$3" --help | sed -n 's/^  \(-h,\)\{0,1\}\(--[a-z-]*\).*/\2/p')
+for option in $options; do
+    grep -qE -e "^\.It .*Fl -?${option#-}( |$)" docs/sensor-replay.1 || {
+        printf 'docs/sensor-replay.1: nothing about the option %s\n' "$option"
+        status=1
+    }
+done
+completed=$(grep -oE -e '--[a-z]+(-[a-z]+)*' packaging/sensor-replay.bash | sort -u)
+expected=$(printf '%s\n' "$options" | sort -u)
+[ "$completed" = "$expected" ] || {
+    printf 'packaging/sensor-replay.bash: has %s\nsensor-replay has %s\n' "$completed" "$expected"
+    status=1
+}
+for option in $(sed -n 's/^\.It.*Fl -\([a-z-]*\).*/--\1/p' docs/sensor-replay.1); do
+    printf '%s\n' "$options" | grep -qx -e "$option" || {
+        printf 'docs/sensor-replay.1: there is no option %s\n' "$option"
+        status=1
+    }
+done
+
+version=$("$3" --version)
+expect "## ${version#* }" CHANGELOG.md "the version ${version#* }"
 exit $status
