@@ -26,7 +26,7 @@ public:
         address.sun_family = AF_UNIX;
         path.copy(address.sun_path, sizeof(address.sun_path) - 1);
         // If this fails, so does all that is said.
-        connect(mSocket, reinterpret_cast<sockaddr*>(&address), sizeof(address));
+        static_cast<void>(connect(mSocket, reinterpret_cast<sockaddr*>(&address), sizeof(address)));
     }
     ~Client() { close(mSocket); }
     Client(const Client&) = delete;
