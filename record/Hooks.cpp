@@ -1,4 +1,5 @@
 #include <optional>
+#include <vector>
 
 #include <cutils/properties.h>
 #include <time.h>
@@ -60,40 +61,67 @@ namespace android {
 
 namespace {
 
-sp<MessageHandler> postTo(const sp<MessageHandler>& handler, int what, int delayMs) {
-    Run* const run = Run::current();
-    Recorder* const recorder = run != nullptr ? Recorder::getOnceStarted() : nullptr;
-    if (recorder == nullptr) return handler;
-    run->onCall();
-    return recorder->post(*run, handler, what, delayMs);
-}
+/** Posts by way of the recorder what the library posts in a run, other messages as they are. */
+class Posting {
+public:
+    Posting(const sp<MessageHandler>& handler, int what, int delayMs)
+          : mRun(Run::current()),
+            mReceiver(handler) {
+        Recorder* const recorder = mRun != nullptr ? Recorder::getOnceStarted() : nullptr;
+        if (recorder == nullptr) return;
+        mRun->onCall();
+        mReceiver = recorder->post(*mRun, handler, what, delayMs);
+        // The Looper sorts by time: calls of the same time get a nanosecond each.
+        mOrder = mRun->order;
+        mRun->now += mOrder;
+    }
+    ~Posting() {
+        if (mRun != nullptr) mRun->now -= mOrder;
+    }
+    Posting(const Posting&) = delete;
+    Posting& operator=(const Posting&) = delete;
 
-sp<MessageHandler> removeFrom(const sp<MessageHandler>& handler, std::optional<int> what) {
-    Recorder* const recorder = Recorder::getOnceStarted();
-    return recorder != nullptr ? recorder->remove(handler, what) : handler;
+    const sp<MessageHandler>& receiver() const { return mReceiver; }
+
+private:
+    Run* const mRun;
+    sp<MessageHandler> mReceiver;
+    int32_t mOrder = 0;
+};
+
+/** The handlers that the messages of `handler` may have been posted to. */
+std::vector<sp<MessageHandler>> receiversOf(const sp<MessageHandler>& handler,
+                                            std::optional<int> what) {
+    std::vector<sp<MessageHandler>> receivers;
+    if (Recorder* recorder = Recorder::getOnceStarted())
+        receivers = recorder->remove(handler, what);
+    receivers.push_back(handler);
+    return receivers;
 }
 
 }  // namespace
 
 void SensorHandlerThread::sendMessage(const sp<MessageHandler>& handler, int what) {
     static const auto next = record::real(&SensorHandlerThread::sendMessage);
-    next(this, postTo(handler, what, 0), what);
+    const Posting posting(handler, what, 0);
+    next(this, posting.receiver(), what);
 }
 
 void SensorHandlerThread::sendMessageDelayed(const sp<MessageHandler>& handler, int what,
                                              int delayMs) {
     static const auto next = record::real(&SensorHandlerThread::sendMessageDelayed);
-    next(this, postTo(handler, what, delayMs), what, delayMs);
+    const Posting posting(handler, what, delayMs);
+    next(this, posting.receiver(), what, delayMs);
 }
 
 void SensorHandlerThread::removeMessage(const sp<MessageHandler>& handler, int what) {
     static const auto next = record::real(&SensorHandlerThread::removeMessage);
-    next(this, removeFrom(handler, what), what);
+    for (const auto& receiver : receiversOf(handler, what)) next(this, receiver, what);
 }
 
 void SensorHandlerThread::removeAllMessages(const sp<MessageHandler>& handler) {
     static const auto next = record::real(&SensorHandlerThread::removeAllMessages);
-    next(this, removeFrom(handler, std::nullopt));
+    for (const auto& receiver : receiversOf(handler, std::nullopt)) next(this, receiver);
 }
 
 }  // namespace android

@@ -46,32 +46,50 @@ std::string date() {
     return text;
 }
 
+/**
+ * Calls often come in quick succession, and a replay cannot put one between two messages of the
+ * same moment. So the worker, which is late anyway, lets them pass first: it begins when none has
+ * come for this long, in microseconds, or after so many turns.
+ */
+constexpr int kQuietUs = 200;
+constexpr int kQuietTurns = 20;
+
 }  // namespace
 
 std::atomic<Recorder*> Recorder::sWriting{nullptr};
 std::atomic<Recorder*> Recorder::sStarted{nullptr};
 std::atomic<bool> Recorder::sWantsEvents{false};
 
-/** Tells the recorder when a message of the library's runs. */
+/** One message on its way; tells the recorder when it runs. */
 class Recorder::Courier : public android::MessageHandler {
 public:
-    Courier(Recorder* recorder, android::sp<android::MessageHandler> handler)
+    Courier(Recorder* recorder, Handler handler)
           : mRecorder(recorder),
-            mHandler(std::move(handler)) {}
+            mHandler(std::move(handler)),
+            mRun(this) {}
+
+    Run* run() { return &mRun; }
+
+    static Courier* of(Run* message) { return static_cast<MessageRun*>(message)->courier; }
 
     void handleMessage(const android::Message& message) override {
-        PlainRun run;
-        if (!mRecorder->beginMessage(&run, mHandler.get(), message.what)) return;
+        if (!mRecorder->beginMessage(&mRun)) return;
         {
-            const Run::Scope scope(&run);
+            const Run::Scope scope(&mRun);
             mHandler->handleMessage(message);
         }
-        mRecorder->end(&run);
+        mRecorder->end(&mRun);
     }
 
 private:
+    struct MessageRun final : public Run {
+        explicit MessageRun(Courier* owner) : courier(owner) {}
+        Courier* const courier;
+    };
+
     Recorder* const mRecorder;
-    const android::sp<android::MessageHandler> mHandler;
+    const Handler mHandler;
+    MessageRun mRun;
 };
 
 Recorder* Recorder::get() {
@@ -143,27 +161,35 @@ void Recorder::beginCall(Run* run, const Call& call) {
     if (call.isSample) appendAny(at, mScreen.take(call.rgb, call.rect));
     append(at, call.body);
     write();
-    run->now = at;
     run->clockStands = true;
+    mTimeline.beginCall(run);
     mRuns.begin(run);
 }
 
-bool Recorder::beginMessage(Run* run, const android::MessageHandler* handler, int what) {
+void Recorder::waitForQuiet(const Run& message) {
+    for (int turn = 0; turn < kQuietTurns && mParts.isOpen(); ++turn) {
+        const int64_t now = monotonicNow();
+        if (mTimeline.hasBegun(&message) || mTimeline.isQuiet(now, kQuietUs * 1000)) return;
+        mLock.unlock();
+        usleep(kQuietUs);
+        mLock.lock();
+    }
+}
+
+bool Recorder::beginMessage(Run* message) {
     const android::Mutex::Autolock lock(mLock);
-    if (!mParts.isOpen()) return true;
-    // A worker that had already taken the message out when the library took it back is late.
-    const std::optional<int64_t> now = mTimeline.start(handler, what);
-    if (!now) return false;
-    run->now = *now;
-    run->clockStands = true;
-    run->isMessage = true;
-    run->tellsMoment = true;
-    mRuns.begin(run);
+    std::vector<Run*> begun;
+    waitForQuiet(*message);
+    if (!mTimeline.start(message, &begun)) return false;
+    for (Run* run : begun) mRuns.begin(run);
+    message->clockStands = mParts.isOpen();
+    message->tellsMoment = true;
     return true;
 }
 
 void Recorder::end(Run* run) {
     const android::Mutex::Autolock lock(mLock);
+    if (run->isOrdered && !run->isMessage) mTimeline.endCall(*run, monotonicNow());
     appendAll(mRuns.end(run), run->now);
     write();
 }
@@ -202,23 +228,20 @@ void Recorder::expect(Run* run, std::string_view body) {
     write();
 }
 
-android::sp<android::MessageHandler> Recorder::post(
-        const Run& run, const android::sp<android::MessageHandler>& handler, int what,
-        int delayMs) {
+Recorder::Handler Recorder::post(const Run& run, const Handler& handler, int what, int delayMs) {
+    const android::sp<Courier> courier = new Courier(this, handler);
     const android::Mutex::Autolock lock(mLock);
-    android::sp<android::MessageHandler>& courier = mCouriers[handler.get()];
-    if (courier == nullptr) courier = new Courier(this, handler);
-    mTimeline.post(handler.get(), what, run.clockStands ? run.now : monotonicNow(), delayMs,
-                   run.isMessage);
+    mTimeline.post(courier->run(), handler.get(), what, delayMs, run);
     return courier;
 }
 
-android::sp<android::MessageHandler> Recorder::remove(
-        const android::sp<android::MessageHandler>& handler, std::optional<int> what) {
+std::vector<Recorder::Handler> Recorder::remove(const Handler& handler, std::optional<int> what) {
     const android::Mutex::Autolock lock(mLock);
-    mTimeline.remove(handler.get(), what);
-    const auto courier = mCouriers.find(handler.get());
-    return courier != mCouriers.end() ? courier->second : handler;
+    std::vector<Handler> couriers;
+    for (Run* message : mTimeline.remove(handler.get(), what)) {
+        couriers.emplace_back(Courier::of(message));
+    }
+    return couriers;
 }
 
 void Recorder::noteSingleton(const char* name) {

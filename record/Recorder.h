@@ -2,7 +2,6 @@
 
 #include <atomic>
 #include <cstdint>
-#include <map>
 #include <memory>
 #include <optional>
 #include <set>
@@ -36,6 +35,8 @@ namespace record {
  */
 class Recorder {
 public:
+    using Handler = android::sp<android::MessageHandler>;
+
     /** The process's recorder; null if nothing is recorded, or not any more. */
     static Recorder* get();
 
@@ -63,9 +64,6 @@ public:
     /** `run`, a call from outside, begins: its lines are written. */
     void beginCall(Run* run, const Call& call) EXCLUDES(mLock);
 
-    /** `run`, a message, begins. False if the library has taken it back meanwhile. */
-    bool beginMessage(Run* run, const android::MessageHandler* handler, int what) EXCLUDES(mLock);
-
     /** `run` ends. */
     void end(Run* run) EXCLUDES(mLock);
 
@@ -75,18 +73,16 @@ public:
     void expectProperty(Run* run, const char* name, const char* value) EXCLUDES(mLock);
 
     /**
-     * The library posts `what` in `run`. Returns the handler to post it to, which tells the
-     * recorder when the message runs.
+     * The library posts `what` in `run`. Returns the handler to post it to instead of `handler`,
+     * which tells the recorder when the message runs.
      */
-    android::sp<android::MessageHandler> post(const Run& run,
-                                              const android::sp<android::MessageHandler>& handler,
-                                              int what, int delayMs) EXCLUDES(mLock);
+    Handler post(const Run& run, const Handler& handler, int what, int delayMs) EXCLUDES(mLock);
 
     /**
-     * The library takes messages of `handler` back. Returns the handler that they were posted to.
+     * The library takes back every `what` of `handler`, or whatever `handler` has. Returns the
+     * handlers that these messages were posted to.
      */
-    android::sp<android::MessageHandler> remove(const android::sp<android::MessageHandler>& handler,
-                                                std::optional<int> what) EXCLUDES(mLock);
+    std::vector<Handler> remove(const Handler& handler, std::optional<int> what) EXCLUDES(mLock);
 
     /** The singleton that the call `name` creates is there. */
     void noteSingleton(const char* name) EXCLUDES(mLock);
@@ -101,6 +97,8 @@ private:
 
     static void start();
 
+    bool beginMessage(Run* message) EXCLUDES(mLock);
+    void waitForQuiet(const Run& message) REQUIRES(mLock);
     std::optional<std::string> begin(const std::string& folder, size_t bytes) EXCLUDES(mLock);
     void expect(Run* run, std::string_view body) EXCLUDES(mLock);
 
@@ -128,9 +126,6 @@ private:
     std::string mText GUARDED_BY(mLock);  // to be written
     std::vector<const char*> mSingletons GUARDED_BY(mLock);
     std::set<std::string> mProximityClients GUARDED_BY(mLock);
-    // By the library's handler.
-    std::map<const android::MessageHandler*, android::sp<android::MessageHandler>> mCouriers
-            GUARDED_BY(mLock);
 };
 
 }  // namespace record

@@ -54,7 +54,8 @@ public:
     virtual void onCall() {}
 
     // Touched by its own thread only.
-    int64_t now = 0;  // nanoseconds of the monotonic clock; valid once it has begun
+    int64_t now = 0;    // nanoseconds of the monotonic clock; valid once it has begun
+    int32_t order = 0;  // what is posted comes in the order of its runs, also at the same time
     bool clockStands = false;
     bool isMessage = false;
     bool tellsMoment = false;  // a line that leads to its moment is still to be written

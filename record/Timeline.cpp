@@ -6,21 +6,34 @@ namespace record {
 
 namespace {
 
-/** A message that is later than this is not waited for: its Looper may have ended. */
+/**
+ * The time does not stand still for longer than this: a call may block in the device's telemetry,
+ * a message's Looper may have ended.
+ */
 constexpr int64_t kPatienceNs = 10'000'000'000;
+
+/** The order of what messages post, behind all calls of the same time. */
+constexpr int32_t kLastOrder = 1000;
 
 }  // namespace
 
 int64_t Timeline::next(int64_t real) {
     int64_t at = real;
-    for (const Message& message : mPending) {
-        // What is due as it is posted runs after the lines of that very moment, other messages run
+    const auto comeBefore = [&](int64_t latest) {
+        if (real - latest < kPatienceNs) at = std::min(at, latest);
+    };
+    for (const int64_t call : mOpenCalls) comeBefore(call);
+    for (const Pending& pending : mPending) {
+        // What is due as it is posted runs after the lines of that very moment; other messages run
         // before those of the moment in which they are due.
-        const int64_t latest = std::max(message.due - 1, message.posted);
-        if (message.holds && real - latest < kPatienceNs) at = std::min(at, latest);
+        if (pending.isSeparate && !pending.isBegun) {
+            comeBefore(std::max(pending.due - 1, pending.posted));
+        }
     }
-    mFloor = mLast = std::max(at, mFloor);
-    return mLast;
+    at = std::max(at, mFloor);
+    mOrder = at == mLast ? std::min(mOrder + 1, kLastOrder - 1) : 0;
+    mFloor = mLast = at;
+    return at;
 }
 
 int64_t Timeline::tell(int64_t now) {
@@ -29,39 +42,71 @@ int64_t Timeline::tell(int64_t now) {
     return mLast;
 }
 
-void Timeline::post(const android::MessageHandler* handler, int what, int64_t now, int delayMs,
-                    bool byMessage) {
-    const int64_t due = now + int64_t{std::max(delayMs, 0)} * 1'000'000;
-    // Nothing can come between a message and what it posts for its own moment.
-    mPending.push_back({handler, what, now, due, !byMessage || due > now});
+void Timeline::beginCall(Run* call) {
+    call->now = mLast;
+    call->order = mOrder;
+    mOpenCalls.push_back(call->now);
 }
 
-void Timeline::remove(const android::MessageHandler* handler, std::optional<int> what) {
-    mPending.erase(std::remove_if(mPending.begin(), mPending.end(),
-                                  [&](const Message& message) {
-                                      return message.handler == handler &&
-                                             (!what || message.what == *what);
-                                  }),
-                   mPending.end());
+void Timeline::endCall(const Run& call, int64_t real) {
+    mLastEnd = real;
+    const auto found = std::find(mOpenCalls.begin(), mOpenCalls.end(), call.now);
+    if (found != mOpenCalls.end()) mOpenCalls.erase(found);
 }
 
-std::optional<int64_t> Timeline::start(const android::MessageHandler* handler, int what) {
-    auto found = mPending.end();
-    for (auto it = mPending.begin(); it != mPending.end(); ++it) {
-        if (it->handler != handler || it->what != what) continue;
-        if (found == mPending.end() || it->due < found->due) found = it;
+bool Timeline::isQuiet(int64_t real, int64_t ns) const {
+    return mOpenCalls.empty() && real - mLastEnd >= ns;
+}
+
+void Timeline::post(Run* message, const android::MessageHandler* handler, int what, int delayMs,
+                    const Run& poster) {
+    const int64_t due = poster.now + int64_t{std::max(delayMs, 0)} * 1'000'000;
+    const bool isSeparate = !poster.isMessage || due > poster.now;
+    mPending.push_back({message, handler, what, poster.now, due, isSeparate, false});
+}
+
+std::vector<Run*> Timeline::remove(const android::MessageHandler* handler,
+                                   std::optional<int> what) {
+    std::vector<Run*> removed;
+    for (auto it = mPending.begin(); it != mPending.end();) {
+        if (it->handler == handler && (!what || it->what == *what) && !it->isBegun) {
+            removed.push_back(it->message);
+            it = mPending.erase(it);
+        } else {
+            ++it;
+        }
     }
-    if (found == mPending.end()) return std::nullopt;
+    return removed;
+}
+
+bool Timeline::hasBegun(const Run* message) const {
+    return std::any_of(mPending.begin(), mPending.end(), [&](const Pending& pending) {
+        return pending.message == message && pending.isBegun;
+    });
+}
+
+bool Timeline::start(Run* message, std::vector<Run*>* begun) {
+    const auto found = std::find_if(mPending.begin(), mPending.end(), [&](const Pending& pending) {
+        return pending.message == message;
+    });
+    if (found == mPending.end()) return false;
     const int64_t now = found->due;
-    bool lasts = found->due == found->posted;  // its moment has lines that come before it
-    mPending.erase(found);
-    for (Message& message : mPending) {
-        if (message.due > now) continue;
-        message.holds = false;  // of the same moment: nothing can come between them
-        lasts = true;
+    // A call of the same moment would come before what was posted in it.
+    bool lasts = found->due == found->posted;
+    if (!found->isBegun) begun->push_back(message);
+    found->isBegun = true;
+    for (Pending& pending : mPending) {
+        if (pending.due > now) continue;
+        if (!pending.isBegun) begun->push_back(pending.message);
+        lasts = lasts || pending.message != message;
+        pending.isBegun = true;
     }
+    message->now = now;
+    message->order = kLastOrder;
+    message->isMessage = true;
     mFloor = std::max(mFloor, lasts ? now + 1 : now);
-    return now;
+    mPending.erase(found);
+    return true;
 }
 
 }  // namespace record
