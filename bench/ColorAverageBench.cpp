@@ -110,6 +110,7 @@ void readLoop(benchmark::State& state) {
 void sizes(benchmark::internal::Benchmark* benchmark) {
     benchmark->ArgNames({"width", "height", "stride"});
     benchmark->Args({16, 16, 16});
+    benchmark->Args({16, 16, 32});
     benchmark->Args({64, 64, 64});
     benchmark->Args({200, 200, 200});
     benchmark->Args({200, 200, 256});

@@ -27,6 +27,8 @@ struct Walk {
     uint32_t count;   // of pixels; the divisor
 };
 
+#define ALWAYS_INLINE __attribute__((always_inline)) inline
+
 /** A vector register of that many bytes. Each 32-bit lane holds a pixel. */
 template <size_t Bytes>
 struct PixelVector {
@@ -35,63 +37,137 @@ struct PixelVector {
 
 /**
  * In each lane, `all` sums whole pixels and `redBlue` their even bytes. Each holds two 16-bit sums
- * side by side. The even bytes' sums are in `redBlue`, the odd bytes' sums in the difference.
- *  - A sum of 256 pixels fits 16 bits: 256 * 255 < 2^16.
- *  - The sum of alpha overflows at the lane's upper end and is lost.
- *  - Two registers of each keep a processor's adders busy.
+ * side by side. The even bytes' sums are in `redBlue`, the odd bytes' sums in the difference. The
+ * sum of alpha overflows at the lane's upper end and is lost.
  */
-template <size_t VectorBytes>
-__attribute__((always_inline)) inline void average(const Walk& walk, int32_t* rgb) {
-    using Vector = typename PixelVector<VectorBytes>::Type;
-    constexpr size_t kVectors = 2;
-    constexpr size_t kBlockSteps = kVectors * VectorBytes / kStepBytes;
-    constexpr size_t kMaxBlocks = 256;
+template <typename Vector>
+struct PixelSums {
+    static constexpr size_t kMaxVectors = 256;  // 256 * 255 < 2^16
 
-    Vector reds = {};
-    Vector greens = {};
-    Vector blues = {};
-    uint32_t red = 0;
-    uint32_t green = 0;
-    uint32_t blue = 0;
+    Vector all = {};
+    Vector redBlue = {};
+
+    ALWAYS_INLINE void add(const Vector& pixels) {
+        all += pixels;
+        redBlue += pixels & 0x00ff00ff;
+    }
+
+    ALWAYS_INLINE void addNext(const uint8_t** next) {
+        Vector pixels;
+        std::memcpy(&pixels, *next, sizeof(pixels));
+        *next += sizeof(pixels);
+        add(pixels);
+    }
+};
+
+/** The sums of each colour, in each lane. */
+template <typename Vector>
+struct ColorSums {
+    Vector red = {};
+    Vector green = {};
+    Vector blue = {};
+
+    /** Takes what `*sums` holds and leaves it empty. */
+    ALWAYS_INLINE void take(PixelSums<Vector>* sums) {
+        red += sums->redBlue & 0xffff;
+        green += (sums->all - sums->redBlue) >> 8 & 0xffff;
+        blue += sums->redBlue >> 16;
+        *sums = {};
+    }
+};
+
+template <typename Vector>
+ALWAYS_INLINE uint32_t total(const Vector& lanes) {
+    uint32_t sum = 0;
+    for (size_t lane = 0; lane < sizeof(lanes) / sizeof(sum); ++lane) sum += lanes[lane];
+    return sum;
+}
+
+/** From its element n on, this is a mask for the upper n lanes of a register with 8. */
+constexpr size_t kMaxLanes = 8;
+constexpr uint32_t kUpperLanes[2 * kMaxLanes] = {0,   0,   0,   0,   0,   0,   0,   0,
+                                                 ~0u, ~0u, ~0u, ~0u, ~0u, ~0u, ~0u, ~0u};
+
+/**
+ * Loads the last `count` steps of a row, from 1 to the number of lanes. The lanes below are 0.
+ * `end` lies behind the last step, whose fourth byte may lie outside the buffer. So the register
+ * ends with the third byte, and each lane begins with the byte before its step.
+ */
+template <typename Vector>
+ALWAYS_INLINE void loadLast(const uint8_t* end, size_t count, Vector* pixels) {
+    constexpr size_t kLanes = sizeof(Vector) / kStepBytes;
+    Vector mask;
+    std::memcpy(&mask, kUpperLanes + kMaxLanes - kLanes + count, sizeof(mask));
+    std::memcpy(pixels, end - 1 - sizeof(*pixels), sizeof(*pixels));
+    *pixels = *pixels >> 8 & mask;
+}
+
+/** Sums the rows of a walk. Two registers of each kind keep a processor's adders busy. */
+template <typename Vector>
+class RowSums {
+public:
+    ALWAYS_INLINE RowSums() {}  // not defaulted: g++ would clear all of it in memory, slowly
+
+    ALWAYS_INLINE void addRow(const uint8_t* next, size_t steps) {
+        const uint8_t* const end = next + steps * kStepBytes;
+        if (steps > kLanes) {
+            next = addVectors(next, (steps - 1) / kLanes);
+            Vector last;
+            loadLast(end, static_cast<size_t>(end - next) / kStepBytes, &last);
+            mSecond.add(last);
+            return;
+        }
+        for (; next < end; next += kStepBytes) {
+            for (size_t color = 0; color < 3; ++color) mShort[color] += next[color];
+        }
+    }
+
+    ALWAYS_INLINE void divide(uint32_t count, int32_t* rgb) {
+        takeSums();
+        rgb[0] = static_cast<int32_t>((total(mSums.red) + mShort[0]) / count);
+        rgb[1] = static_cast<int32_t>((total(mSums.green) + mShort[1]) / count);
+        rgb[2] = static_cast<int32_t>((total(mSums.blue) + mShort[2]) / count);
+    }
+
+private:
+    static constexpr size_t kLanes = sizeof(Vector) / kStepBytes;
+
+    /** Leaves room for one more in the second register. */
+    ALWAYS_INLINE const uint8_t* addVectors(const uint8_t* next, size_t vectors) {
+        while (vectors > 0) {
+            if (mRoom < 2) takeSums();
+            const size_t count = std::min(vectors, 2 * (mRoom - 1));
+            for (size_t pairs = count / 2; pairs > 0; --pairs) {
+                mFirst.addNext(&next);
+                mSecond.addNext(&next);
+            }
+            if (count % 2 != 0) mFirst.addNext(&next);
+            mRoom -= count / 2 + 1;
+            vectors -= count;
+        }
+        return next;
+    }
+
+    ALWAYS_INLINE void takeSums() {
+        mSums.take(&mFirst);
+        mSums.take(&mSecond);
+        mRoom = mFirst.kMaxVectors;
+    }
+
+    PixelSums<Vector> mFirst;
+    PixelSums<Vector> mSecond;
+    size_t mRoom = mFirst.kMaxVectors;  // for how many more in each
+    ColorSums<Vector> mSums;
+    uint32_t mShort[3] = {};  // of rows shorter than a register
+};
+
+template <size_t VectorBytes>
+ALWAYS_INLINE void average(const Walk& walk, int32_t* rgb) {
+    RowSums<typename PixelVector<VectorBytes>::Type> sums;
     for (size_t row = 0; row < walk.rows; ++row) {
-        const uint8_t* next = walk.base + row * walk.rowBytes;
-        // The last step belongs to no block: its fourth byte may lie outside the buffer.
-        size_t blocks = (walk.steps - 1) / kBlockSteps;
-        while (blocks > 0) {
-            Vector all[kVectors] = {};
-            Vector redBlue[kVectors] = {};
-            size_t count = std::min(blocks, kMaxBlocks);
-            blocks -= count;
-            for (; count > 0; --count) {
-                for (size_t i = 0; i < kVectors; ++i) {
-                    Vector pixels;
-                    std::memcpy(&pixels, next, sizeof(pixels));
-                    next += sizeof(pixels);
-                    all[i] += pixels;
-                    redBlue[i] += pixels & 0x00ff00ff;
-                }
-            }
-            for (size_t i = 0; i < kVectors; ++i) {
-                reds += redBlue[i] & 0xffff;
-                greens += (all[i] - redBlue[i]) >> 8 & 0xffff;
-                blues += redBlue[i] >> 16;
-            }
-        }
-        for (size_t rest = (walk.steps - 1) % kBlockSteps + 1; rest > 0; --rest) {
-            red += next[0];
-            green += next[1];
-            blue += next[2];
-            next += kStepBytes;
-        }
+        sums.addRow(walk.base + row * walk.rowBytes, walk.steps);
     }
-    for (size_t lane = 0; lane < VectorBytes / sizeof(uint32_t); ++lane) {
-        red += reds[lane];
-        green += greens[lane];
-        blue += blues[lane];
-    }
-    rgb[0] = static_cast<int32_t>(red / walk.count);
-    rgb[1] = static_cast<int32_t>(green / walk.count);
-    rgb[2] = static_cast<int32_t>(blue / walk.count);
+    sums.divide(walk.count, rgb);
 }
 
 #ifdef SENSOR_PRIV_AVX2

@@ -10,4 +10,4 @@ TEST_PACKAGES='clang-14 libclang-rt-14-dev clang-format-14 clang-tidy-14 libgtes
     llvm-14 g++-arm-linux-gnueabihf qemu-user'
 
 # To measure them.
-BENCH_PACKAGES='libbenchmark-dev'
+BENCH_PACKAGES='libbenchmark-dev jq'
