@@ -218,7 +218,9 @@ const char* bootName(BootKind kind) {
 
 NextBoot play(const Boot& boot, const trace::TraceLine* first, const Channels& channels,
               std::optional<Failure>* failure) {
-    return Player(channels, failure).play(boot, first);
+    const NextBoot next = Player(channels, failure).play(boot, first);
+    record(Record::Kind::kOver, {});
+    return next;
 }
 
 }  // namespace replay

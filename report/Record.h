@@ -19,6 +19,7 @@ struct Record {
         kResult,    // a call returned: its name, its result as JSON
         kCall,      // a call of the trace is about to be made: its line; `number` is the line's
         kCounters,  // the library's counters have changed: trace::Counters, as bytes
+        kOver,      // the process ends here
         kExpect,    // what the recorded device did: an entry; `number` is the line's
 
         // What a process leaves to the tool; no report gets these.

@@ -1,6 +1,7 @@
 #!/bin/sh
-# Plays examples with the tool and compares what it prints with the golden file beside each:
+# Plays examples with the tool and compares what it makes of them with the golden files beside each:
 #   golden.sh [--update] TOOL EXAMPLE...
+# NAME.golden is there for each example. NAME.summary, NAME.timeline and NAME.page are there for some.
 # With --update a golden file that differs is replaced, and named.
 set -eu
 update=
@@ -10,13 +11,32 @@ shift
 
 made=$(mktemp)
 trap 'rm -f "$made"' EXIT
-for example; do
-    golden="$example.golden"
-    "$tool" --json "$example" >"$made"
+
+# Compares what was made with golden file $1.
+compare() {
     if [ -z "$update" ]; then
-        diff "$golden" "$made"
-    elif ! cmp -s "$golden" "$made"; then
-        cat "$made" >"$golden"
-        printf 'wrote %s\n' "$golden"
+        diff "$1" "$made"
+    elif ! cmp -s "$1" "$made"; then
+        cat "$made" >"$1"
+        printf 'wrote %s\n' "$1"
+    fi
+}
+
+for example; do
+    cd "$(dirname "$example")"
+    name=$(basename "$example")
+    "$tool" --json "$name" >"$made"
+    compare "$name.golden"
+    if [ -f "$name.summary" ]; then
+        "$tool" "$name" | sed 's/, in [0-9.]* s\.$/, in ... s./' >"$made"  # the one line with real time
+        compare "$name.summary"
+    fi
+    if [ -f "$name.timeline" ]; then
+        "$tool" --timeline "$made" "$name" >/dev/null
+        compare "$name.timeline"
+    fi
+    if [ -f "$name.page" ]; then
+        "$tool" --page "$made" "$name" >/dev/null
+        compare "$name.page"
     fi
 done
