@@ -79,9 +79,7 @@ void DumpReader::startService(std::string_view name) {
     mDump.isCapture = true;
     mInLog = mInHistory = false;
     mTakesSensors = name == "sensorservice";
-    mService = mTakesSensors            ? Service::kSensors
-               : name == "batterystats" ? Service::kBattery
-                                        : Service::kOther;
+    mTakesHistory = name == "batterystats";
     mDump.registrations.end();
     if (!mTakesSensors) return;
     mDump.hasService = true;
@@ -95,7 +93,7 @@ void DumpReader::startService(std::string_view name) {
 
 void DumpReader::endService(std::string_view text) {
     const bool isSensors = text.find(" dumpsys sensorservice") != std::string_view::npos;
-    mService = Service::kNone;
+    mTakesHistory = true;
     if (!isSensors || !mTakesSensors) return;
     mDump.registrations.end();
     if (const auto stamp = valueOf(text, "ending at: "); stamp && mTakesFooter) {
@@ -129,7 +127,7 @@ void DumpReader::historyLine(std::string_view text, int64_t lineNumber) {
 void DumpReader::serviceLine(std::string_view text, int64_t lineNumber) {
     if (isFooter(text)) {
         endService(text);
-    } else if (mService != Service::kOther && startsWith(text, kHistory)) {
+    } else if (mTakesHistory && startsWith(text, kHistory)) {
         startHistory(text, lineNumber);
     } else if (mTakesSensors) {
         sensorLine(trimmed(text), lineNumber);

@@ -21,8 +21,6 @@ public:
     Dump finish();
 
 private:
-    enum class Service { kNone, kSensors, kBattery, kOther };
-
     void startReport(std::string_view text);
     void startService(std::string_view name);
     void endService(std::string_view text);
@@ -33,10 +31,13 @@ private:
     void sensorLine(std::string_view text, int64_t lineNumber);
 
     Dump mDump;
-    Service mService = Service::kNone;
-    bool mTakesSensors = true;  // a capture may hold nothing but the sensor service's text
-    bool mTakesFooter = true;   // of the service's text that counts
-    bool mInList = true;        // the list of sensors may come
+
+    // A capture may hold nothing but the text of a service, without a heading.
+    bool mTakesSensors = true;
+    bool mTakesHistory = true;
+
+    bool mTakesFooter = true;  // of the service's text that counts
+    bool mInList = true;       // the list of sensors may come
     bool mInLog = false;
     bool mInHistory = false;
     bool mIsDone = false;  // another report has begun
