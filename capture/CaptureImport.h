@@ -4,26 +4,41 @@
 #include <string_view>
 #include <vector>
 
+#include "capture/ImportedCapture.h"
+#include "capture/Source.h"
 #include "trace/LineReader.h"
 
 namespace capture {
 
-/** What became of a device capture. */
-struct ImportedCapture {
-    std::string trace;                  // JSON Lines, as sensor-replay reads them
-    std::vector<std::string> warnings;  // one line each
-    std::string error;                  // what is wrong, in one line; empty if nothing is
-};
-
 /**
- * Makes a trace of a device capture: the text of `dumpsys sensorservice`, or a bug report that
- * holds it, from `firstLine`, which `reader` has just returned, to the reader's end. `name` is the
- * file's name for warnings and errors.
+ * Makes a trace of a device's captures: the text of `dumpsys sensorservice`, or bug reports that
+ * hold it. Several captures of one device become one trace.
  *
  * The trace's clock starts at the midnight before the oldest registration. Each registration
- * becomes an enable or a disable; the calls that a host makes at its start and every hour stand
- * between them; it ends after the last day's reports.
+ * becomes an enable or a disable. Between them stand the calls that a host makes at its start,
+ * every hour, and when the display, the charger, the camera or a call changes, as far as the
+ * captures tell that. The trace ends after the last day's reports.
  */
+class CaptureImport {
+public:
+    /**
+     * Reads a capture from `firstLine`, which `reader` has just returned, to the reader's end.
+     * `name` is the file's name for warnings and errors. After an error nothing more is read.
+     * Beside others a capture without registrations is no error, but a warning.
+     */
+    void add(const std::string& name, std::string_view firstLine, trace::LineReader* reader);
+
+    /** The trace of all that was added. */
+    ImportedCapture finish();
+
+private:
+    std::vector<Source> mSources;
+    std::vector<std::string> mMissing;  // by capture without registrations: what is wrong
+    std::vector<std::string> mWarnings;
+    std::string mError;
+};
+
+/** Makes a trace of one capture. */
 ImportedCapture importCapture(const std::string& name, std::string_view firstLine,
                               trace::LineReader* reader);
 

@@ -57,11 +57,14 @@ FilePlayer::FilePlayer(const Options& options, Progress* progress)
 std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
     Device ownDevice;
     ownDevice.propertyFile = device->propertyFile;
-    std::string text;
+    report::Input input{file.name};
+    capture::ImportedCapture imported;
     const bool isCapture = file.isCapture();
     if (isCapture) {
-        if (auto failure = importTrace(&file, &text)) return failure;
-        const int fd = memoryFile(text);
+        if (auto failure = importTrace(&file, &imported)) return failure;
+        input.origin = &imported.origin;
+        input.warnings = imported.warnings;
+        const int fd = memoryFile(imported.trace);
         if (fd < 0) {
             return Failure{file.name + ": cannot keep the trace: " + std::strerror(errno),
                            trace::kStatusFailed};
@@ -69,7 +72,7 @@ std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
         file.lines = std::make_unique<trace::LineReader>(fd);
         file.first = file.lines->next();
     }
-    for (const auto& report : mReports) report->begin({file.name});
+    for (const auto& report : mReports) report->begin(input);
     trace::TraceReader reader(file.name, file.lines.get());
     trace::TraceLine first;
     mFailure.reset();
@@ -112,8 +115,9 @@ void FilePlayer::playTrace(trace::TraceReader* reader, Device* device,
 
 std::optional<Failure> FilePlayer::printTrace(InputFile file) {
     if (!file.isCapture()) return Failure{file.name + ": not a device capture"};
-    std::string text;
-    if (auto failure = importTrace(&file, &text)) return failure;
+    capture::ImportedCapture imported;
+    if (auto failure = importTrace(&file, &imported)) return failure;
+    const std::string& text = imported.trace;
     if (mPrintedTrace) {
         // The next device's clock starts at its first line's time.
         mOut.write(text.substr(0, text.find(',')) + ", \"boot\": \"device\"}\n");
@@ -124,14 +128,13 @@ std::optional<Failure> FilePlayer::printTrace(InputFile file) {
     return {};
 }
 
-std::optional<Failure> FilePlayer::importTrace(InputFile* file, std::string* trace) {
-    capture::ImportedCapture imported =
-            capture::importCapture(file->name, *file->first, file->lines.get());
-    if (!imported.error.empty()) return Failure{imported.error};
-    for (const std::string& warning : imported.warnings) {
+std::optional<Failure> FilePlayer::importTrace(InputFile* file,
+                                               capture::ImportedCapture* imported) {
+    *imported = capture::importCapture(file->name, *file->first, file->lines.get());
+    if (!imported->error.empty()) return Failure{imported->error};
+    for (const std::string& warning : imported->warnings) {
         std::fprintf(stderr, "%s\n", warning.c_str());
     }
-    *trace = std::move(imported.trace);
     return {};
 }
 

@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "capture/ImportedCapture.h"
 #include "replay/BootProcess.h"
 #include "replay/InputFile.h"
 #include "replay/Options.h"
@@ -32,7 +33,7 @@ public:
     std::optional<trace::Failure> printTrace(InputFile file);
 
 private:
-    std::optional<trace::Failure> importTrace(InputFile* file, std::string* trace);
+    std::optional<trace::Failure> importTrace(InputFile* file, capture::ImportedCapture* imported);
     void playTrace(trace::TraceReader* reader, Device* device, const trace::TraceLine& first);
 
     const Options& mOptions;

@@ -2,10 +2,12 @@
 
 #include <cerrno>
 #include <cstring>
+#include <utility>
 
 #include <fcntl.h>
 #include <unistd.h>
 
+#include "capture/TextSource.h"
 #include "trace/TraceLine.h"
 
 namespace replay {
@@ -17,13 +19,20 @@ bool InputFile::isCapture() const {
 std::optional<trace::Failure> open(const std::string& name, InputFile* file) {
     const int fd = name == "-" ? dup(STDIN_FILENO) : ::open(name.c_str(), O_RDONLY | O_CLOEXEC);
     if (fd < 0) return trace::Failure{name + ": cannot open: " + std::strerror(errno)};
+    capture::OpenedText opened = capture::openText(fd);
+    if (!opened.error.empty()) return trace::Failure{name + ": " + opened.error};
     file->name = name;
-    file->lines = std::make_unique<trace::LineReader>(fd);
+    file->lines = std::make_unique<trace::LineReader>(std::move(opened.text));
     do {
         file->first = file->lines->next();
     } while (file->first && trace::isSkipped(*file->first));
-    if (!file->lines->error()) return std::nullopt;
-    return trace::Failure{trace::at(name, file->lines->lineNumber()) + *file->lines->error()};
+    if (file->lines->error()) {
+        return trace::Failure{trace::at(name, file->lines->lineNumber()) + *file->lines->error()};
+    }
+    if (file->first && !opened.isPlain && !file->isCapture()) {
+        return trace::Failure{name + ": a trace must be plain UTF-8, not packed or UTF-16"};
+    }
+    return std::nullopt;
 }
 
 }  // namespace replay

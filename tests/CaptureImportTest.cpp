@@ -82,7 +82,7 @@ TEST_F(CaptureImportTest, FindsItsSectionInABugReportThatPassedThroughAChat) {
             "08:00:00 - 0x00000000 pid=1 uid=1 package=yes\n"
             "Maker's own line\n"
             "07:00:00 + 0x00000000 pid=1 uid=1 package=yes samplingPeriod=1us batchingPeriod=0us\n"
-            "\n"
+            "Maker's own heading:\n"
             "06:00:00 - 0x00000000 pid=1 uid=1 package=no\n"
             "--------- 0.003s was the duration of dumpsys sensorservice, ending at: now\n" +
             other;
@@ -129,7 +129,7 @@ TEST_F(CaptureImportTest, MakesTheCallsOfTheHostAroundTheRegistrations) {
 TEST_F(CaptureImportTest, PassesMidnightsAndWarnsOfAClockThatWasSetBack) {
     const Played played = import(kSensors +
                                  "Previous Registrations:\n"
-                                 "00:00:01 - 0x00000000 pid=1 uid=1 package=d\n"
+                                 "11:00:00 - 0x00000000 pid=1 uid=1 package=d\n"
                                  "12:00:00 - 0x00000000 pid=1 uid=1 package=c\n"
                                  "00:00:09 - 0x00000077 pid=1 uid=1 package=unknown\n"
                                  "12:00:10 - 0x00000000 pid=1 uid=1 package=b\n"

@@ -4,9 +4,9 @@
 #include <cerrno>
 #include <cstring>
 #include <new>
+#include <utility>
 
 #include <sys/mman.h>
-#include <unistd.h>
 
 namespace trace {
 
@@ -27,15 +27,16 @@ void* mapShared(size_t size) {
 
 }  // namespace
 
-LineReader::LineReader(int fd)
-      : mFd(fd),
+LineReader::LineReader(int fd) : LineReader(std::make_unique<FileSource>(fd)) {}
+
+LineReader::LineReader(std::unique_ptr<ByteSource> source)
+      : mSource(std::move(source)),
         mState(static_cast<State*>(mapShared(sizeof(State) + kCapacity + kPadding))) {
     if (mState == nullptr) throw std::bad_alloc();
 }
 
 LineReader::~LineReader() {
     munmap(mState, sizeof(State) + kCapacity + kPadding);
-    close(mFd);
 }
 
 std::optional<std::string_view> LineReader::next() {
@@ -81,12 +82,9 @@ bool LineReader::fill() {
         mError = kTooLong;
         return false;
     }
-    ssize_t count;
-    do {
-        count = read(mFd, buffer() + mState->end, kBlock);
-    } while (count < 0 && errno == EINTR);
+    const ssize_t count = mSource->read(buffer() + mState->end, kBlock);
     if (count < 0) {
-        mError = std::string("cannot read: ") + std::strerror(errno);
+        mError = mSource->error();
         return false;
     }
     mState->ended = count == 0;

@@ -2,16 +2,20 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
+
+#include "trace/ByteSource.h"
 
 namespace trace {
 
 /**
  * Reads a file, or a pipe, line by line and in blocks, in constant memory. Its state lives in
  * memory that forked processes share: a line read by one of them is read for all, so a process can
- * go on where an earlier one ended. Only one process may use it at a time.
+ * go on where an earlier one ended. Only one process may use it at a time. From a source of another
+ * kind only one process may read.
  */
 class LineReader {
 public:
@@ -23,6 +27,8 @@ public:
 
     /** Reads `fd` from where it stands; takes it over. Throws `std::bad_alloc`. */
     explicit LineReader(int fd);
+
+    explicit LineReader(std::unique_ptr<ByteSource> source);
     ~LineReader();
 
     LineReader(const LineReader&) = delete;
@@ -56,7 +62,7 @@ private:
     /** Reads another block behind the unread bytes; false on an error. */
     bool fill();
 
-    const int mFd;
+    const std::unique_ptr<ByteSource> mSource;
     State* const mState;  // shared, with the buffer behind it
     std::optional<std::string> mError;
 };

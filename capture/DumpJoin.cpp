@@ -1,0 +1,119 @@
+#include "capture/DumpJoin.h"
+
+#include <algorithm>
+#include <iterator>
+#include <utility>
+
+namespace capture {
+
+namespace {
+
+bool isSame(const DumpLine& a, const DumpLine& b) {
+    return isSameLine(a.registration, b.registration);
+}
+
+/** For each length of a start of the first `count` lines: the longest shorter start that ends it.
+ */
+std::vector<size_t> borders(const std::vector<DumpLine>& lines, size_t count) {
+    std::vector<size_t> border(count + 1, 0);
+    size_t length = 0;
+    for (size_t i = 1; i < count; ++i) {
+        while (length > 0 && !isSame(lines[i], lines[length])) length = border[length];
+        if (isSame(lines[i], lines[length])) ++length;
+        border[i + 1] = length;
+    }
+    return border;
+}
+
+}  // namespace
+
+void DumpJoin::add(std::vector<Registration> lines, std::optional<int64_t> taken) {
+    const size_t dump = mTaken.size();
+    mTaken.push_back(taken);
+    Piece piece;
+    piece.dumps.push_back({dump, lines.size() - 1});
+    for (Registration& line : lines) piece.lines.push_back({std::move(line), dump});
+    for (Match best = bestMatch(piece); best.length > 0; best = bestMatch(piece)) {
+        Piece other = std::move(mPieces[best.piece]);
+        mPieces.erase(mPieces.begin() + static_cast<ptrdiff_t>(best.piece));
+        piece = best.isOlder ? join(std::move(other), std::move(piece), best.at)
+                             : join(std::move(piece), std::move(other), best.at);
+    }
+    mPieces.push_back(std::move(piece));
+}
+
+JoinedLines DumpJoin::finish() {
+    sortPieces();
+    JoinedLines joined;
+    for (Piece& piece : mPieces) {
+        const size_t first = joined.lines.size();
+        if (first > 0) joined.gaps.push_back(first);
+        for (JoinedDump& dump : piece.dumps) joined.dumps.push_back({dump.dump, dump.last + first});
+        std::move(piece.lines.begin(), piece.lines.end(), std::back_inserter(joined.lines));
+    }
+    std::stable_sort(joined.dumps.begin(), joined.dumps.end(),
+                     [&](const JoinedDump& a, const JoinedDump& b) {
+                         return std::pair(a.last, mTaken[a.dump]) <
+                                std::pair(b.last, mTaken[b.dump]);
+                     });
+    return joined;
+}
+
+// Searches the newer one's lines in the older one (Knuth, Morris, Pratt). What counts is how many
+// of them end the older one, or else that it holds them all further inside.
+DumpJoin::Match DumpJoin::match(const Piece& older, const Piece& newer) {
+    const size_t count = std::min(newer.lines.size(), older.lines.size());
+    const std::vector<size_t> border = borders(newer.lines, count);
+    std::optional<size_t> inside;  // where they all are
+    size_t length = 0;
+    for (size_t i = 0; i < older.lines.size(); ++i) {
+        if (length == count) {
+            inside = i - count;
+            length = border[length];
+        }
+        while (length > 0 && !isSame(older.lines[i], newer.lines[length])) length = border[length];
+        if (isSame(older.lines[i], newer.lines[length])) ++length;
+    }
+    if (inside && length < count) return {count, 0, true, *inside};
+    return {length, 0, true, older.lines.size() - length};
+}
+
+DumpJoin::Piece DumpJoin::join(Piece older, Piece newer, size_t at) {
+    const size_t known = std::min(older.lines.size() - at, newer.lines.size());
+    std::move(newer.lines.begin() + static_cast<ptrdiff_t>(known), newer.lines.end(),
+              std::back_inserter(older.lines));
+    for (const JoinedDump& dump : newer.dumps) older.dumps.push_back({dump.dump, dump.last + at});
+    return older;
+}
+
+DumpJoin::Match DumpJoin::bestMatch(const Piece& piece) const {
+    Match best;
+    for (size_t i = 0; i < mPieces.size(); ++i) {
+        for (const bool isOlder : {true, false}) {
+            Match found = isOlder ? match(mPieces[i], piece) : match(piece, mPieces[i]);
+            if (found.length <= best.length) continue;
+            best = found;
+            best.piece = i;
+            best.isOlder = isOlder;
+        }
+    }
+    return best;
+}
+
+std::optional<int64_t> DumpJoin::takenOf(const Piece& piece) const {
+    std::optional<int64_t> taken;
+    for (const JoinedDump& dump : piece.dumps) taken = std::max(taken, mTaken[dump.dump]);
+    return taken;
+}
+
+void DumpJoin::sortPieces() {
+    const bool areDated = std::all_of(mTaken.begin(), mTaken.end(),
+                                      [](const auto& taken) { return taken.has_value(); });
+    const auto isBefore = [&](const Piece& a, const Piece& b) {
+        if (areDated) return takenOf(a) < takenOf(b);
+        return a.dumps.front().dump < b.dumps.front().dump;
+    };
+    std::stable_sort(mPieces.begin(), mPieces.end(), isBefore);
+}
+
+}  // namespace capture
