@@ -30,14 +30,16 @@ Use useOf(const std::vector<Source>& sources, const JoinedLines& joined) {
     return use;
 }
 
-void addFiles(const std::vector<Source>& sources, const JoinedLines& joined,
-              trace::Origin* origin) {
+/** Returns when the newest of them was taken. */
+std::optional<int64_t> addFiles(const std::vector<Source>& sources, const JoinedLines& joined,
+                                trace::Origin* origin) {
     std::optional<int64_t> taken;
     for (const JoinedDump& dump : joined.dumps) {
         origin->files.push_back(sources[dump.dump].name);
         taken = std::max(taken, sources[dump.dump].dump.taken());
     }
     if (taken) origin->taken = formatStamp(*taken);
+    return taken;
 }
 
 void addSensors(const std::vector<Source>& sources, const JoinedLines& joined,
@@ -73,9 +75,13 @@ std::vector<trace::Interval> knownFrom(int64_t start, const Dating& dating,
 trace::Origin originOf(const std::vector<Source>& sources, const JoinedLines& joined,
                        const Dating& dating, const StateStretches& states, int64_t start) {
     trace::Origin origin;
-    addFiles(sources, joined, &origin);
+    const auto taken = addFiles(sources, joined, &origin);
     origin.firstDay = dating.firstDay;
     origin.registrations = {dating.times.front(), dating.times.back()};
+    origin.knownTo = origin.registrations.to;
+    if (taken && dating.firstDay) {
+        origin.knownTo = std::max(origin.knownTo, dating.traceTime(*taken));
+    }
     const Use use = useOf(sources, joined);
     origin.registrationCount = use.lines;
     addSensors(sources, joined, &origin);

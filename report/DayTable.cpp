@@ -55,10 +55,10 @@ Table layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_
     Table table({{"App", Table::Column::kCut},
                  {"Sensor", Table::Column::kCut},
                  {"Held", Table::Column::kRight},
-                 {"Display on", Table::Column::kRight},
+                 {"Display", Table::Column::kRight},
                  {"Enables", Table::Column::kRight},
-                 {"Rate Hz", Table::Column::kRight},
-                 {"At the end"}},
+                 {"Hz", Table::Column::kRight},
+                 {""}},
                 limit);
     for (const DayUse& use : uses) {
         table.add({use.app, nameSensor(use.type, origin), formatDuration(use.held), share(use),

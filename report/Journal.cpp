@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <set>
 
+#include "report/OriginText.h"
 #include "report/Text.h"
 
 namespace report {
@@ -74,7 +75,7 @@ void Journal::noteState(std::vector<StateSpan>* spans, int32_t value, int64_t at
 
 void Journal::endBoot() {
     if (mBoot < 0) return;
-    mUsage.end(mAt);
+    mUsage.end(lastKnown(mInput, mAt));
     for (auto* spans : {&mDisplay, &mCharge}) {
         if (!spans->empty() && spans->back().boot == mBoot) spans->back().span.to = mAt;
     }

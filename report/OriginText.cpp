@@ -1,5 +1,7 @@
 #include "report/OriginText.h"
 
+#include <algorithm>
+
 #include "report/Text.h"
 #include "trace/TraceTime.h"
 
@@ -42,6 +44,11 @@ std::vector<std::string> describe(const Input& input) {
     }
     for (const std::string& warning : input.warnings) lines.push_back(safe(warning));
     return lines;
+}
+
+int64_t lastKnown(const Input& input, int64_t end) {
+    if (input.origin == nullptr) return end;
+    return std::min(end, input.origin->knownTo * trace::kNsPerMs);
 }
 
 std::string count(int64_t number, const std::string& noun) {

@@ -2,6 +2,7 @@
 
 #include <array>
 #include <cstddef>
+#include <cstring>
 #include <string_view>
 
 namespace report {
@@ -63,17 +64,18 @@ std::string nameType(int32_t type) {
 }
 
 std::string nameSensor(int32_t type, const trace::Origin* origin) {
+    const std::string word = nameType(type);
+    std::string names;
     if (origin != nullptr) {
         const auto found = origin->namesOfType.find(type);
-        if (found != origin->namesOfType.end() && !found->second.empty()) {
-            std::string names;
+        if (found != origin->namesOfType.end()) {
             for (const std::string& name : found->second) {
                 names += (names.empty() ? "" : " / ") + name;
             }
-            return names;
         }
     }
-    return nameType(type);
+    if (names.empty()) return word;
+    return strcasestr(names.c_str(), word.c_str()) != nullptr ? names : word + ": " + names;
 }
 
 }  // namespace report

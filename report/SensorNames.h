@@ -8,8 +8,8 @@
 namespace report {
 
 /**
- * The name of a sensor type: those that `origin`'s sensors of the type have; without any, the
- * platform's word for the type, or "type N". `origin` may be null.
+ * A sensor type by the names that `origin`'s sensors of the type have, behind the platform's word
+ * for it where they do not say it; without names, that word alone. `origin` may be null.
  */
 std::string nameSensor(int32_t type, const trace::Origin* origin);
 

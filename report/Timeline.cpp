@@ -6,6 +6,7 @@
 #include <string_view>
 #include <utility>
 
+#include "report/OriginText.h"
 #include "report/Payload.h"
 #include "report/SensorNames.h"
 #include "report/Text.h"
@@ -54,7 +55,7 @@ void Timeline::fail() {
 }
 
 void Timeline::begin(const Input& input) {
-    mOrigin = input.origin;
+    mInput = input;
     if (mEvents == nullptr) return;
     mEvents->add(kDevice);
     mEvents->add(kLibrary);
@@ -118,7 +119,7 @@ void Timeline::takeSlice(const Slice& slice) {
         arguments.emplace_back("display on in %",
                                std::to_string(*on * 100 / (slice.to - slice.from)));
     }
-    const std::string sensor = nameSensor(slice.type, mOrigin);
+    const std::string sensor = nameSensor(slice.type, mInput.origin);
     mEvents->slice({slice.app, true}, sensor, sensor, slice.from, slice.to, arguments);
 }
 
@@ -141,7 +142,7 @@ void Timeline::showStates(int64_t at) {
 
 void Timeline::endBoot() {
     if (mBoot.name.empty()) return;
-    mUsage.end(mAt);
+    mUsage.end(lastKnown(mInput, mAt));
     change("display", &mDisplay, "", mAt);
     change("charger", &mCharge, "", mAt);
     change("camera", &mCamera, "", mAt);

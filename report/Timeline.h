@@ -54,7 +54,7 @@ private:
     const std::string mPath;
     std::optional<trace::Failure> mFailure;
     std::unique_ptr<TraceEvents> mEvents;
-    const trace::Origin* mOrigin = nullptr;
+    Input mInput;
     CallReader mCalls;
     Usage mUsage;
     State mDisplay, mCharge, mCamera, mVoice, mBoot;

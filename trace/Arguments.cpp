@@ -75,12 +75,12 @@ struct ReadersOf<std::tuple<Types...>> {
                 readAlternative<Types>..., nullptr};
         return kReaders[index](json, at, argument);
     }
-    static constexpr Readers kReaders{sizeof...(Types), read};
+    static constexpr Readers kAll{sizeof...(Types), read};
 };
 
 constexpr Readers kCallReaders[] = {
 #define CALL(Class, operation, parameters) \
-    ReadersOf<typename ArgumentsOf<decltype(&android::Class::operation)>::type>::kReaders,
+    ReadersOf<typename ArgumentsOf<decltype(&android::Class::operation)>::type>::kAll,
 #define VARIABLE(name)
 #include "trace/calls.inc"
 #undef CALL

@@ -31,6 +31,7 @@ struct Origin {
     std::optional<int64_t> firstDay;   // of the trace's time 0, in days since 1970-01-01
     Interval registrations{};          // from the oldest to the newest, that one included
     int64_t registrationCount = 0;     // those in the trace
+    int64_t knownTo = 0;               // when the capture was taken, ms; or the newest registration
     std::vector<Sensor> sensors;       // in the order of the list
     std::vector<Interval> gaps;        // lines are missing here (merged captures)
 
