@@ -35,9 +35,7 @@ int memoryFile(const std::string& text) {
 
 }  // namespace
 
-FilePlayer::FilePlayer(const Options& options, Progress* progress)
-      : mOptions(options),
-        mProgress(progress) {
+FilePlayer::FilePlayer(const Options& options, Progress* progress) : mProgress(progress) {
     if (options.check) {
         mReports.push_back(std::make_unique<report::Check>(&mOut));
     } else if (options.json) {

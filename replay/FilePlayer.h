@@ -36,7 +36,6 @@ private:
     std::optional<trace::Failure> importTrace(InputFile* file, capture::ImportedCapture* imported);
     void playTrace(trace::TraceReader* reader, Device* device, const trace::TraceLine& first);
 
-    const Options& mOptions;
     Progress* const mProgress;
     size_t mPlayed = 0;  // files
     report::Stdout mOut;

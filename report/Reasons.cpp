@@ -45,8 +45,8 @@ enum Cause {
 constexpr const char* kTexts[] = {
         "still on at the daily report, so not in it, and wiped by its reset",
         "no daily report came after the use",
-        "time counts only at the rate that the sensor runs at, and another app asked for a faster "
-        "one",
+        ("time counts only at the rate that the sensor runs at, and another app asked for a faster "
+         "one"),
         "time at one rate counts for one app only, and another app had the same rate",
         "proximity is reported only for uses of more than 30 minutes, and not for system apps",
         "nobody watches the sensor",
