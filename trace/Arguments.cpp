@@ -71,9 +71,9 @@ struct ReadersOf;
 template <typename... Types>
 struct ReadersOf<std::tuple<Types...>> {
     static Error read(size_t index, element json, int64_t at, Argument* argument) {
-        constexpr std::array<Error (*)(element, int64_t, Argument*), sizeof...(Types) + 1> kReaders{
+        constexpr std::array<Error (*)(element, int64_t, Argument*), sizeof...(Types) + 1> kEach{
                 readAlternative<Types>..., nullptr};
-        return kReaders[index](json, at, argument);
+        return kEach[index](json, at, argument);
     }
     static constexpr Readers kAll{sizeof...(Types), read};
 };
