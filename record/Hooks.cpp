@@ -64,13 +64,13 @@ namespace {
 /** Posts by way of the recorder what the library posts in a run, other messages as they are. */
 class Posting {
 public:
-    Posting(const sp<MessageHandler>& handler, int what, int delayMs)
+    Posting(SensorHandlerThread* thread, const sp<MessageHandler>& handler, int what, int delayMs)
           : mRun(Run::current()),
             mReceiver(handler) {
         Recorder* const recorder = mRun != nullptr ? Recorder::getOnceStarted() : nullptr;
         if (recorder == nullptr) return;
         mRun->onCall();
-        mReceiver = recorder->post(*mRun, handler, what, delayMs);
+        mReceiver = recorder->post(*mRun, thread, handler, what, delayMs);
         // The Looper sorts by time: calls of the same time get a nanosecond each.
         mOrder = mRun->order;
         mRun->now += mOrder;
@@ -92,10 +92,12 @@ private:
 /** The handlers that the messages of `handler` may have been posted to. */
 std::vector<sp<MessageHandler>> receiversOf(const sp<MessageHandler>& handler,
                                             std::optional<int> what) {
-    std::vector<sp<MessageHandler>> receivers;
-    if (Recorder* recorder = Recorder::getOnceStarted())
-        receivers = recorder->remove(handler, what);
-    receivers.push_back(handler);
+    std::vector<sp<MessageHandler>> receivers{handler};
+    Recorder* const recorder = Recorder::getOnceStarted();
+    if (recorder == nullptr) return receivers;
+    for (const auto& courier : recorder->remove(Run::current(), handler, what)) {
+        receivers.push_back(courier);
+    }
     return receivers;
 }
 
@@ -103,14 +105,14 @@ std::vector<sp<MessageHandler>> receiversOf(const sp<MessageHandler>& handler,
 
 void SensorHandlerThread::sendMessage(const sp<MessageHandler>& handler, int what) {
     static const auto next = record::real(&SensorHandlerThread::sendMessage);
-    const Posting posting(handler, what, 0);
+    const Posting posting(this, handler, what, 0);
     next(this, posting.receiver(), what);
 }
 
 void SensorHandlerThread::sendMessageDelayed(const sp<MessageHandler>& handler, int what,
                                              int delayMs) {
     static const auto next = record::real(&SensorHandlerThread::sendMessageDelayed);
-    const Posting posting(handler, what, delayMs);
+    const Posting posting(this, handler, what, delayMs);
     next(this, posting.receiver(), what, delayMs);
 }
 

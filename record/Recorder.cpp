@@ -48,49 +48,19 @@ std::string date() {
 
 /**
  * Calls often come in quick succession, and a replay cannot put one between two messages of the
- * same moment. So the worker, which is late anyway, lets them pass first: it begins when none has
- * come for this long, in microseconds, or after so many turns.
+ * same moment. So the worker, which is late anyway, lets them pass: it begins when none has come
+ * for this long, in microseconds. It does not wait for more than so many turns of that; for calls
+ * that have begun and not ended, it waits for more.
  */
 constexpr int kQuietUs = 200;
 constexpr int kQuietTurns = 20;
+constexpr int kMostTurns = 250;
 
 }  // namespace
 
 std::atomic<Recorder*> Recorder::sWriting{nullptr};
 std::atomic<Recorder*> Recorder::sStarted{nullptr};
 std::atomic<bool> Recorder::sWantsEvents{false};
-
-/** One message on its way; tells the recorder when it runs. */
-class Recorder::Courier : public android::MessageHandler {
-public:
-    Courier(Recorder* recorder, Handler handler)
-          : mRecorder(recorder),
-            mHandler(std::move(handler)),
-            mRun(this) {}
-
-    Run* run() { return &mRun; }
-
-    static Courier* of(Run* message) { return static_cast<MessageRun*>(message)->courier; }
-
-    void handleMessage(const android::Message& message) override {
-        if (!mRecorder->beginMessage(&mRun)) return;
-        {
-            const Run::Scope scope(&mRun);
-            mHandler->handleMessage(message);
-        }
-        mRecorder->end(&mRun);
-    }
-
-private:
-    struct MessageRun final : public Run {
-        explicit MessageRun(Courier* owner) : courier(owner) {}
-        Courier* const courier;
-    };
-
-    Recorder* const mRecorder;
-    const Handler mHandler;
-    MessageRun mRun;
-};
 
 Recorder* Recorder::get() {
     static const bool started = (start(), true);
@@ -166,30 +136,36 @@ void Recorder::beginCall(Run* run, const Call& call) {
     mRuns.begin(run);
 }
 
+Timeline::Turn Recorder::beginMessage(Run* message) {
+    const android::Mutex::Autolock lock(mLock);
+    waitForQuiet(*message);
+    const Timeline::Turn turn = mTimeline.turnOf(*message);
+    if (turn != Timeline::Turn::kNow) return turn;
+    for (Run* run : mTimeline.start(message)) mRuns.begin(run);
+    message->clockStands = mParts.isOpen();
+    message->tellsMoment = true;
+    return turn;
+}
+
 void Recorder::waitForQuiet(const Run& message) {
-    for (int turn = 0; turn < kQuietTurns && mParts.isOpen(); ++turn) {
-        const int64_t now = monotonicNow();
-        if (mTimeline.hasBegun(&message) || mTimeline.isQuiet(now, kQuietUs * 1000)) return;
+    for (int turn = 0; turn < kMostTurns && mParts.isOpen(); ++turn) {
+        if (mTimeline.hasBegun(message) || mTimeline.isQuiet(monotonicNow(), kQuietUs * 1000)) {
+            return;
+        }
+        if (turn >= kQuietTurns && !mTimeline.hasOpenCalls()) return;
         mLock.unlock();
         usleep(kQuietUs);
         mLock.lock();
     }
 }
 
-bool Recorder::beginMessage(Run* message) {
-    const android::Mutex::Autolock lock(mLock);
-    std::vector<Run*> begun;
-    waitForQuiet(*message);
-    if (!mTimeline.start(message, &begun)) return false;
-    for (Run* run : begun) mRuns.begin(run);
-    message->clockStands = mParts.isOpen();
-    message->tellsMoment = true;
-    return true;
-}
-
 void Recorder::end(Run* run) {
     const android::Mutex::Autolock lock(mLock);
     if (run->isOrdered && !run->isMessage) mTimeline.endCall(*run, monotonicNow());
+    endRun(run);
+}
+
+void Recorder::endRun(Run* run) {
     appendAll(mRuns.end(run), run->now);
     write();
 }
@@ -228,18 +204,23 @@ void Recorder::expect(Run* run, std::string_view body) {
     write();
 }
 
-Recorder::Handler Recorder::post(const Run& run, const Handler& handler, int what, int delayMs) {
-    const android::sp<Courier> courier = new Courier(this, handler);
+android::sp<Courier> Recorder::post(const Run& run, android::SensorHandlerThread* thread,
+                                    const Courier::Handler& handler, int what, int delayMs) {
+    android::sp<Courier> courier = new Courier(this, thread, handler);
     const android::Mutex::Autolock lock(mLock);
-    mTimeline.post(courier->run(), handler.get(), what, delayMs, run);
+    if (mTimeline.post(courier->run(), handler.get(), what, delayMs, run)) {
+        mRuns.begin(courier->run());
+    }
     return courier;
 }
 
-std::vector<Recorder::Handler> Recorder::remove(const Handler& handler, std::optional<int> what) {
+std::vector<android::sp<Courier>> Recorder::remove(const Run* run, const Courier::Handler& handler,
+                                                   std::optional<int> what) {
     const android::Mutex::Autolock lock(mLock);
-    std::vector<Handler> couriers;
-    for (Run* message : mTimeline.remove(handler.get(), what)) {
+    std::vector<android::sp<Courier>> couriers;
+    for (Run* message : mTimeline.remove(handler.get(), what, run)) {
         couriers.emplace_back(Courier::of(message));
+        endRun(message);
     }
     return couriers;
 }

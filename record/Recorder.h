@@ -14,6 +14,7 @@
 #include <utils/Mutex.h>
 #include <utils/StrongPointer.h>
 
+#include "record/Courier.h"
 #include "record/Names.h"
 #include "record/Parts.h"
 #include "record/Run.h"
@@ -35,8 +36,6 @@ namespace record {
  */
 class Recorder {
 public:
-    using Handler = android::sp<android::MessageHandler>;
-
     /** The process's recorder; null if nothing is recorded, or not any more. */
     static Recorder* get();
 
@@ -73,16 +72,22 @@ public:
     void expectProperty(Run* run, const char* name, const char* value) EXCLUDES(mLock);
 
     /**
-     * The library posts `what` in `run`. Returns the handler to post it to instead of `handler`,
-     * which tells the recorder when the message runs.
+     * The library posts `what` to `handler` on `thread`, in `run`. Returns the handler to post it
+     * to instead.
      */
-    Handler post(const Run& run, const Handler& handler, int what, int delayMs) EXCLUDES(mLock);
+    android::sp<Courier> post(const Run& run, android::SensorHandlerThread* thread,
+                              const Courier::Handler& handler, int what, int delayMs)
+            EXCLUDES(mLock);
 
     /**
-     * The library takes back every `what` of `handler`, or whatever `handler` has. Returns the
-     * handlers that these messages were posted to.
+     * The library takes back every `what` of `handler`, or whatever `handler` has, in `run`, which
+     * is null if it is not known. Returns the handlers that these messages were posted to.
      */
-    std::vector<Handler> remove(const Handler& handler, std::optional<int> what) EXCLUDES(mLock);
+    std::vector<android::sp<Courier>> remove(const Run* run, const Courier::Handler& handler,
+                                             std::optional<int> what) EXCLUDES(mLock);
+
+    /** The worker thread comes to a message. It runs if it is its turn. */
+    Timeline::Turn beginMessage(Run* message) EXCLUDES(mLock);
 
     /** The singleton that the call `name` creates is there. */
     void noteSingleton(const char* name) EXCLUDES(mLock);
@@ -91,13 +96,10 @@ public:
     void noteProximity(bool enabled, const std::string& client) EXCLUDES(mLock);
 
 private:
-    class Courier;
-
     explicit Recorder(std::unique_ptr<Names> names) : mNames(std::move(names)) {}
 
     static void start();
 
-    bool beginMessage(Run* message) EXCLUDES(mLock);
     void waitForQuiet(const Run& message) REQUIRES(mLock);
     std::optional<std::string> begin(const std::string& folder, size_t bytes) EXCLUDES(mLock);
     void expect(Run* run, std::string_view body) EXCLUDES(mLock);
@@ -108,6 +110,7 @@ private:
     void appendAll(std::string_view bodies, int64_t now) REQUIRES(mLock);
     void appendStart(int64_t at) REQUIRES(mLock);
     void startPart(int64_t at) REQUIRES(mLock);
+    void endRun(Run* run) REQUIRES(mLock);
     void write() REQUIRES(mLock);
     void stop(const std::string& error) REQUIRES(mLock);
 

@@ -6,6 +6,8 @@ namespace record {
 
 namespace {
 
+constexpr int64_t kNsPerMs = 1'000'000;
+
 /**
  * The time does not stand still for longer than this: a call may block in the device's telemetry,
  * a message's Looper may have ended.
@@ -19,17 +21,13 @@ constexpr int32_t kLastOrder = 1000;
 
 int64_t Timeline::next(int64_t real) {
     int64_t at = real;
-    const auto comeBefore = [&](int64_t latest) {
+    const auto comeBy = [&](int64_t latest) {
         if (real - latest < kPatienceNs) at = std::min(at, latest);
     };
-    for (const int64_t call : mOpenCalls) comeBefore(call);
-    for (const Pending& pending : mPending) {
-        // What is due as it is posted runs after the lines of that very moment; other messages run
-        // before those of the moment in which they are due.
-        if (pending.isSeparate && !pending.isBegun) {
-            comeBefore(std::max(pending.due - 1, pending.posted));
-        }
-    }
+    for (const int64_t call : mOpenCalls) comeBy(call);
+    // A call comes before the messages that calls of the same time have posted for that time, but
+    // after those that have become due.
+    if (const auto moment = nextMoment()) comeBy(std::max(*moment - 1, mWait));
     at = std::max(at, mFloor);
     mOrder = at == mLast ? std::min(mOrder + 1, kLastOrder - 1) : 0;
     mFloor = mLast = at;
@@ -58,18 +56,24 @@ bool Timeline::isQuiet(int64_t real, int64_t ns) const {
     return mOpenCalls.empty() && real - mLastEnd >= ns;
 }
 
-void Timeline::post(Run* message, const android::MessageHandler* handler, int what, int delayMs,
+bool Timeline::post(Run* message, const android::MessageHandler* handler, int what, int delayMs,
                     const Run& poster) {
-    const int64_t due = poster.now + int64_t{std::max(delayMs, 0)} * 1'000'000;
-    const bool isSeparate = !poster.isMessage || due > poster.now;
-    mPending.push_back({message, handler, what, poster.now, due, isSeparate, false});
+    const int64_t due = poster.now + std::max(delayMs, 0) * kNsPerMs;
+    mWait = std::max(mWait, poster.now);
+    const bool hasBegun = poster.isMessage && due <= mWait;
+    mPending.push_back({message, handler, what, due, poster.order, hasBegun});
+    if (hasBegun) message->now = mWait;
+    return hasBegun;
 }
 
-std::vector<Run*> Timeline::remove(const android::MessageHandler* handler,
-                                   std::optional<int> what) {
+std::vector<Run*> Timeline::remove(const android::MessageHandler* handler, std::optional<int> what,
+                                   const Run* remover) {
+    if (remover != nullptr) mWait = std::max(mWait, remover->now);
+    const bool isCall = remover != nullptr && !remover->isMessage;
     std::vector<Run*> removed;
     for (auto it = mPending.begin(); it != mPending.end();) {
-        if (it->handler == handler && (!what || it->what == *what) && !it->isBegun) {
+        const bool matches = it->handler == handler && (!what || it->what == *what);
+        if (matches && !(it->hasBegun && isCall)) {
             removed.push_back(it->message);
             it = mPending.erase(it);
         } else {
@@ -79,34 +83,62 @@ std::vector<Run*> Timeline::remove(const android::MessageHandler* handler,
     return removed;
 }
 
-bool Timeline::hasBegun(const Run* message) const {
-    return std::any_of(mPending.begin(), mPending.end(), [&](const Pending& pending) {
-        return pending.message == message && pending.isBegun;
-    });
+Timeline::Turn Timeline::turnOf(const Run& message) const {
+    const Pending* pending = find(message);
+    if (pending == nullptr) return Turn::kNever;
+    if (pending->hasBegun) return Turn::kNow;
+    const bool isFirst =
+            std::none_of(mPending.begin(), mPending.end(),
+                         [pending](const Pending& other) { return other.comesBefore(*pending); });
+    return isFirst ? Turn::kNow : Turn::kLater;
 }
 
-bool Timeline::start(Run* message, std::vector<Run*>* begun) {
-    const auto found = std::find_if(mPending.begin(), mPending.end(), [&](const Pending& pending) {
-        return pending.message == message;
-    });
-    if (found == mPending.end()) return false;
-    const int64_t now = found->due;
-    // A call of the same moment would come before what was posted in it.
-    bool lasts = found->due == found->posted;
-    if (!found->isBegun) begun->push_back(message);
-    found->isBegun = true;
-    for (Pending& pending : mPending) {
-        if (pending.due > now) continue;
-        if (!pending.isBegun) begun->push_back(pending.message);
-        lasts = lasts || pending.message != message;
-        pending.isBegun = true;
+bool Timeline::hasBegun(const Run& message) const {
+    const Pending* pending = find(message);
+    return pending != nullptr && pending->hasBegun;
+}
+
+std::vector<Run*> Timeline::start(Run* message) {
+    std::vector<Run*> begun;
+    if (!hasBegun(*message)) {
+        const int64_t moment = nextMoment().value_or(mWait);
+        // A call at the very moment would come before what was posted at it.
+        bool isOver = moment == mWait;
+        std::vector<const Pending*> reached;
+        for (Pending& pending : mPending) {
+            if (pending.hasBegun || pending.due > moment) continue;
+            pending.hasBegun = true;
+            pending.message->now = moment;
+            reached.push_back(&pending);
+        }
+        std::stable_sort(reached.begin(), reached.end(),
+                         [](const Pending* a, const Pending* b) { return a->comesBefore(*b); });
+        for (const Pending* pending : reached) begun.push_back(pending->message);
+        isOver = isOver || begun.size() > 1;
+        mFloor = std::max(mFloor, isOver ? moment + 1 : moment);
+        mWait = moment;
     }
-    message->now = now;
     message->order = kLastOrder;
     message->isMessage = true;
-    mFloor = std::max(mFloor, lasts ? now + 1 : now);
-    mPending.erase(found);
-    return true;
+    mPending.erase(mPending.begin() + (find(*message) - mPending.data()));
+    return begun;
+}
+
+const Timeline::Pending* Timeline::find(const Run& message) const {
+    const auto found = std::find_if(mPending.begin(), mPending.end(), [&](const Pending& pending) {
+        return pending.message == &message;
+    });
+    return found != mPending.end() ? &*found : nullptr;
+}
+
+/** When the replay's worker runs the next message whose moment has not begun. */
+std::optional<int64_t> Timeline::nextMoment() const {
+    std::optional<int64_t> due;
+    for (const Pending& pending : mPending) {
+        if (!pending.hasBegun && (!due || pending.due < *due)) due = pending.due;
+    }
+    if (!due || *due <= mWait) return due ? std::optional(mWait) : due;
+    return mWait + (*due - mWait + kNsPerMs - 1) / kNsPerMs * kNsPerMs;
 }
 
 }  // namespace record

@@ -14,9 +14,13 @@ namespace record {
 
 /**
  * Gives calls and messages their times, so that a replay runs them in the order in which they ran
- * here. A replay runs a message in the very moment in which it is due, and all messages of a moment
- * at once; the device's worker thread is always a little late. A call that comes while a message is
- * late, or while another call lasts, is therefore dated back.
+ * here. A replay's worker thread is never late, this one always is a little: a call that comes
+ * while a message is late, or while another call lasts, is dated back. It also follows how the
+ * replay's Looper waits, in whole milliseconds: what comes after a message may be dated up to 1 ms
+ * ahead.
+ *
+ * A moment is a time at which the replay's worker runs messages, all of them that are due by then.
+ * Nothing can come between two messages of one moment.
  *
  * Times are nanoseconds of the monotonic clock. Not safe for threads by itself.
  */
@@ -35,46 +39,64 @@ public:
 
     /** Whether no call lasts, and the last one has ended `ns` before `real`. */
     bool isQuiet(int64_t real, int64_t ns) const;
+    bool hasOpenCalls() const { return !mOpenCalls.empty(); }
 
-    /** In the run `poster`, the library posts `message`, which is `what` to `handler`. */
-    void post(Run* message, const android::MessageHandler* handler, int what, int delayMs,
+    /**
+     * In the run `poster`, the library posts `message`, which is `what` to `handler`. Returns
+     * whether it is of the very moment that `poster` is in.
+     */
+    bool post(Run* message, const android::MessageHandler* handler, int what, int delayMs,
               const Run& poster);
 
     /**
-     * The library takes back every `what` of `handler`, or whatever `handler` has. Returns the
-     * messages that this reaches; it does not reach those that the worker has come to.
+     * In the run `remover`, null for one that is not known, the library takes back every `what` of
+     * `handler`, or whatever `handler` has. Returns the messages that this reaches: a call does not
+     * reach those whose moment has begun.
      */
-    std::vector<Run*> remove(const android::MessageHandler* handler, std::optional<int> what);
+    std::vector<Run*> remove(const android::MessageHandler* handler, std::optional<int> what,
+                             const Run* remover);
+
+    enum class Turn {
+        kNever,  // it has been taken back, though the worker had it in its hands already
+        kLater,  // others come first, though they were posted when the worker had it in its hands
+        kNow,
+    };
+
+    /** Whether it is the turn of `message`, which the worker is about to run. */
+    Turn turnOf(const Run& message) const;
+
+    /** Whether the moment of `message` has begun with another message. */
+    bool hasBegun(const Run& message) const;
 
     /**
-     * Whether the worker has come to the moment of `message` with another message. The two cannot
-     * be told apart in time.
+     * The worker runs `message`, whose turn it is. Returns the messages of the moment that begins
+     * with it, in their order; none if it had begun.
      */
-    bool hasBegun(const Run* message) const;
-
-    /**
-     * The worker runs `message`. False if it has been taken back: the worker had it in its hands
-     * already, but no earlier than the call that took it back. Otherwise the worker has come to all
-     * messages of that moment; `begun` gets those that it comes to now, in their order.
-     */
-    bool start(Run* message, std::vector<Run*>* begun);
+    std::vector<Run*> start(Run* message);
 
 private:
     struct Pending {
         Run* message;
         const android::MessageHandler* handler;
         int what;
-        int64_t posted;
         int64_t due;
-        bool isSeparate;  // calls can come between it and what has posted it
-        bool isBegun;     // the worker has come to its moment
+        int32_t order;  // of its poster among those of the same time
+        bool hasBegun;
+
+        bool comesBefore(const Pending& other) const {
+            return due != other.due ? due < other.due : order < other.order;
+        }
     };
+
+    const Pending* find(const Run& message) const;
+    std::optional<int64_t> nextMoment() const;
 
     std::vector<Pending> mPending;    // in the order of posting
     std::vector<int64_t> mOpenCalls;  // their times
     int64_t mLastEnd = 0;             // of a call, in real time
     int64_t mLast = 0;                // of the last line
     int64_t mFloor = 0;               // of the next call at least
+    int64_t mWait = 0;                // when the replay's worker began to wait
     int32_t mOrder = 0;               // of the last call among those of its time
 };
 
