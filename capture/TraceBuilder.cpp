@@ -27,6 +27,15 @@ std::vector<Registration> takeLines(Dump* dump) {
     return lines;
 }
 
+/** Only if all are dated; two dumps may have the same date. */
+void sortByDate(std::vector<Source>* sources) {
+    const auto isDated = [](const Source& source) { return latest(source.dump).has_value(); };
+    if (!std::all_of(sources->begin(), sources->end(), isDated)) return;
+    std::stable_sort(sources->begin(), sources->end(), [](const Source& a, const Source& b) {
+        return latest(a.dump) < latest(b.dump);
+    });
+}
+
 }  // namespace
 
 void TraceBuilder::build() {
@@ -38,6 +47,7 @@ void TraceBuilder::build() {
 }
 
 void TraceBuilder::joinDumps() {
+    sortByDate(&mSources);
     DumpJoin join;
     std::vector<std::optional<int64_t>> taken;
     for (Source& source : mSources) {

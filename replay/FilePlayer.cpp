@@ -8,7 +8,6 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include "capture/CaptureImport.h"
 #include "platform/PropertyService.h"
 #include "report/Check.h"
 #include "report/Lines.h"
@@ -39,7 +38,7 @@ FilePlayer::FilePlayer(const Options& options, Progress* progress) : mProgress(p
     if (options.check) {
         mReports.push_back(std::make_unique<report::Check>(&mOut));
     } else if (options.json) {
-        mReports.push_back(std::make_unique<report::JsonLines>(&mOut, options.files.size() > 1));
+        mReports.push_back(std::make_unique<report::JsonLines>(&mOut, options.inputs() > 1));
     } else if (options.log) {
         mReports.push_back(std::make_unique<report::LogLines>(&mOut));
     } else {
@@ -53,29 +52,45 @@ FilePlayer::FilePlayer(const Options& options, Progress* progress) : mProgress(p
 }
 
 std::optional<Failure> FilePlayer::play(InputFile file, Device* device) {
-    Device ownDevice;
-    ownDevice.propertyFile = device->propertyFile;
-    report::Input input{file.name};
-    capture::ImportedCapture imported;
-    const bool isCapture = file.isCapture();
-    if (isCapture) {
-        if (auto failure = importTrace(&file, &imported)) return failure;
-        input.origin = &imported.origin;
-        input.warnings = imported.warnings;
-        const int fd = memoryFile(imported.trace);
-        if (fd < 0) {
-            return Failure{file.name + ": cannot keep the trace: " + std::strerror(errno),
-                           trace::kStatusFailed};
-        }
-        file.lines = std::make_unique<trace::LineReader>(fd);
-        file.first = file.lines->next();
+    if (!file.isCapture()) return playLines(&file, {file.name}, device);
+    capture::CaptureImport import;
+    import.add(file.name, *file.first, file.lines.get());
+    return playCapture(file.name, import.finish(), *device);
+}
+
+std::optional<Failure> FilePlayer::playMerged(Device* device) {
+    capture::CaptureImport import;
+    if (auto failure = addAll(&import)) return failure;
+    const size_t others = mOptions.files.size() - 1;
+    const std::string name =
+            mOptions.files.front() + (others > 0 ? " and " + std::to_string(others) + " more" : "");
+    return playCapture(name, import.finish(), *device);
+}
+
+std::optional<Failure> FilePlayer::playCapture(const std::string& name,
+                                               const capture::ImportedCapture& imported,
+                                               const Device& device) {
+    if (auto failure = tell(imported)) return failure;
+    const int fd = memoryFile(imported.trace);
+    if (fd < 0) {
+        return Failure{name + ": cannot keep the trace: " + std::strerror(errno),
+                       trace::kStatusFailed};
     }
+    InputFile file{name, std::make_unique<trace::LineReader>(fd), {}};
+    file.first = file.lines->next();
+    Device ownDevice;
+    ownDevice.propertyFile = device.propertyFile;
+    return playLines(&file, {name, &imported.origin, imported.warnings}, &ownDevice);
+}
+
+std::optional<Failure> FilePlayer::playLines(InputFile* file, const report::Input& input,
+                                             Device* device) {
     for (const auto& report : mReports) report->begin(input);
-    trace::TraceReader reader(file.name, file.lines.get());
+    trace::TraceReader reader(file->name, file->lines.get());
     trace::TraceLine first;
     mFailure.reset();
-    if (file.first && reader.judge(*file.first, &first, &mFailure)) {
-        playTrace(&reader, isCapture ? &ownDevice : device, first);
+    if (file->first && reader.judge(*file->first, &first, &mFailure)) {
+        playTrace(&reader, device, first);
     }
     mProgress->clear();
     for (const auto& report : mReports) report->end(!mFailure);
@@ -112,9 +127,19 @@ void FilePlayer::playTrace(trace::TraceReader* reader, Device* device,
 }
 
 std::optional<Failure> FilePlayer::printTrace(InputFile file) {
-    if (!file.isCapture()) return Failure{file.name + ": not a device capture"};
-    capture::ImportedCapture imported;
-    if (auto failure = importTrace(&file, &imported)) return failure;
+    capture::CaptureImport import;
+    if (auto failure = add(&file, &import)) return failure;
+    return printCapture(import.finish());
+}
+
+std::optional<Failure> FilePlayer::printMerged() {
+    capture::CaptureImport import;
+    if (auto failure = addAll(&import)) return failure;
+    return printCapture(import.finish());
+}
+
+std::optional<Failure> FilePlayer::printCapture(const capture::ImportedCapture& imported) {
+    if (auto failure = tell(imported)) return failure;
     const std::string& text = imported.trace;
     if (mPrintedTrace) {
         // The next device's clock starts at its first line's time.
@@ -126,11 +151,24 @@ std::optional<Failure> FilePlayer::printTrace(InputFile file) {
     return {};
 }
 
-std::optional<Failure> FilePlayer::importTrace(InputFile* file,
-                                               capture::ImportedCapture* imported) {
-    *imported = capture::importCapture(file->name, *file->first, file->lines.get());
-    if (!imported->error.empty()) return Failure{imported->error};
-    for (const std::string& warning : imported->warnings) {
+std::optional<Failure> FilePlayer::add(InputFile* file, capture::CaptureImport* import) {
+    if (!file->isCapture()) return Failure{file->name + ": not a device capture"};
+    import->add(file->name, *file->first, file->lines.get());
+    return {};
+}
+
+std::optional<Failure> FilePlayer::addAll(capture::CaptureImport* import) {
+    for (const std::string& name : mOptions.files) {
+        InputFile file;
+        if (auto failure = open(name, &file)) return failure;
+        if (auto failure = add(&file, import)) return failure;
+    }
+    return {};
+}
+
+std::optional<Failure> FilePlayer::tell(const capture::ImportedCapture& imported) {
+    if (!imported.error.empty()) return Failure{imported.error};
+    for (const std::string& warning : imported.warnings) {
         std::fprintf(stderr, "%s\n", warning.c_str());
     }
     return {};

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "capture/ImportedCapture.h"
+#include "capture/CaptureImport.h"
 #include "replay/BootProcess.h"
 #include "replay/InputFile.h"
 #include "replay/Options.h"
@@ -29,11 +29,29 @@ public:
      */
     std::optional<trace::Failure> play(InputFile file, Device* device);
 
+    /** Plays all inputs as captures of one device, merged. */
+    std::optional<trace::Failure> playMerged(Device* device);
+
     /** Prints the trace that is made of the capture `file`. */
     std::optional<trace::Failure> printTrace(InputFile file);
 
+    /** Prints the trace that is made of all inputs, captures of one device. */
+    std::optional<trace::Failure> printMerged();
+
 private:
-    std::optional<trace::Failure> importTrace(InputFile* file, capture::ImportedCapture* imported);
+    std::optional<trace::Failure> playCapture(const std::string& name,
+                                              const capture::ImportedCapture& imported,
+                                              const Device& device);
+    std::optional<trace::Failure> playLines(InputFile* file, const report::Input& input,
+                                            Device* device);
+    std::optional<trace::Failure> printCapture(const capture::ImportedCapture& imported);
+
+    static std::optional<trace::Failure> add(InputFile* file, capture::CaptureImport* import);
+    std::optional<trace::Failure> addAll(capture::CaptureImport* import);
+
+    /** Tells of the warnings. Returns the error, if there is one. */
+    static std::optional<trace::Failure> tell(const capture::ImportedCapture& imported);
+
     void playTrace(trace::TraceReader* reader, Device* device, const trace::TraceLine& first);
 
     Progress* const mProgress;

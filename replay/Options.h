@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <vector>
@@ -16,9 +17,13 @@ struct Options {
     bool check = false;                     // compare with "expect" lines, print no lines
     std::optional<std::string> timeline;    // the file to write trace events to
     std::optional<std::string> page;        // the file to write an HTML page to
+    bool merge = false;                     // the files are captures of one device
     int jobs = 1;                           // captures that are played at once, at least 1
     std::optional<std::string> properties;  // the file that keeps them; in memory without
     std::vector<std::string> files;         // "-" is standard input
+
+    /** How many days are played or printed. */
+    size_t inputs() const { return merge ? 1 : files.size(); }
 };
 
 }  // namespace replay

@@ -31,7 +31,7 @@ int say(const std::optional<Failure>& failure) {
 /** Whether what appears on a terminal shows by itself how far the replay has come. */
 bool showsItself(const Options& options) {
     const bool asTheyCome =
-            options.json || options.log || options.printTrace || options.files.size() > 1;
+            options.json || options.log || options.printTrace || options.inputs() > 1;
     return asTheyCome && isatty(STDOUT_FILENO) != 0;
 }
 
@@ -40,26 +40,36 @@ class Replay {
 public:
     explicit Replay(const Options& options)
           : mOptions(options),
-            mProgress(options.files.size(), !showsItself(options)),
+            mProgress(options.inputs(), !showsItself(options)),
             mPlayer(options, &mProgress),
             mJobs(options.jobs, [this](size_t ended) { mProgress.show(ended, "", 0); }) {
         mDevice.propertyFile = options.properties;
     }
 
     int run() {
+        const std::string& first = mOptions.files.front();
+        if (mOptions.merge) return inMemory(first, [&] { return runMerged(); });
         for (const std::string& name : mOptions.files) {
-            int status = 0;
-            try {
-                status = runFile(name);
-            } catch (const std::bad_alloc&) {
-                status = say(Failure{name + ": not enough memory", trace::kStatusFailed});
-            }
-            if (status != 0) return status;
+            if (const int status = inMemory(name, [&] { return runFile(name); })) return status;
         }
         return mJobs.finish();
     }
 
 private:
+    /** What `work` with a file returns, or says, if there is not enough memory for it. */
+    template <typename Work>
+    static int inMemory(const std::string& name, Work work) {
+        try {
+            return work();
+        } catch (const std::bad_alloc&) {
+            return say(Failure{name + ": not enough memory", trace::kStatusFailed});
+        }
+    }
+
+    int runMerged() {
+        return say(mOptions.printTrace ? mPlayer.printMerged() : mPlayer.playMerged(&mDevice));
+    }
+
     int runFile(const std::string& name) {
         InputFile file;
         const auto failure = open(name, &file);

@@ -19,12 +19,14 @@ constexpr char kExamples[] = R"(Examples:
                                          make a trace of a capture, to read and to edit
   adb shell dumpsys sensorservice | sensor-replay -
                                          play the device on the desk
+  sensor-replay --merge morning.zip noon.zip evening.zip
+                                         one day of several bug reports of a device
   sensor-replay --properties device.db monday.jsonl tuesday.jsonl
                                          two days, a device boot between them, on stored counters
 
 Plays recorded days through libsensor-priv on a virtual clock: a trace (JSON Lines), or a device
-capture (the text of `dumpsys sensorservice`, or a bug report that holds it), which is recognised
-by its content.
+capture (the text of `dumpsys sensorservice`, or a bug report that holds it, also zipped, as gzip
+or as UTF-16), which is recognised by its content.
 )";
 
 constexpr char kStatuses[] = R"(Exit status:
@@ -53,6 +55,8 @@ int main(int argc, char** argv) {
             ->excludes(json)
             ->excludes(log)
             ->excludes(printTrace);
+    app.add_flag("--merge", options.merge,
+                 "make one day of several captures of one device, taken one after another");
     app.add_option("--jobs", options.jobs, "captures that are played at once (default: all cores)")
             ->type_name("N")
             ->check(CLI::PositiveNumber);
@@ -72,7 +76,7 @@ int main(int argc, char** argv) {
     try {
         app.parse(argc, argv);
         if (options.files.empty() && !listCalls) throw CLI::RequiredError("FILE");
-        if (options.files.size() > 1 && (options.timeline || options.page)) {
+        if (options.inputs() > 1 && (options.timeline || options.page)) {
             throw CLI::ValidationError(options.timeline ? "--timeline" : "--page",
                                        "takes one input");
         }
