@@ -34,7 +34,9 @@ int memoryFile(const std::string& text) {
 
 }  // namespace
 
-FilePlayer::FilePlayer(const Options& options, Progress* progress) : mProgress(progress) {
+FilePlayer::FilePlayer(const Options& options, Progress* progress)
+      : mOptions(options),
+        mProgress(progress) {
     if (options.check) {
         mReports.push_back(std::make_unique<report::Check>(&mOut));
     } else if (options.json) {

@@ -54,6 +54,7 @@ private:
 
     void playTrace(trace::TraceReader* reader, Device* device, const trace::TraceLine& first);
 
+    const Options& mOptions;
     Progress* const mProgress;
     size_t mPlayed = 0;  // files
     report::Stdout mOut;
