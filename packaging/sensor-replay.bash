@@ -5,8 +5,8 @@ _sensor_replay() {
     COMPREPLY=()
     [[ ${COMP_WORDS[COMP_CWORD - 1]} != --jobs ]] || return
     if [[ $word == -* ]]; then
-        local options='--help --version --log --json --all --print-trace --check --jobs --properties
-            --timeline --page --list-calls'
+        local options='--help --version --log --json --all --merge --print-trace --check --jobs
+            --properties --timeline --page --list-calls'
         mapfile -t COMPREPLY < <(compgen -W "$options" -- "$word")
     else
         compopt -o filenames
