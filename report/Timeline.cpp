@@ -135,7 +135,7 @@ void Timeline::showStates(int64_t at) {
     if (state.charge) change("charger", &mCharge, nameCharge(*state.charge), at);
     if (state.camera) change("camera", &mCamera, *state.camera ? "on" : "off", at);
     if (state.voice) {
-        change("voice mode", &mVoice, *state.voice == 0 ? "none" : std::to_string(*state.voice),
+        change("call", &mVoice, *state.voice == 0 ? "none" : std::to_string(*state.voice),
                at);
     }
 }
@@ -146,7 +146,7 @@ void Timeline::endBoot() {
     change("display", &mDisplay, "", mAt);
     change("charger", &mCharge, "", mAt);
     change("camera", &mCamera, "", mAt);
-    change("voice mode", &mVoice, "", mAt);
+    change("call", &mVoice, "", mAt);
     mEvents->slice(kDevice, "boots", mBoot.name, mBoot.since, mAt, {});
 }
 

@@ -15,7 +15,7 @@ namespace report {
 
 /**
  * The day as trace events, for a timeline viewer:
- *  - a process for the device: display, charger, camera, voice mode and boots;
+ *  - a process for the device: display, charger, camera, call and boots;
  *  - a process for the library: telemetry, resets, and its counters;
  *  - a process for each app, with a track for each sensor that it holds.
  *
