@@ -16,7 +16,7 @@ namespace {
 
 constexpr size_t kPixelBytes = 4;
 
-/** What the display is, but for a picture's pixels. */
+/** The display, without the pixels of a picture. */
 struct State {
     DisplaySize size = {1080, 2400};
     Color color = {};
@@ -29,10 +29,10 @@ std::optional<std::string> noMemory(const char* what, int error) {
     return std::string("no memory for ") + what + ": " + std::strerror(error);
 }
 
-/** A picture's pixels in memory that forked processes share, mapped as far as they are needed. */
+/** A picture's pixels, in memory that forked processes share. Maps only as much as is shown. */
 class Pixels {
 public:
-    /** Before this nothing can be shown. */
+    /** Makes the memory, which is empty. Returns false, with `errno`, if that fails. */
     bool create() {
         if (mFd < 0) mFd = memfd_create("display", MFD_CLOEXEC);
         return mFd >= 0;
@@ -40,7 +40,7 @@ public:
 
     std::optional<std::string> show(const std::vector<uint8_t>& pixels) {
         if (!create()) return noMemory("a picture", errno);
-        // Memory that is not there would otherwise show as a signal, when it is first touched.
+        // Reserved now: a lack of memory at the first touch would be a signal.
         if (const int error = posix_fallocate(mFd, 0, static_cast<off_t>(pixels.size()))) {
             return noMemory("a picture", error);
         }
@@ -52,6 +52,7 @@ public:
                        : noMemory("a picture", errno);
     }
 
+    /** Maps the first `bytes`. Returns false, with `errno`, if that fails. */
     bool map(size_t bytes) {
         if (bytes <= mMapped) return true;
         void* memory = mmap(nullptr, bytes, PROT_READ | PROT_WRITE, MAP_SHARED, mFd, 0);
@@ -70,11 +71,11 @@ private:
     size_t mMapped = 0;  // bytes
 };
 
-/** Never destroyed: a capture may read it until the process is gone. */
+/** Never destroyed: captures may read it until the process ends. */
 struct Display {
-    std::mutex mutex;  // orders this process's threads; guards the rest
+    std::mutex mutex;  // between this process's threads; guards the rest
     State own;
-    State* state = &own;  // or in memory that forked processes share
+    State* state = &own;  // `own`, or in memory that forked processes share
     Pixels pixels;
 
     bool map() {

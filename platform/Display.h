@@ -10,17 +10,16 @@
 #include "platform/Picture.h"
 
 /**
- * The device's internal display, behind the platform's capture calls. At first it is 1080 x 2400
- * pixels of black. It shows one colour, or a picture of its own size; all of it counts as secure
- * content.
+ * The device's internal display, behind the platform's capture calls. It shows one colour, or a
+ * picture of its own size. It starts black, with 1080 x 2400 pixels. All content counts as secure.
  *
- * It belongs to the device, not to a process: processes forked after `shareDisplay` see one
- * display, whichever of them changes it, but only one of them at a time may use it. Within a
+ * The display belongs to the device, not to a process. Processes forked after `shareDisplay` see
+ * one display, whichever of them changes it. Only one of them at a time may use it. Within a
  * process all functions may be called from any thread.
  */
 namespace platform {
 
-/** What keeps captures from succeeding. */
+/** What makes captures fail. */
 enum class DisplayFault {
     kNone,
     kToken,    // the display has no token
@@ -40,37 +39,41 @@ struct Color {
     uint8_t blue;
 };
 
-/** A change of the display; what has no value stays as it was. */
+/** A change of the display. What has no value stays as it was. */
 struct DisplayChange {
-    // Either of these two ends a picture, and the last colour comes back.
+    // Either of these ends a picture. The display then shows the last colour.
     std::optional<DisplaySize> size;
     std::optional<Color> color;
 
-    std::optional<Picture> picture;  // not with the former two; the display takes its size
+    // Not together with the two above. The display takes the picture's size.
+    std::optional<Picture> picture;
 
     std::optional<uint32_t> rowPadding;  // pixels behind each row of a captured buffer
     std::optional<DisplayFault> fault;
 };
 
 /**
- * Shares the display with the processes forked from here on. Returns nothing, or why it cannot be
- * shared: one line.
+ * Shares the display with the processes that are forked from now on. Returns nothing, or why that
+ * failed: one line.
  */
 std::optional<std::string> shareDisplay();
 
-/** Returns nothing, or why the picture cannot be shown: one line, and nothing has changed. */
+/**
+ * Changes the display. Returns nothing, or why the picture cannot be shown: one line. Nothing has
+ * changed then.
+ */
 std::optional<std::string> changeDisplay(const DisplayChange& change);
 
 DisplayFault displayFault();
 uint32_t displayRowPadding();
 
-/** Makes what the display shows readable here. Returns false if there is no memory for it. */
+/** Prepares `copyDisplay` for what the display shows now. Returns false if memory is lacking. */
 bool mapDisplay();
 
 /**
- * Copies the pixels of `area`, 4 bytes each as in `Picture`, into `pixels`, whose rows begin
- * `rowBytes` apart. What lies outside the display is left as it was, and so is
- * everything while the display cannot be mapped.
+ * Copies the pixels of `area` to `pixels`, 4 bytes each as in `Picture`, with `rowBytes` from one
+ * row's begin to the next. Leaves out what lies outside the display. Copies nothing where
+ * `mapDisplay` would fail.
  */
 void copyDisplay(const android::Rect& area, uint8_t* pixels, size_t rowBytes);
 

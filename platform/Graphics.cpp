@@ -37,13 +37,13 @@ namespace {
 
 class DisplayToken : public android::IBinder {};
 
-/** Never destroyed: whoever captures compares with it until the process is gone. */
+/** Never destroyed: captures compare with it until the process ends. */
 const sp<android::IBinder>& displayToken() {
     static auto* const instance = new sp<android::IBinder>(new DisplayToken);
     return *instance;
 }
 
-/** Whether the display would serve the request: it neither scales nor converts. */
+/** Whether the display serves the request. It neither scales nor converts. */
 status_t judge(const DisplayCaptureArgs& args) {
     if (args.displayToken == nullptr) return BAD_VALUE;
     if (args.displayToken != displayToken()) return NAME_NOT_FOUND;
@@ -60,8 +60,8 @@ status_t judge(const DisplayCaptureArgs& args) {
 }  // namespace
 
 /**
- * Completes captures, one after another, on a thread of its own, which waits for no clock. A
- * buffer's contents are only made after the listener was told: its fence says when they are there.
+ * Completes captures one after another, on a thread of its own. No step waits for a clock. The
+ * listener is told first; the buffer is filled afterwards, and then its fence signals.
  */
 class CaptureThread {
 public:
@@ -73,7 +73,7 @@ public:
         sp<android::IScreenCaptureListener> listener;
     };
 
-    /** Never destroyed: its thread sleeps on it until the process is gone. */
+    /** Never destroyed: its thread uses it until the process ends. */
     static CaptureThread& get() {
         static auto* const instance = new CaptureThread;
         return *instance;
@@ -116,7 +116,7 @@ private:
             request.listener->onScreenCaptureCompleted(results);
         }
         if (buffer != nullptr) fill(buffer.get(), request);
-        // Nothing of the capture is held any more when the one who waits goes on.
+        // Releases the capture before the waiting thread goes on.
         buffer = nullptr;
         request.listener = nullptr;
         const std::lock_guard lock(signal->mutex);
@@ -139,7 +139,7 @@ private:
         if (request.secure) copyDisplay(request.area, pixels, buffer->rowBytes());
         if (request.rowPadding == 0) return;
         for (size_t row = 0; row < buffer->getHeight(); ++row) {
-            // What nobody should look at is not black.
+            // White, so that a reader of the padding gets a wrong average.
             std::memset(pixels + row * buffer->rowBytes() + size_t{4} * buffer->getWidth(), 0xff,
                         size_t{4} * request.rowPadding);
         }

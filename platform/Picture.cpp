@@ -15,7 +15,7 @@ namespace platform {
 
 namespace {
 
-/** libpng's state for one file; what it complains about goes to `*error`. */
+/** libpng's state for one file. Errors go to `*error`. */
 class PngFile {
 public:
     PngFile(std::FILE* file, std::string* error)
@@ -29,7 +29,7 @@ public:
     PngFile(const PngFile&) = delete;
     PngFile& operator=(const PngFile&) = delete;
 
-    /** libpng leaves this by a jump back on an error: it may hold nothing to be destroyed. */
+    /** On an error libpng jumps back into this: it may hold no object with a destructor. */
     bool read(Picture* picture) {
         if (setjmp(png_jmpbuf(mPng)) != 0) return false;
         png_read_info(mPng, mInfo);
@@ -82,7 +82,7 @@ private:
 }  // namespace
 
 std::optional<std::string> readPng(const std::string& path, Picture* picture) {
-    // A pipe or a device is never opened for long enough to block, or to do what its driver does.
+    // Not even opened: a pipe would block, and a device may do something.
     struct stat status {};
     if (stat(path.c_str(), &status) == 0 && !S_ISREG(status.st_mode)) return "not a regular file";
     const int fd = open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);

@@ -7,11 +7,10 @@
 
 namespace platform {
 
-/** A picture's pixels row by row, 4 bytes each: red, green, blue, alpha. */
+/** Pixels row by row, 4 bytes each: red, green, blue, alpha. */
 struct Picture {
-    /** Largest side and largest area, in pixels. */
-    static constexpr uint32_t kMaxSide = 16384;
-    static constexpr uint64_t kMaxPixels = 64'000'000;
+    static constexpr uint32_t kMaxSide = 16384;         // pixels
+    static constexpr uint64_t kMaxPixels = 64'000'000;  // that is 256 MB
 
     uint32_t width = 0;
     uint32_t height = 0;
@@ -19,9 +18,13 @@ struct Picture {
 };
 
 /**
- * Reads the PNG file `path` into `*picture`. Its pixels are taken as they are stored: no gamma, no
- * colour profile, and alpha (opaque, if there is none) not multiplied in; deeper samples are scaled
- * to 8 bits. Returns nothing, or what is wrong with the file; `*picture` is then not to be used.
+ * Reads the PNG file `path` into `*picture`. Every PNG format is taken:
+ *  - Samples keep their stored values. Gamma and colour profiles are ignored.
+ *  - Samples of other depths are scaled to 8 bits.
+ *  - Alpha is not multiplied in. Pixels without alpha are opaque.
+ *
+ * Refuses what is no regular file, and pictures beyond the limits above. Returns nothing, or what
+ * is wrong; `*picture` is then not to be used. Throws `std::bad_alloc`.
  */
 std::optional<std::string> readPng(const std::string& path, Picture* picture);
 

@@ -12,17 +12,17 @@
 
 namespace {
 
-/** What the device's property service reads of a name from its socket at most. */
+/** The longest name that the device's property service reads from its socket. */
 constexpr size_t kMaxName = 0xffff;
 
-/** Longest value, without its NUL. */
+/** The longest value, without its NUL. */
 constexpr size_t kMaxValue = PROP_VALUE_MAX - 1;
 
 bool startsWith(std::string_view text, std::string_view prefix) {
     return text.substr(0, prefix.size()) == prefix;
 }
 
-/** Never destroyed: the library's worker may write until the process is gone. */
+/** Never destroyed: the library's worker may set properties until the process ends. */
 struct Service {
     std::mutex mutex;
     std::unique_ptr<platform::PropertyStore> store = std::make_unique<platform::PropertyStore>();
@@ -35,7 +35,7 @@ struct Service {
     }
 };
 
-/** How `property_set` differs from a write by the rest of the device. */
+/** `property_set` under the mutex: unlike the rest of the device, it sets an `ro.*` once. */
 int setFromLibrary(Service& service, std::string_view name, std::string_view value) {
     const std::lock_guard lock(service.mutex);
     if (platform::refuseProperty(name, value)) return -1;

@@ -7,11 +7,13 @@
 #include <sqlite3.h>
 #include <sys/system_properties.h>
 
+#include "platform/StoreFormat.h"
+
 namespace platform {
 
 namespace {
 
-/** How long a process waits for others at a file. */
+/** How long a process waits for others that use the file. */
 constexpr int kBusyMs = 10'000;
 
 }  // namespace
@@ -25,10 +27,9 @@ PropertyStore::PropertyStore(std::shared_ptr<const StoreFile> file, const std::s
       : mFile(std::move(file)) {
     check(sqlite3_open_v2(path.c_str(), &mDb, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE, nullptr));
     sqlite3_busy_timeout(mDb, kBusyMs);
-    // SQLite falls back to reading only, and would leave a log beside such a file.
+    // SQLite opens a file that cannot be written for reading, and would leave a log beside it.
     if (sqlite3_db_readonly(mDb, "main") == 1) check(SQLITE_READONLY);
-    // The kernel keeps what a killed process has written, so nothing has to be synced: only a power
-    // cut could lose a write.
+    // No sync: the kernel keeps what a killed process has written. Only a power cut loses writes.
     run("PRAGMA synchronous = OFF");
     prepareFormat();
     switchToLog();
@@ -100,9 +101,8 @@ void PropertyStore::restore(const std::vector<unsigned char>& bytes) {
 }
 
 /**
- * Makes a store of an empty database and marks one of an earlier build, before the switch to the
- * log: then the file itself is marked, whatever becomes of its log. Tells whether it can be
- * written.
+ * Comes before the switch to the log, so that a new store's mark is in the file itself, whatever
+ * becomes of the log. Also finds out whether the file can be written.
  */
 void PropertyStore::prepareFormat() {
     run("BEGIN IMMEDIATE");
@@ -110,16 +110,19 @@ void PropertyStore::prepareFormat() {
     int status = SQLITE_OK;
     const StoreFormat format = formatOf(mDb, &status);
     check(status);
-    if (const auto refusal = refuseFormat(format)) fail(*refusal);
+    if (const auto refusal = refuseFormat(format)) {
+        fail(*refusal);
+        // The log that told of it stays as it is, too.
+        sqlite3_db_config(mDb, SQLITE_DBCONFIG_NO_CKPT_ON_CLOSE, 1, nullptr);
+    }
     checkPages();
-    if (format == StoreFormat::kEmpty) run(kStoreSchema);
-    if (format != StoreFormat::kCurrent) run(kStoreMarks);
+    run(sqlToCurrent(format).c_str());
     run("COMMIT");
 }
 
 /**
- * A write-ahead log makes each write one append. The switch does not wait by itself while another
- * process does the same.
+ * With a write-ahead log each write is one append. The busy timeout does not cover this switch: it
+ * fails at once while another process makes it too.
  */
 void PropertyStore::switchToLog() {
     int status = mError ? SQLITE_OK : SQLITE_BUSY;
@@ -130,7 +133,7 @@ void PropertyStore::switchToLog() {
     check(status);
 }
 
-/** A damaged page would otherwise show only when it is read. */
+/** Without this, a damaged page would show only when it is read. */
 void PropertyStore::checkPages() {
     sqlite3_stmt* statement = prepare("PRAGMA quick_check(1)");
     if (mError) return;
@@ -144,19 +147,19 @@ void PropertyStore::checkPages() {
     sqlite3_finalize(statement);
 }
 
-/** Does nothing after a failure. */
+/** Does nothing if something has failed before. */
 void PropertyStore::run(const char* sql) {
     if (!mError) check(sqlite3_exec(mDb, sql, nullptr, nullptr, nullptr));
 }
 
-/** Null after a failure. */
+/** Returns null if something has failed before. */
 sqlite3_stmt* PropertyStore::prepare(const char* sql) {
     sqlite3_stmt* statement = nullptr;
     if (!mError) check(sqlite3_prepare_v2(mDb, sql, -1, &statement, nullptr));
     return statement;
 }
 
-/** `text` must stay as it is until the statement is reset. */
+/** `text` must stay valid until the statement is reset. */
 void PropertyStore::bind(sqlite3_stmt* statement, int index, std::string_view text) {
     check(sqlite3_bind_text(statement, index, text.data(), static_cast<int>(text.size()),
                             SQLITE_STATIC));

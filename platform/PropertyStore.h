@@ -14,18 +14,23 @@ struct sqlite3_stmt;
 namespace platform {
 
 /**
- * Names and values in an SQLite database, in memory or in a file. The first failure is remembered;
- * operations after it still do what they can. To be used by one thread at a time; several processes
- * may use one file.
+ * Names and values in an SQLite database, in memory or in a file. One thread at a time may use an
+ * object. Several processes may use one file, each with an object of its own.
+ *
+ * The first failure is kept. Later operations still do what they can.
  */
 class PropertyStore {
 public:
     /** In memory. */
     PropertyStore();
 
-    /** In a file that `StoreFile::refuse` has no objection to. */
+    /**
+     * In `file`, which `StoreFile::refuse` has accepted. Turns an empty file, or a store of an
+     * earlier build, into a current store. Waits up to 10 s for other processes.
+     */
     explicit PropertyStore(std::shared_ptr<const StoreFile> file);
 
+    /** Deletes the log beside the file, unless another process uses the store. */
     ~PropertyStore();
 
     PropertyStore(const PropertyStore&) = delete;
@@ -34,24 +39,28 @@ public:
     /** The first failure: one line that names the file. */
     const std::optional<std::string>& error() const { return mError; }
 
-    /** Notes a failure if the file was deleted or replaced. */
+    /** Makes it a failure if the file was deleted or replaced. */
     void checkPlace();
 
-    /** The value, cut at 91 bytes: other programs may have stored longer ones. */
+    /** The value; nothing if the name has none. Cuts what other programs stored beyond 91 bytes. */
     std::optional<std::string> get(std::string_view name);
 
-    /** Sets what is not set yet. Returns whether it did. */
+    /** Sets a name that has no value. Returns whether it was this call that set it. */
     bool add(std::string_view name, std::string_view value);
 
-    /** Both return whether they succeeded. */
+    /** Sets a name. Returns whether that succeeded. */
     bool set(std::string_view name, std::string_view value);
+
+    /** Erases a name, if it is there. Returns whether that succeeded. */
     bool erase(std::string_view name);
 
-    /** Erases all but `persist.*` and `ro.*`. */
+    /** Erases all names but `persist.*` and `ro.*`. */
     void eraseVolatile();
 
-    /** The whole database as bytes, and the way back. Only in memory. */
+    /** The database as bytes. Only in memory. */
     std::vector<unsigned char> save();
+
+    /** Replaces the database by one that `save` returned. Only in memory. */
     void restore(const std::vector<unsigned char>& bytes);
 
 private:
@@ -67,12 +76,14 @@ private:
     void check(int status);
     void fail(const std::string& reason);
 
+    // Constant after construction.
     const std::shared_ptr<const StoreFile> mFile;  // null in memory
     sqlite3* mDb = nullptr;
     sqlite3_stmt* mGet = nullptr;
     sqlite3_stmt* mAdd = nullptr;
     sqlite3_stmt* mSet = nullptr;
     sqlite3_stmt* mErase = nullptr;
+
     std::optional<std::string> mError;
 };
 

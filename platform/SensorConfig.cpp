@@ -1,3 +1,3 @@
-/** The vendor's sensor configuration library, of which only this flag is used: detailed logging. */
+/** The one variable used of the vendor's sensor configuration library: non-zero logs details. */
 extern int mLogSwitch;
 int mLogSwitch = 0;

@@ -3,69 +3,49 @@
 #include <optional>
 #include <string>
 
-struct sqlite3;
-
 namespace platform {
 
-/** What an SQLite database is to the property service. */
-enum class StoreFormat {
-    kEmpty,     // nothing in it yet
-    kCurrent,   // a property store
-    kUnmarked,  // a property store of an earlier build, which has no application id
-    kNewer,     // a property store that a later build has changed
-    kForeign,   // anything else
-};
-
-/** The table of a property store, as its schema holds it. */
-extern const char kStoreSchema[];
-
-/** Marks a property store: its application id and its user version. */
-extern const char kStoreMarks[];
-
-/** The format of an open database. Sets `*status` to SQLite's error, if there is one. */
-StoreFormat formatOf(sqlite3* database, int* status);
-
-/** Why a database of this format is refused, if it is. */
-std::optional<std::string> refuseFormat(StoreFormat format);
-
 /**
- * The file of a property store, known by its inode from construction to destruction. Objects of
- * this class may be inherited by forked processes, and leave SQLite's locks on the file alone.
+ * The file of a property store. An object stands for one inode from its construction on. Forked
+ * processes may go on to use it. It never touches SQLite's locks on the file.
  */
 class StoreFile {
 public:
-    /** Makes the file, empty, if it is missing. */
+    /** Opens `path`. Creates an empty file if there is none. `refuse` reports a failure. */
     explicit StoreFile(const std::string& path);
     ~StoreFile();
 
     StoreFile(const StoreFile&) = delete;
     StoreFile& operator=(const StoreFile&) = delete;
 
-    /** As it was given. */
+    /** The path as given. */
     const std::string& path() const { return mPath; }
 
-    /** For SQLite, to which some names mean something else. */
+    /** The path for SQLite, which gives some relative names a meaning of their own. */
     const std::string& absolutePath() const { return mAbsolutePath; }
 
-    /** "FILE: cannot keep properties in this file: ", then `reason`. */
+    /** The line that reports `reason` to a person: "PATH: cannot keep properties …: REASON". */
     std::string refusal(const std::string& reason) const;
 
     /**
-     * Why the file cannot keep properties, if that shows without writing: one line that names it.
-     * Neither the file nor what stands beside it changes.
+     * Checks the file before it is opened as a store. Returns nothing if it is a store or empty.
+     * Otherwise returns one line that names it. Changes neither the file nor those beside it.
      */
     std::optional<std::string> refuse() const;
 
-    /** The same of a store in use: its path still has to name it, and a store has to be in it. */
+    /**
+     * Checks the file while it is in use as a store. Returns nothing if the path still names it and
+     * it still holds a store. Otherwise returns one line that names it.
+     */
     std::optional<std::string> refuseIfReplaced() const;
 
 private:
     bool isInPlace() const;
-    std::optional<std::string> look() const;
+    std::optional<std::string> refuseContent() const;
 
     const std::string mPath;
     const std::string mAbsolutePath;
-    const int mFd;
+    const int mFd;     // pins the inode: its number is not given to another file
     const int mErrno;  // of the open, if `mFd` is negative
 };
 

@@ -8,7 +8,7 @@ namespace {
 
 using Observer = std::function<void(const char*, const char*, const char*)>;
 
-/** Never destroyed: the library's worker may send until the process is gone. */
+/** Never destroyed: the library's worker may send events until the process ends. */
 Observer& observer() {
     static auto* const instance = new Observer;
     return *instance;

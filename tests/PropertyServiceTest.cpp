@@ -70,12 +70,19 @@ TEST_F(PropertyServiceTest, AFileKeepsWhatSurvivesABoot) {
     EXPECT_EQ(property("sys.c") + property("persistent"), "");
 }
 
-/** Starts `work(0)` to `work(3)` in processes of their own; their exit statuses. */
+/** Runs `work(0)` to `work(3)` at once in processes of their own; their exit statuses. */
 std::multiset<int> inProcesses(const std::function<int(int)>& work) {
     std::multiset<int> statuses;
+    int gate[2];
+    EXPECT_EQ(pipe(gate), 0);
     for (int i = 0; i < 4; ++i) {
-        if (fork() == 0) _exit(work(i));
+        if (fork() != 0) continue;
+        close(gate[1]);
+        char end = 0;
+        _exit(read(gate[0], &end, 1) == 0 ? work(i) : 10);  // returns when the gate is closed
     }
+    close(gate[1]);
+    close(gate[0]);
     for (int status = 0; wait(&status) > 0;) {
         statuses.insert(WIFEXITED(status) ? WEXITSTATUS(status) : -1);
     }

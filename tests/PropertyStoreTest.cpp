@@ -10,6 +10,7 @@
 #include <sqlite3.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include "platform/PropertyService.h"
@@ -154,6 +155,19 @@ TEST_F(PropertyStoreTest, TakesStoresOfEveryBuildAndRefusesTheRestUntouched) {
     }
 }
 
+TEST_F(PropertyStoreTest, ANewerVersionIsRefusedUntouchedEvenIfOnlyALogWithoutAnIndexTellsOfIt) {
+    const std::string store = makeStore("a");
+    const std::string copy = mFolder / "b";
+    const Database later(store, "PRAGMA user_version = 2");
+    fs::copy(store, copy);
+    fs::copy(store + "-wal", copy + "-wal");
+    const auto before = files();
+    EXPECT_EQ(platform::openProperties(copy),
+              copy + kReason + "a property store of a newer version");
+    const auto after = files();
+    EXPECT_TRUE(after.at("b") == before.at("b") && after.at("b-wal") == before.at("b-wal"));
+}
+
 TEST_F(PropertyStoreTest, RefusesWhatIsNoDatabaseUntouched) {
     write(mFolder / "text", "hello");
     write(mFolder / "long", std::string(5000, 'x'));
@@ -184,6 +198,22 @@ TEST_F(PropertyStoreTest, AMissingOrEmptyFileBecomesAStoreAndStandsByItselfOnceC
         expectStore(mFolder / name, "");
     }
     EXPECT_EQ(files().size(), 2u) << "no log and no index is left";
+}
+
+TEST_F(PropertyStoreTest, AStoreWhoseCreatorWasKilledAfterItsFirstPageIsCreatedAgain) {
+    const std::string store = mFolder / "store";
+    if (fork() == 0) {
+        const rlimit onePage{4096, 4096};
+        setrlimit(RLIMIT_FSIZE, &onePage);
+        std::signal(SIGXFSZ, [](int) { _exit(7); });
+        platform::openProperties(store);
+        _exit(0);
+    }
+    int status = 0;
+    wait(&status);
+    EXPECT_EQ(WEXITSTATUS(status), 7);
+    EXPECT_EQ(fs::file_size(store), 4096u);
+    expectStore(store, "");
 }
 
 TEST_F(PropertyStoreTest, AFileThatCannotBeWrittenIsRefusedWithNothingLeftBesideIt) {
@@ -234,9 +264,11 @@ TEST_F(PropertyStoreTest, TheFirstFailedWriteIsRememberedAndWhatIsStoredCanStill
     EXPECT_EQ(taken(), (Lines{"0 persist.b=2"}));
 
     EXPECT_EQ(property_set("persist.b", "4"), 0);
+    EXPECT_EQ(Database(store).value("SELECT value FROM properties"), "14");
+    Database(store, "DROP TABLE properties");
+    EXPECT_EQ(property("persist.a"), "") << "another failure, of another kind";
     EXPECT_EQ(platform::closeProperties(), error);
     EXPECT_EQ(platform::propertyFileError(), std::nullopt) << "it is the closed file's";
-    EXPECT_EQ(Database(store).value("SELECT value FROM properties"), "14");
 }
 
 TEST_F(PropertyStoreTest, AStoreThatIsDeletedOrReplacedIsAnError) {

@@ -4,7 +4,7 @@
 
 namespace android {
 
-/** A reference to an object of another process; here it only tells such objects apart. */
+/** A reference to an object of another process. The host uses its identity only. */
 class IBinder : public virtual RefBase {
 protected:
     IBinder() = default;

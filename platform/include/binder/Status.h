@@ -2,7 +2,7 @@
 
 namespace android::binder {
 
-/** What a call between processes returns; here no call fails. */
+/** The outcome of a call between processes. On the host no call fails. */
 class Status final {
 public:
     static Status ok() { return Status(); }

@@ -39,15 +39,15 @@ struct DisplayCaptureArgs : CaptureArgs {
 /** The way to the compositor. */
 class SurfaceComposerClient : public RefBase {
 public:
-    /** The one token of the internal display; null if there is none. */
+    /** The token of the internal display, always the same. Null if there is none. */
     static sp<IBinder> getInternalDisplayToken();
 };
 
 class ScreenshotClient {
 public:
     /**
-     * Begins a capture and returns; `listener` is told once, later, on another thread. If this
-     * fails, it is never told. BAD_VALUE without a token or a listener.
+     * Starts a capture and returns. On success the listener is told once, later, on another
+     * thread; after an error it is never told. BAD_VALUE if the token or the listener is null.
      */
     static status_t captureDisplay(const DisplayCaptureArgs& captureArgs,
                                    const sp<IScreenCaptureListener>& captureListener);

@@ -1,12 +1,12 @@
 #pragma once
 
-/** Longest name of the first property protocol, with its NUL; the service takes longer names. */
+/** Longest name with its NUL, by the first property protocol. The service takes longer ones. */
 #define PROP_NAME_MAX 32
 
 /** Longest value, with its NUL. */
 #define PROP_VALUE_MAX 92
 
-// As the device's C library does: to clang, `property_get` with a shorter buffer is an error.
+// The device's C library does the same: clang rejects `property_get` with a shorter buffer.
 #if defined(__clang__)
 #define __BIONIC_FORTIFY 1
 #define __BIONIC_FORTIFY_UNKNOWN_SIZE (static_cast<size_t>(-1))

@@ -15,10 +15,10 @@ class CaptureThread;
 
 namespace android {
 
-/** Signals once, when the contents that it stands for are complete. */
+/** Signals once, when the contents of a buffer are complete. */
 class Fence : public LightRefBase<Fence> {
 public:
-    /** An invalid fence, for which nobody has to wait. */
+    /** An invalid fence. Waiting for it returns at once. */
     static const sp<Fence> NO_FENCE;
 
     /** Makes an invalid fence. */
@@ -30,8 +30,8 @@ public:
     bool isValid() const { return mSignal != nullptr; }
 
     /**
-     * Waits for the signal; with 0, only looks, and answers -ETIME if it has not come. The clock
-     * stands still while a capture runs: no other time-out ever passes.
+     * Waits for the signal. A time-out of 0 does not wait: returns -ETIME if there was no signal.
+     * Any other time-out never passes, as the clock stands still during a capture.
      */
     status_t wait(int timeoutMs);
     status_t waitForever(const char* logname);
@@ -49,7 +49,7 @@ private:
     explicit Fence(std::shared_ptr<Signal> signal) : mSignal(std::move(signal)) {}
     ~Fence() = default;
 
-    // Whoever gives the signal does so without a reference to the fence.
+    // Shared with the thread that gives the signal, which holds no reference to the fence.
     const std::shared_ptr<Signal> mSignal;
 };
 

@@ -18,7 +18,7 @@ enum {
 
 typedef int32_t PixelFormat;
 
-/** Bytes of a pixel; 0 for formats that have no such number. */
+/** Bytes of a pixel. 0 for unknown formats and those without a fixed size. */
 uint32_t bytesPerPixel(PixelFormat format);
 
 }  // namespace android

@@ -4,7 +4,7 @@
 
 namespace android {
 
-/** A rectangle of pixels, right and bottom exclusive; invalid unless given. */
+/** A rectangle of pixels. Right and bottom are exclusive. Invalid by default. */
 class Rect {
 public:
     int32_t left = 0;

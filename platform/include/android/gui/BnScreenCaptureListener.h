@@ -4,7 +4,7 @@
 
 namespace android::gui {
 
-/** A listener that lives in this process. */
+/** A listener in this process. */
 class BnScreenCaptureListener : public IScreenCaptureListener {};
 
 }  // namespace android::gui

@@ -6,7 +6,7 @@
 
 namespace android::gui {
 
-/** Whoever is told that a capture is over. */
+/** Is told when a capture is complete. */
 class IScreenCaptureListener : public virtual RefBase {
 public:
     virtual ::android::binder::Status onScreenCaptureCompleted(
