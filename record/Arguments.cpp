@@ -35,7 +35,12 @@ void appendArgument(std::string* out, long long value) {
 
 void appendArgument(std::string* out, const std::string& name) {
     Recorder* const recorder = Recorder::get();
-    appendText(out, recorder != nullptr ? recorder->maskName(name.c_str()) : name.c_str());
+    Names* const names = recorder != nullptr ? recorder->names() : nullptr;
+    if (names != nullptr) {
+        appendText(out, names->replace(name.c_str()));
+    } else {
+        appendText(out, name.c_str());
+    }
 }
 
 void appendArgument(std::string* out, const android::String8& name) {

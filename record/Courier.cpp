@@ -5,20 +5,28 @@
 
 namespace record {
 
+namespace {
+
+/** Nobody waits for ever for a message that does not come. */
+constexpr int kMostYields = 100;
+
+}  // namespace
+
 void Courier::handleMessage(const android::Message& message) {
-    switch (mRecorder->beginMessage(&mRun)) {
+    switch (mRecorder->beginMessage(&mRun, mYields < kMostYields)) {
         case Timeline::Turn::kNever:
-            break;
+            return;
         case Timeline::Turn::kLater:
-            mThread->sendMessage(this, message.what);
-            break;
-        case Timeline::Turn::kNow: {
-            const Run::Scope scope(&mRun);
-            mHandler->handleMessage(message);
-        }
-            mRecorder->end(&mRun);
+            ++mYields;
+            return mThread->sendMessage(this, message.what);
+        case Timeline::Turn::kNow:
             break;
     }
+    {
+        const Run::Scope scope(&mRun);
+        mHandler->handleMessage(message);
+    }
+    mRecorder->end(&mRun);
 }
 
 }  // namespace record

@@ -41,6 +41,7 @@ private:
     android::SensorHandlerThread* const mThread;
     const Handler mHandler;
     MessageRun mRun;
+    int mYields = 0;  // how often others have come first
 };
 
 }  // namespace record

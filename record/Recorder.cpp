@@ -117,10 +117,6 @@ std::optional<std::string> Recorder::begin(const std::string& folder, size_t byt
     return {};
 }
 
-std::string Recorder::maskName(const std::string& name) {
-    return mNames != nullptr ? mNames->replace(name) : name;
-}
-
 void Recorder::beginCall(Run* run, const Call& call) {
     const android::Mutex::Autolock lock(mLock);
     if (!mParts.isOpen()) return;
@@ -136,15 +132,15 @@ void Recorder::beginCall(Run* run, const Call& call) {
     mRuns.begin(run);
 }
 
-Timeline::Turn Recorder::beginMessage(Run* message) {
+Timeline::Turn Recorder::beginMessage(Run* message, bool canYield) {
     const android::Mutex::Autolock lock(mLock);
     waitForQuiet(*message);
     const Timeline::Turn turn = mTimeline.turnOf(*message);
-    if (turn != Timeline::Turn::kNow) return turn;
+    if (turn == Timeline::Turn::kNever || (turn == Timeline::Turn::kLater && canYield)) return turn;
     for (Run* run : mTimeline.start(message)) mRuns.begin(run);
     message->clockStands = mParts.isOpen();
     message->tellsMoment = true;
-    return turn;
+    return Timeline::Turn::kNow;
 }
 
 void Recorder::waitForQuiet(const Run& message) {

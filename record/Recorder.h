@@ -48,8 +48,8 @@ public:
     /** Whether events matter: a client holds the proximity sensor. */
     static bool wantsEvents() { return sWantsEvents.load(std::memory_order_relaxed); }
 
-    /** A stand-in for `name`, if names are to be replaced. */
-    std::string maskName(const std::string& name);
+    /** What replaces the names of packages; null if they are to be written as they are. */
+    Names* names() const { return mNames.get(); }
 
     /** A call from outside, as its line tells it. */
     struct Call {
@@ -86,8 +86,8 @@ public:
     std::vector<android::sp<Courier>> remove(const Run* run, const Courier::Handler& handler,
                                              std::optional<int> what) EXCLUDES(mLock);
 
-    /** The worker thread comes to a message. It runs if it is its turn. */
-    Timeline::Turn beginMessage(Run* message) EXCLUDES(mLock);
+    /** The worker thread comes to a message. It runs if it is its turn, or if it cannot yield. */
+    Timeline::Turn beginMessage(Run* message, bool canYield) EXCLUDES(mLock);
 
     /** The singleton that the call `name` creates is there. */
     void noteSingleton(const char* name) EXCLUDES(mLock);
@@ -118,7 +118,7 @@ private:
     static std::atomic<Recorder*> sStarted;
     static std::atomic<bool> sWantsEvents;
 
-    const std::unique_ptr<Names> mNames;  // null: names are written as they are
+    const std::unique_ptr<Names> mNames;
 
     android::Mutex mLock;
     Parts mParts GUARDED_BY(mLock);

@@ -29,6 +29,7 @@ int64_t Timeline::next(int64_t real) {
     // after those that have become due.
     if (const auto moment = nextMoment()) comeBy(std::max(*moment - 1, mWait));
     at = std::max(at, mFloor);
+    if (at > mLast) mRemovals.clear();
     mOrder = at == mLast ? std::min(mOrder + 1, kLastOrder - 1) : 0;
     mFloor = mLast = at;
     return at;
@@ -61,19 +62,36 @@ bool Timeline::post(Run* message, const android::MessageHandler* handler, int wh
     const int64_t due = poster.now + std::max(delayMs, 0) * kNsPerMs;
     mWait = std::max(mWait, poster.now);
     const bool hasBegun = poster.isMessage && due <= mWait;
-    mPending.push_back({message, handler, what, due, poster.order, hasBegun});
+    const Pending posted{message, handler, what, poster.now, poster.order, due, hasBegun};
+    if (!poster.isMessage && isTakenBack(posted)) return false;
+    mPending.push_back(posted);
     if (hasBegun) message->now = mWait;
     return hasBegun;
+}
+
+/** Whether a call that began later, but was faster, has already taken the message back. */
+bool Timeline::isTakenBack(const Pending& posted) const {
+    return posted.posted == mLast &&
+           std::any_of(mRemovals.begin(), mRemovals.end(), [&](const Removal& removal) {
+               return removal.order > posted.order && removal.handler == posted.handler &&
+                      (!removal.what || *removal.what == posted.what);
+           });
 }
 
 std::vector<Run*> Timeline::remove(const android::MessageHandler* handler, std::optional<int> what,
                                    const Run* remover) {
     if (remover != nullptr) mWait = std::max(mWait, remover->now);
     const bool isCall = remover != nullptr && !remover->isMessage;
+    if (isCall) mRemovals.push_back({handler, what, remover->order});
+    const auto isOutOfReach = [&](const Pending& pending) {
+        const bool comesLater =
+                isCall && pending.posted == remover->now && pending.order > remover->order;
+        return isCall && (pending.hasBegun || comesLater);
+    };
     std::vector<Run*> removed;
     for (auto it = mPending.begin(); it != mPending.end();) {
         const bool matches = it->handler == handler && (!what || it->what == *what);
-        if (matches && !(it->hasBegun && isCall)) {
+        if (matches && !isOutOfReach(*it)) {
             removed.push_back(it->message);
             it = mPending.erase(it);
         } else {
@@ -86,7 +104,6 @@ std::vector<Run*> Timeline::remove(const android::MessageHandler* handler, std::
 Timeline::Turn Timeline::turnOf(const Run& message) const {
     const Pending* pending = find(message);
     if (pending == nullptr) return Turn::kNever;
-    if (pending->hasBegun) return Turn::kNow;
     const bool isFirst =
             std::none_of(mPending.begin(), mPending.end(),
                          [pending](const Pending& other) { return other.comesBefore(*pending); });
@@ -111,8 +128,8 @@ std::vector<Run*> Timeline::start(Run* message) {
             pending.message->now = moment;
             reached.push_back(&pending);
         }
-        std::stable_sort(reached.begin(), reached.end(),
-                         [](const Pending* a, const Pending* b) { return a->comesBefore(*b); });
+        std::sort(reached.begin(), reached.end(),
+                  [](const Pending* a, const Pending* b) { return a->comesBefore(*b); });
         for (const Pending* pending : reached) begun.push_back(pending->message);
         isOver = isOver || begun.size() > 1;
         mFloor = std::max(mFloor, isOver ? moment + 1 : moment);

@@ -33,7 +33,8 @@ public:
     int64_t tell(int64_t now);
 
     // A call of the time that `next` has given begins, or ends. Until it ends no time passes: it
-    // may yet post a message for its moment, and that comes after the calls of other threads.
+    // may yet post a message for its moment, and that comes after the calls of other threads. What
+    // calls of the same time do to messages counts as done in the order in which they began.
     void beginCall(Run* call);
     void endCall(const Run& call, int64_t real);
 
@@ -79,19 +80,31 @@ private:
         Run* message;
         const android::MessageHandler* handler;
         int what;
-        int64_t due;
+        int64_t posted;
         int32_t order;  // of its poster among those of the same time
+        int64_t due;
         bool hasBegun;
 
+        /** In `mPending` both. */
         bool comesBefore(const Pending& other) const {
-            return due != other.due ? due < other.due : order < other.order;
+            if (due != other.due) return due < other.due;
+            return order != other.order ? order < other.order : this < &other;
         }
     };
 
+    /** What a call has taken back at the time `mLast`. */
+    struct Removal {
+        const android::MessageHandler* handler;
+        std::optional<int> what;
+        int32_t order;  // of the call
+    };
+
     const Pending* find(const Run& message) const;
+    bool isTakenBack(const Pending& posted) const;
     std::optional<int64_t> nextMoment() const;
 
-    std::vector<Pending> mPending;    // in the order of posting
+    std::vector<Pending> mPending;  // in the order of posting
+    std::vector<Removal> mRemovals;
     std::vector<int64_t> mOpenCalls;  // their times
     int64_t mLastEnd = 0;             // of a call, in real time
     int64_t mLast = 0;                // of the last line

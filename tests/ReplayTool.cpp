@@ -6,16 +6,6 @@
 
 #include <sys/wait.h>
 
-namespace {
-
-std::string contents(const std::filesystem::path& file) {
-    std::ostringstream text;
-    text << std::ifstream(file).rdbuf();
-    return text.str();
-}
-
-}  // namespace
-
 ReplayToolTest::ReplayToolTest() {
     std::string name = ::testing::TempDir() + "replay-XXXXXX";
     mFolder = mkdtemp(name.data());
@@ -30,12 +20,19 @@ void ReplayToolTest::write(const std::string& name, const std::string& text) con
     std::ofstream(mFolder / name, std::ios::binary) << text;
 }
 
-Played ReplayToolTest::run(const std::string& arguments, const std::string& input) const {
+std::string ReplayToolTest::read(const std::string& name) const {
+    std::ostringstream text;
+    text << std::ifstream(mFolder / name).rdbuf();
+    return text.str();
+}
+
+Played ReplayToolTest::run(const std::string& arguments, const std::string& input,
+                           const std::string& environment) const {
     write("in", input);
-    const int status =
-            std::system(("'" SENSOR_REPLAY "' " + arguments + " <in >out 2>err").c_str());
-    return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, contents(mFolder / "out"),
-            contents(mFolder / "err")};
+    const std::string command =
+            "env " + environment + " '" SENSOR_REPLAY "' " + arguments + " <in >out 2>err";
+    const int status = std::system(command.c_str());
+    return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, read("out"), read("err")};
 }
 
 std::vector<std::string> ReplayToolTest::happened(const Played& played) {

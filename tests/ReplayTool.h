@@ -22,8 +22,15 @@ protected:
     /** Writes a file into the folder. */
     void write(const std::string& name, const std::string& text) const;
 
-    /** `arguments` as a shell takes them; `input` is its standard input. */
-    Played run(const std::string& arguments, const std::string& input = "") const;
+    /**
+     * `arguments` and `environment`, such as "NAME=value", as a shell takes them; `input` is its
+     * standard input.
+     */
+    Played run(const std::string& arguments, const std::string& input = "",
+               const std::string& environment = "") const;
+
+    /** What stands in a file of the folder. */
+    std::string read(const std::string& name) const;
 
     /** The lines of a JSON output but for boots. */
     static std::vector<std::string> happened(const Played& played);

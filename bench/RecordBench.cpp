@@ -1,0 +1,110 @@
+#include <cstdlib>
+#include <cstring>
+#include <string>
+
+#include <benchmark/benchmark.h>
+#include <dlfcn.h>
+#include <fcntl.h>
+#include <unistd.h>
+
+#include "core/SDCImpl.h"
+#include "rgb/RgbShotManager.h"
+
+namespace {
+
+using android::RgbShotManager;
+using android::SDCImpl;
+
+/** Records into a folder of this process's own. */
+const bool gRecords = [] {
+    const char* const parent = std::getenv("TMPDIR");
+    std::string folder = std::string(parent != nullptr ? parent : "/tmp") + "/record-bench-XXXXXX";
+    setenv("SENSOR_PRIV_RECORD", mkdtemp(folder.data()), 1);
+    return true;
+}();
+
+/** The library's own function of the name that the recorder's function at `address` has. */
+template <typename Function, typename Operation>
+Function direct(Operation operation) {
+    const void* address = nullptr;
+    std::memcpy(&address, &operation, sizeof(address));
+    Dl_info info{};
+    dladdr(address, &info);
+    return reinterpret_cast<Function>(dlsym(dlopen("libsensor-priv.so", RTLD_NOW), info.dli_sname));
+}
+
+/** Holds, or no longer holds, the proximity sensor, as an app that the library does not watch. */
+void holdProximity(bool holds) {
+    SDCImpl::getInstance()->enableSuccess(holds, 8, "com.example.app", "com.example.app", 0);
+}
+
+sensors_event_t reading() {
+    sensors_event_t event{};
+    event.type = 1;
+    event.data[0] = 0.1532F;
+    event.data[1] = 9.80665F;
+    event.data[2] = -0.40218F;
+    return event;
+}
+
+/** What the kernel takes of it: a line of the usual length, into a file of the same kind. */
+void writeAlone(benchmark::State& state) {
+    const std::string path = std::string(std::getenv("SENSOR_PRIV_RECORD")) + "/peer";
+    const int fd = open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND, 0600);
+    const std::string line(100, 'x');
+    for (auto _ : state) benchmark::DoNotOptimize(write(fd, line.data(), line.size()));
+    close(fd);
+    unlink(path.c_str());
+}
+
+void processDirect(benchmark::State& state) {
+    SDCImpl* const sdc = SDCImpl::getInstance();
+    const auto process = direct<void (*)(SDCImpl*, const sensors_event_t&)>(&SDCImpl::process);
+    const sensors_event_t event = reading();
+    for (auto _ : state) process(sdc, event);
+}
+
+void processNotRecorded(benchmark::State& state) {
+    SDCImpl* const sdc = SDCImpl::getInstance();
+    holdProximity(false);
+    const sensors_event_t event = reading();
+    for (auto _ : state) sdc->process(event);
+}
+
+void processRecorded(benchmark::State& state) {
+    SDCImpl* const sdc = SDCImpl::getInstance();
+    holdProximity(true);
+    const sensors_event_t event = reading();
+    for (auto _ : state) sdc->process(event);
+    holdProximity(false);
+}
+
+void skipLuxRecorded(benchmark::State& state) {
+    RgbShotManager* const manager = RgbShotManager::getInstance();
+    for (auto _ : state) benchmark::DoNotOptimize(manager->skipLux());
+}
+
+const std::string kName = "com.example.application.with.a.usual.name";
+
+void enableDirect(benchmark::State& state) {
+    using Function =
+            void (*)(SDCImpl*, bool, int, const std::string&, const std::string&, long long);
+    SDCImpl* const sdc = SDCImpl::getInstance();
+    const auto enable = direct<Function>(&SDCImpl::enableSuccess);
+    for (auto _ : state) enable(sdc, true, 4, kName, kName, 20000);
+}
+
+void enableRecorded(benchmark::State& state) {
+    SDCImpl* const sdc = SDCImpl::getInstance();
+    for (auto _ : state) sdc->enableSuccess(true, 4, kName, kName, 20000);
+}
+
+BENCHMARK(writeAlone);
+BENCHMARK(processDirect);
+BENCHMARK(processNotRecorded);
+BENCHMARK(processRecorded);
+BENCHMARK(skipLuxRecorded);
+BENCHMARK(enableDirect);
+BENCHMARK(enableRecorded);
+
+}  // namespace
