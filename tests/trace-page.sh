@@ -4,6 +4,7 @@
 # FOLDER is the project's. Each fenced block of JSON Lines is a trace that must play; one with
 # "expect" lines must also be met. Together they must make every call of trace/calls.inc. The page's
 # table of variables must be what the library says.
+# shellcheck disable=SC2016  # the backquotes are the page's
 set -eu
 folder=$1
 tool=$2
