@@ -1,10 +1,13 @@
 /** The platform's capture calls, as the library and others may use them. */
 
+#include <cerrno>
+#include <csignal>
 #include <functional>
 
 #include <gtest/gtest.h>
 #include <gui/SurfaceComposerClient.h>
 #include <hardware/gralloc.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -132,6 +135,10 @@ TEST(GraphicsTest, ABufferHasTheDisplaysPixelsAndWhiteBehindItsRows) {
     change.rowPadding = 0;
     show(change);
     EXPECT_EQ(bytesOf(capture(request(1, 2)).buffer), (Bytes{7, 8, 9, 255, 7, 8, 9, 255}));
+    DisplayCaptureArgs corner = request(2, 2);
+    corner.sourceCrop = Rect(-1, -1, 1, 1);
+    EXPECT_EQ(bytesOf(capture(corner).buffer),
+              (Bytes{0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 7, 8, 9, 255}));
     DisplayCaptureArgs insecure = request(1, 1);
     insecure.captureSecureLayers = false;
     EXPECT_FALSE(capture(insecure).capturedSecureLayers);
@@ -161,6 +168,40 @@ TEST(GraphicsTest, ABufferIsLockedForReadingOnlyAndUnlockedAsOften) {
                  "destroyed while it was locked");
 }
 
+TEST(GraphicsTest, TheFenceSignalsAfterTheListenerWasTold) {
+    class Observer : public gui::BnScreenCaptureListener {
+    public:
+        binder::Status onScreenCaptureCompleted(const gui::ScreenCaptureResults& results) override {
+            early = results.fence->wait(0);
+            return listener->onScreenCaptureCompleted(results);
+        }
+
+        status_t early = OK;
+        const sp<Listener> listener = new Listener;
+    };
+    const sp<Observer> observer = new Observer;
+    EXPECT_EQ(ScreenshotClient::captureDisplay(request(1, 1), observer), OK);
+    EXPECT_EQ(observer->listener->waitForResults().fence->wait(0), OK);
+    EXPECT_EQ(observer->early, -ETIME);
+}
+
+TEST(GraphicsTest, APictureForWhichThereIsNoMemoryChangesNothing) {
+    std::signal(SIGXFSZ, SIG_IGN);
+    rlimit limit{};
+    getrlimit(RLIMIT_FSIZE, &limit);
+    DisplayChange change;
+    change.picture = platform::Picture{1, 1, {1, 2, 3, 4}};
+    show(change);
+    const rlimit small{4096, limit.rlim_max};
+    setrlimit(RLIMIT_FSIZE, &small);  // which the memory of a picture is subject to
+    change.picture = platform::Picture{2000, 1, Bytes(8000)};
+    change.rowPadding = 1;
+    const auto error = changeDisplay(change);
+    setrlimit(RLIMIT_FSIZE, &limit);
+    EXPECT_EQ(error, "no memory for a picture: File too large");
+    EXPECT_EQ(bytesOf(capture(request(1, 1)).buffer), (Bytes{1, 2, 3, 4}));
+}
+
 /** What a process forked from this one sees of the first `count` pixels of the display. */
 Bytes seenByAnother(size_t count) {
     int ends[2];
@@ -183,7 +224,6 @@ TEST(GraphicsTest, ForkedProcessesSeeOneDisplayWhicheverChangesIt) {
     change.color = {1, 2, 3};
     show(change);
     EXPECT_EQ(platform::shareDisplay(), std::nullopt);
-    EXPECT_EQ(platform::shareDisplay(), std::nullopt) << "once more does no harm";
     EXPECT_EQ(seenByAnother(1), (Bytes{1, 2, 3, 255}));
     // Each larger than the one before, which another process has mapped by then.
     for (const uint32_t width : {2U, 3000U, 100U, 5000U}) {
@@ -196,6 +236,7 @@ TEST(GraphicsTest, ForkedProcessesSeeOneDisplayWhicheverChangesIt) {
         int status = 0;
         wait(&status);
         EXPECT_EQ(status, 0);
+        EXPECT_EQ(platform::shareDisplay(), std::nullopt) << "once more does no harm";
         EXPECT_EQ(seenByAnother(width), pixels);
         EXPECT_EQ(bytesOf(capture(request(static_cast<int32_t>(width), 1)).buffer), pixels);
     }

@@ -135,6 +135,9 @@ TEST_F(PictureTest, WhatIsNoPictureIsNamed) {
     writePng(mFile, {kGray, 8}, 64, 64, Bytes(size_t{64} * 64, 3));
     std::filesystem::resize_file(mFile, std::filesystem::file_size(mFile) - 20);
     EXPECT_EQ(read(&picture).rfind("not a sound PNG picture: ", 0), 0u) << read(&picture);
+    writePng(mFile, {kGray, 8}, 1, 1, {3});
+    std::filesystem::resize_file(mFile, std::filesystem::file_size(mFile) - 12);  // its last chunk
+    EXPECT_EQ(read(&picture), "not a sound PNG picture: Read Error");
     ASSERT_EQ(mkfifo((mFolder / "pipe").c_str(), 0600), 0);
     for (const std::string& path : {mFolder / "pipe", mFolder / "", std::string("/dev/zero")}) {
         EXPECT_EQ(platform::readPng(path, &picture), "not a regular file") << path;

@@ -31,8 +31,9 @@ TEST_F(PropertyServiceTest, RefusesWhatTheDeviceRefuses) {
     EXPECT_EQ(property("a"), std::string(91, 'v'));
     EXPECT_EQ(property_set("ro.a", "first"), 0);
     EXPECT_EQ(property_set("ro.a", "second"), -1);
+    EXPECT_EQ(property_set("rock", "1") + property_set("rock", "2"), 0);
     EXPECT_EQ(property("ro.a"), "first");
-    EXPECT_EQ(taken().size(), 4u) << "only what was set is observed";
+    EXPECT_EQ(taken().size(), 6u) << "only what was set is observed";
     platform::setDeviceProperty("ro.a", "new image");
     EXPECT_EQ(property("ro.a"), "new image");
     platform::setDeviceProperty("a", std::string(92, 'w'));
