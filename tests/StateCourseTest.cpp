@@ -209,7 +209,7 @@ TEST_F(StateCourseTest, SaysWhatCannotBeDated) {
                               ""),
                        ""),
               "09:59:50 d1 p2 c0 t0, 12:00:00 p0capture:9: warning: the system started or went "
-              "down after the oldest registration, 1 lines say");
+              "down after the oldest registration (lines: 1)");
 }
 
 // What the description of the format prints of them.
