@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <tuple>
 #include <utility>
 
 namespace capture {
@@ -51,11 +52,11 @@ JoinedLines DumpJoin::finish() {
         for (JoinedDump& dump : piece.dumps) joined.dumps.push_back({dump.dump, dump.last + first});
         std::move(piece.lines.begin(), piece.lines.end(), std::back_inserter(joined.lines));
     }
-    std::stable_sort(joined.dumps.begin(), joined.dumps.end(),
-                     [&](const JoinedDump& a, const JoinedDump& b) {
-                         return std::pair(a.last, mTaken[a.dump]) <
-                                std::pair(b.last, mTaken[b.dump]);
-                     });
+    std::sort(joined.dumps.begin(), joined.dumps.end(),
+              [&](const JoinedDump& a, const JoinedDump& b) {
+                  return std::tuple(a.last, mTaken[a.dump], a.dump) <
+                         std::tuple(b.last, mTaken[b.dump], b.dump);
+              });
     return joined;
 }
 

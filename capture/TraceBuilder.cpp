@@ -109,8 +109,8 @@ void TraceBuilder::warnOfRuns(const Source& source) {
     }
     if (count == 0) return;
     warn(source.name, first,
-         "the system started or went down after the oldest registration, " + std::to_string(count) +
-                 " lines say");
+         "the system started or went down after the oldest registration (lines: " +
+                 std::to_string(count) + ")");
 }
 
 void TraceBuilder::writeTrace() {

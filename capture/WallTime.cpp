@@ -44,7 +44,7 @@ int64_t daysTo(const Date& date) {
 }
 
 Date dateOf(int64_t days) {
-    Date date{1970 + wholeUnits(days, 366), 1, 1};
+    Date date{1970 + wholeUnits(days, days < 0 ? 365 : 366), 1, 1};  // not later than it is
     while (daysToYear(date.year + 1) <= days) ++date.year;
     int64_t rest = days - daysToYear(date.year);
     for (; rest >= daysInMonth(date.year, date.month); ++date.month) {

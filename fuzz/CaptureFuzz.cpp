@@ -1,33 +1,63 @@
-/** Imports any text as a capture: a trace that comes of it must be in order. */
+/**
+ * Imports any bytes as a capture, packed or not: a trace that comes of it must be in order, and
+ * must come of the same capture twice, merged, as well.
+ */
 
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
 
 #include "capture/CaptureImport.h"
+#include "capture/TextSource.h"
 #include "fuzz/FuzzInput.h"
 #include "trace/LineReader.h"
 #include "trace/TraceLine.h"
 
-extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-    trace::LineReader reader(fuzz::readable(data, size));
+namespace {
+
+[[noreturn]] void fail(const char* what, std::string_view line) {
+    std::fprintf(stderr, "%s: %.*s\n", what, static_cast<int>(line.size()), line.data());
+    std::abort();
+}
+
+/** Adds the text in the bytes. False if there is none. */
+bool add(const uint8_t* data, size_t size, capture::CaptureImport* import) {
+    capture::OpenedText opened = capture::openText(fuzz::readable(data, size));
+    if (!opened.text) return false;
+    trace::LineReader reader(std::move(opened.text));
     const auto first = reader.next();
-    if (!first) return 0;
-    const capture::ImportedCapture imported = capture::importCapture("capture", *first, &reader);
-    const auto* trace = reinterpret_cast<const uint8_t*>(imported.trace.data());
-    trace::LineReader lines(fuzz::readable(trace, imported.trace.size()));
+    if (first) import->add("capture", *first, &reader);
+    return first.has_value();
+}
+
+void checkOrder(const std::string& trace) {
+    trace::LineReader lines(
+            fuzz::readable(reinterpret_cast<const uint8_t*>(trace.data()), trace.size()));
     static trace::TraceParser parser;
     trace::TraceLine line;
     int64_t last = 0;
     while (const auto text = lines.next()) {
         const auto error = parser.parse(*text, "capture", &line);
-        if (error || line.at < last) {
-            std::fprintf(stderr, "%s: %.*s\n", error.value_or("goes back").c_str(),
-                         static_cast<int>(text->size()), text->data());
-            std::abort();
-        }
+        if (error || line.at < last) fail(error.value_or("goes back").c_str(), *text);
         last = line.at;
     }
+}
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+    capture::CaptureImport once;
+    if (!add(data, size, &once)) return 0;
+    const std::string trace = once.finish().trace;
+    checkOrder(trace);
+    capture::CaptureImport twice;
+    add(data, size, &twice);
+    add(data, size, &twice);
+    if (twice.finish().trace != trace) fail("merged with itself it differs", trace);
     return 0;
 }

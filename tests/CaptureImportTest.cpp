@@ -1,46 +1,36 @@
-#include <algorithm>
-#include <sstream>
+#include <filesystem>
 #include <string>
+#include <utility>
 #include <vector>
 
+#include "tests/Captures.h"
 #include "tests/ReplayTool.h"
 
 namespace {
 
 using Lines = std::vector<std::string>;
 
-const std::string kSensors =
-        "Sensor List:\n"
-        "0000000000) Zero | Maker | ver: 1 | type: android.sensor.accelerometer(1) | perm: n/a\n"
-        "\tcontinuous | minRate=1.00Hz\n"
-        "0x5f636779) Name (with) brackets | Maker | ver: 1 | type: com.maker.magic(65537) | perm: "
-        "n/a | flags: 0x00000000\n";
+const std::string kHeading = "Previous Registrations:\n";
 
-/** An import's traces, as lines. */
 class CaptureImportTest : public ReplayToolTest {
 protected:
-    Played import(const std::string& capture) const {
-        write("capture", capture);
-        return run("--print-trace capture");
-    }
-
     /** The registrations of the trace of a capture with these newest-first registration lines. */
-    Lines registrations(const std::string& lines) const {
-        return select(import(kSensors + "Previous Registrations:\n" + lines).out, "enableSuccess");
-    }
-
-    static Lines select(const std::string& text, const std::string& part) {
-        Lines lines;
-        std::istringstream stream(text);
-        for (std::string line; std::getline(stream, line);) {
-            if (line.find(part) != std::string::npos) lines.push_back(line);
-        }
-        return lines;
+    static Lines registrations(const std::string& lines) {
+        return linesWith("enableSuccess", importText(kSensors + kHeading + lines).trace);
     }
 
     static std::string enable(long long at, const std::string& arguments) {
         return "{\"at\": " + std::to_string(at) +
                ", \"call\": \"SDCImpl.enableSuccess\", \"args\": [" + arguments + "]}";
+    }
+
+    /** Lines that turn a sensor off, newest first, at these times. */
+    static std::string offs(const Lines& times) {
+        std::string lines;
+        for (const std::string& time : times) {
+            lines += time + " - 0x00000000 pid=1 uid=1 package=a\n";
+        }
+        return lines;
     }
 };
 
@@ -93,17 +83,22 @@ TEST_F(CaptureImportTest, FindsItsSectionInABugReportThatPassedThroughAChat) {
     }
     const Lines expected{enable(25'200'000, R"(true, 1, "yes", "yes", 1000)"),
                          enable(28'800'000, R"(false, 1, "yes", "yes", 0)")};
-    EXPECT_EQ(select(import(report).out, "enableSuccess"), expected);
-    EXPECT_EQ(select(import(quoted).out, "enableSuccess"), expected);
+    for (const std::string& text : {report, quoted}) {
+        const auto imported = importText(text);
+        EXPECT_EQ(linesWith("enableSuccess", imported.trace), expected);
+        ASSERT_EQ(imported.warnings.size(), 1u);
+        EXPECT_EQ(imported.warnings[0],
+                  "capture:17: warning: 1 registrations left out: they stand behind the end of "
+                  "their section, the first is \"06:00:00 - 0x00000000 pid=1 uid=1 package=no\"");
+    }
 }
 
 TEST_F(CaptureImportTest, MakesTheCallsOfTheHostAroundTheRegistrations) {
-    const Played played = import(
-            kSensors +
-            "Previous Registrations:\n"
+    const auto imported = importText(
+            kSensors + kHeading +
             "00:00:00 - 0x00000000 pid=1 uid=1 package=a\n"
             "22:59:59 + 0x00000000 pid=1 uid=1 package=a samplingPeriod=1us batchingPeriod=0us\n");
-    Lines calls = select(played.out, "");
+    Lines calls = linesWith("", imported.trace);
     const auto call = [](const char* at, const std::string& name, const char* argument) {
         return std::string("{\"at\": ") + at + ", \"call\": \"" + name + "\"" +
                (*argument != '\0' ? std::string(", \"args\": [") + argument + "]" : "") + "}";
@@ -126,47 +121,179 @@ TEST_F(CaptureImportTest, MakesTheCallsOfTheHostAroundTheRegistrations) {
     EXPECT_EQ(calls.back(), R"({"at": 169220000})");
 }
 
+TEST_F(CaptureImportTest, BeginsAndEndsADayByItsEdges) {
+    struct Edge {
+        const char* time;
+        Lines firstAndLast;  // of the start, of the reports, of all
+    };
+    for (const auto& [time, expected] :
+         std::vector<Edge>{{"10:00:10", {"36000000", "39600000", "82800000", "82820000"}},
+                           {"10:00:09", {"35999000", "36000000", "82800000", "82820000"}},
+                           {"00:00:09", {"0", "3600000", "82800000", "82820000"}},
+                           {"23:00:20", {"82810000", "none", "none", "82820000"}},
+                           {"23:00:21", {"82811000", "86400000", "169200000", "169220000"}}}) {
+        const std::string trace = importText(kSensors + kHeading + offs({time})).trace;
+        const auto timeOf = [](const std::string& line) {
+            return line.substr(7, line.find_first_of(",}") - 7);
+        };
+        Lines ticks = linesWith("notifySdcClock", trace);
+        if (ticks.empty()) ticks = {"{\"at\": none,"};
+        const Lines all = linesWith("", trace);
+        EXPECT_EQ((Lines{timeOf(all.front()), timeOf(ticks.front()), timeOf(ticks.back()),
+                         timeOf(all.back())}),
+                  expected)
+                << time;
+    }
+}
+
 TEST_F(CaptureImportTest, PassesMidnightsAndWarnsOfAClockThatWasSetBack) {
-    const Played played = import(kSensors +
-                                 "Previous Registrations:\n"
-                                 "11:00:00 - 0x00000000 pid=1 uid=1 package=d\n"
-                                 "12:00:00 - 0x00000000 pid=1 uid=1 package=c\n"
-                                 "00:00:09 - 0x00000077 pid=1 uid=1 package=unknown\n"
-                                 "12:00:10 - 0x00000000 pid=1 uid=1 package=b\n"
-                                 "00:00:05 - 0x00000078 pid=1 uid=1 package=unknown\n"
-                                 "00:00:05 - 0x00000000 pid=1 uid=1 package=a\n");
-    EXPECT_EQ(select(played.out, "enableSuccess"),
-              (Lines{enable(5'000, R"(false, 1, "a", "a", 0)"),
-                     enable(43'210'000, R"(false, 1, "b", "b", 0)"),
-                     enable(129'600'000, R"(false, 1, "c", "c", 0)"),
-                     enable(129'600'000, R"(false, 1, "d", "d", 0)")}));
-    EXPECT_EQ(select(played.out, "getInstance"),
-              (Lines{R"({"at": 0, "call": "SDCImpl.getInstance"})"}));
-    EXPECT_EQ(select(played.err, ""),
-              (Lines{"capture:6: warning: the clock was set back; the time of the line before it "
-                     "stands",
-                     "capture:10: warning: 2 registrations left out: their sensors are not in the "
-                     "list"}));
-    EXPECT_EQ(played.status, 0);
+    struct Course {
+        Lines printed;  // oldest first
+        Lines times;
+        size_t setBack;
+    };
+    for (const auto& [printed, times, setBack] : std::vector<Course>{
+                 {{"21:00:00", "09:30:00"}, {"75600", "120600"}, 0},
+                 {{"12:00:00", "11:00:00"}, {"43200", "43200"}, 1},
+                 {{"12:00:00", "10:59:59"}, {"43200", "125999"}, 0},
+                 {{"23:59:59", "00:00:00", "23:59:59", "00:00:00"},
+                  {"86399", "86400", "172799", "172800"},
+                  0},
+                 // Lines are compared as they are printed: no fall here is more than an hour.
+                 {{"12:00:00", "11:20:00", "10:40:00", "11:59:59", "12:00:01"},
+                  {"43200", "43200", "43200", "43200", "43201"},
+                  3},
+                 {{"12:00:00", "11:30:00", "00:10:00"}, {"43200", "43200", "87000"}, 1}}) {
+        const auto imported =
+                importText(kSensors + kHeading + offs(Lines(printed.rbegin(), printed.rend())));
+        Lines expected;
+        for (const std::string& time : times) {
+            expected.push_back(enable(std::stoll(time) * 1000, R"(false, 1, "a", "a", 0)"));
+        }
+        EXPECT_EQ(linesWith("enableSuccess", imported.trace), expected) << printed[1];
+        EXPECT_EQ(imported.warnings.size(), setBack) << printed[1];
+    }
+    EXPECT_EQ(importText(kSensors + kHeading + offs({"11:30:00", "12:00:00"})).warnings,
+              Lines{"capture:6: warning: the clock was set back; the time of the line before it "
+                    "stands"});
+}
+
+TEST_F(CaptureImportTest, LosesNoRegistrationWithoutAWord) {
+    const std::string good = offs({"01:00:00"});
+    const std::string left = " registrations left out: ";
+    const std::string unreadable = left + "they cannot be read, the first is ";
+    const std::string behind = left + "they stand behind the end of their section, the first is ";
+    struct Capture {
+        std::string lines;
+        size_t kept;
+        Lines warnings;
+    };
+    for (const auto& [lines, kept, warnings] : std::vector<Capture>{
+                 {"02:00:00 + 0xzz pid=1 uid=1 package=b samplingPeriod=1us\n02:00:00 +\n"
+                  "02:00:00 flushed\n25:00:00 + 0x0\n01:30:00 de-activated handle=0x1\n" +
+                          good,
+                  1,
+                  {"6: warning: 3" + unreadable +
+                   "\"02:00:00 + 0xzz pid=1 uid=1 package=b samplingPeriod=1us\""}},
+                 {good + "Maker's statistics:\n" + good + "text\n" + good,
+                  1,
+                  {"8: warning: 2" + behind + "\"01:00:00 - 0x00000000 pid=1 uid=1 package=a\""}},
+                 {good + "\n" + good + "\n\n" + good + "\nMaker's text\n" + good,
+                  3,
+                  {"14: warning: 1" + behind + "\"01:00:00 - 0x00000000 pid=1 uid=1 package=a\""}},
+                 {good + "-----\n" + offs({"02:00:00"}) +
+                          "--------- 0.003s was the duration of dumpsys sensorservice\n" + good,
+                  1,
+                  {"8: warning: 1" + behind + "\"02:00:00 - 0x00000000 pid=1 uid=1 package=a\""}},
+                 {"02:00:00 - 0x00000077 pid=1 uid=1 package=b\n" + good,
+                  1,
+                  {"6: warning: 1" + left + "their sensors are not in the list"}},
+                 {std::string("02:00:00 - 0x00000000 pid=1 uid=1 package=b\0\n", 45) + good,
+                  1,
+                  {"6: warning: 1" + unreadable +
+                   "\"02:00:00 - 0x00000000 pid=1 uid=1 package=b\\u0000\""}}}) {
+        const auto imported = importText(kSensors + kHeading + lines);
+        EXPECT_EQ(linesWith("enableSuccess", imported.trace).size(), kept) << lines;
+        Lines expected;
+        for (const std::string& warning : warnings) expected.push_back("capture:" + warning);
+        EXPECT_EQ(imported.warnings, expected) << lines;
+    }
+}
+
+TEST_F(CaptureImportTest, ReadsACaptureInWhichEveryLineIsFollowedByAnEmptyOne) {
+    std::string doubled;
+    for (const char c : kSensors + kHeading + offs({"02:00:00", "01:00:00"}) + "Text\n") {
+        doubled += c == '\n' ? "\r\n\r\n" : std::string(1, c);
+    }
+    const auto imported = importText(doubled);
+    EXPECT_EQ(linesWith("enableSuccess", imported.trace).size(), 2u);
+    EXPECT_EQ(imported.warnings, Lines{});
+}
+
+TEST_F(CaptureImportTest, TakesTheFirstOfSeveralDumpsThatHasRegistrations) {
+    const std::string service = "DUMP OF SERVICE sensorservice:\n";
+    const std::string none = "No Sensors on the device\n";
+    const std::string dump = kSensors + kHeading + offs({"01:00:00"});
+    for (const std::string& text :
+         {service + none + service + dump, none + dump, service + kSensors + service + dump,
+          "== dumpstate: 2024-01-01 00:00:00\n" + service + none +
+                  "== dumpstate: 2024-02-01 02:00:00\n" + service + dump}) {
+        const auto imported = importText(text);
+        EXPECT_EQ(imported.error, "");
+        EXPECT_EQ(linesWith("enableSuccess", imported.trace).size(), 1u) << text;
+    }
+    const auto twice = importText(service + dump + service + dump);
+    EXPECT_EQ(linesWith("enableSuccess", twice.trace).size(), 1u);
+    EXPECT_EQ(twice.warnings.size(), 1u);
 }
 
 TEST_F(CaptureImportTest, SaysWhatIsMissing) {
-    const std::string one =
-            "Previous Registrations:\n01:00:00 - 0x00000000 pid=1 uid=1 package=a\n";
-    for (const auto& [capture, error] : std::vector<std::pair<std::string, std::string>>{
+    const std::string one = kHeading + offs({"01:00:00"});
+    for (const auto& [text, error] : std::vector<std::pair<std::string, std::string>>{
                  {"DUMP OF SERVICE sensorservice:\nNo Sensors on the device\n",
-                  "capture: no sensors on the device, so no registrations\n"},
-                 {kSensors, "capture: no previous registrations\n"},
-                 {kSensors + "Previous Registrations:\n\n", "capture: no previous registrations\n"},
+                  "capture: no sensors on the device, so no registrations"},
+                 {kSensors, "capture: no previous registrations"},
+                 {kSensors + kHeading + "\n", "capture: no previous registrations"},
+                 {kSensors + kHeading + "maker\n1 on \"a\"\n",
+                  "capture: no previous registrations that can be read: 2 lines of an unknown "
+                  "form, the first is \"maker\""},
+                 {kSensors + kHeading + "maker\n01:00:00 + x\n",
+                  "capture: no previous registrations that can be read: 1 lines of an unknown "
+                  "form, the first is \"01:00:00 + x\""},
                  {"== dumpstate: x\nDUMP OF SERVICE display:\n" + kSensors + one,
-                  "capture: no sensor service in the bug report\n"},
-                 {"\n# x\nhello\n",
-                  "capture:3: neither a JSON object nor part of a device capture\n"}}) {
-        const Played played = import(capture);
-        EXPECT_EQ(played.err, error);
-        EXPECT_EQ(played.status, 2);
-        EXPECT_EQ(played.out, "");
+                  "capture: no sensor service in the bug report"},
+                 {"hello\n", "capture:1: neither a JSON object nor part of a device capture"}}) {
+        EXPECT_EQ(importText(text).error, error);
     }
+    write("capture", "\n# x\nhello\n");
+    const Played played = run("--print-trace capture");
+    EXPECT_EQ(played.err, "capture:3: neither a JSON object nor part of a device capture\n");
+    EXPECT_EQ(played.status, 2);
+    EXPECT_EQ(played.out, "");
+}
+
+TEST_F(CaptureImportTest, DescribesWhereTheTraceComesFrom) {
+    const std::string line = "0x00000001) One | M | ver: 1 | type: t(1) | perm: n/a\n";
+    std::string text = report("0 (1) RESET:TIME: 2024-05-02-11-00-00\n0 (2) 050 +screen\n",
+                              "05-02 09:30:00.000  1  2 I screen_toggled: 1\n");
+    text.replace(text.find(kHeading), 0, line);
+    const trace::Origin origin = importText(text).origin;
+    EXPECT_EQ(origin.files, Lines{"capture"});
+    EXPECT_EQ(origin.taken, "2024-05-02 12:00:00");
+    EXPECT_EQ(origin.firstDay, 19845);
+    EXPECT_EQ(origin.registrations.from, 36'000'000);
+    EXPECT_EQ(origin.registrationCount, 1);
+    ASSERT_EQ(origin.sensors.size(), 3u);
+    EXPECT_EQ(origin.sensors[1].name, "Name (with) brackets");
+    EXPECT_EQ(origin.namesOfType.at(1), Lines{"Zero"});
+    EXPECT_EQ(origin.namesOfType.at(65537), Lines{"Name (with) brackets"});
+    ASSERT_EQ(origin.displayKnown.size(), 1u);
+    EXPECT_EQ(origin.displayKnown[0].from, 35'990'000);
+    EXPECT_EQ(origin.displayKnown[0].to, 43'200'000);
+    ASSERT_EQ(origin.cameraKnown.size(), 1u);
+    EXPECT_EQ(origin.cameraKnown[0].from, 39'600'000);
+    EXPECT_TRUE(origin.chargeKnown.empty());
+    EXPECT_FALSE(importText(kSensors + kHeading + offs({"01:00:00"})).origin.firstDay);
 }
 
 TEST_F(CaptureImportTest, PlaysEveryRealCaptureAndTheTraceMadeOfItAlike) {
@@ -186,7 +313,7 @@ TEST_F(CaptureImportTest, PlaysEveryRealCaptureAndTheTraceMadeOfItAlike) {
         EXPECT_EQ(run("--json trace").out, direct.out) << file;
         ++played;
         if (entry.path().filename() == "android-9-emulator.txt") {
-            const Lines reports = select(direct.out, "N273|10003");
+            const Lines reports = linesWith("N273|10003", direct.out);
             ASSERT_EQ(reports.size(), 2u);
             EXPECT_EQ(reports[0].find(R"({"at": 82800000, )"), 0u);
             EXPECT_EQ(reports[1].find(R"({"at": 169200000, )"), 0u);

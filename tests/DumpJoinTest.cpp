@@ -1,0 +1,153 @@
+#include "capture/DumpJoin.h"
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "capture/CaptureText.h"
+#include "tests/Captures.h"
+
+namespace {
+
+using capture::DumpJoin;
+
+/** Each letter is a registration. */
+std::vector<capture::Registration> lines(const std::string& letters) {
+    std::vector<capture::Registration> lines;
+    for (const char letter : letters) {
+        capture::Registration line{};
+        line.package = letter;
+        lines.push_back(line);
+    }
+    return lines;
+}
+
+/** Dumps as letters, oldest first. The joined ones, with " " at gaps, ": " and their order. */
+std::string join(const std::vector<std::string>& dumps, const std::vector<int64_t>& taken = {}) {
+    DumpJoin join;
+    for (size_t i = 0; i < dumps.size(); ++i) {
+        join.add(lines(dumps[i]), taken.empty() ? std::nullopt : std::optional(taken[i]));
+    }
+    const capture::JoinedLines joined = join.finish();
+    std::string text;
+    for (size_t i = 0; i < joined.lines.size(); ++i) {
+        const auto& gaps = joined.gaps;
+        if (std::find(gaps.begin(), gaps.end(), i) != gaps.end()) text += ' ';
+        text += joined.lines[i].registration.package;
+    }
+    text += ":";
+    for (const auto& dump : joined.dumps) text += " " + std::to_string(dump.dump);
+    return text;
+}
+
+TEST(DumpJoinTest, JoinsAtTheLongestRunThatEndsTheOlderAndBeginsTheNewer) {
+    struct Case {
+        std::vector<std::string> dumps;
+        const char* joined;
+    };
+    for (const auto& [dumps, joined] : std::vector<Case>{
+                 {{"abc"}, "abc: 0"},
+                 {{"abcd", "cdef"}, "abcdef: 0 1"},
+                 {{"cdef", "abcd"}, "abcdef: 1 0"},
+                 {{"abcd", "abcd"}, "abcd: 0 1"},
+                 {{"abab", "abac"}, "ababac: 0 1"},
+                 {{"aaa", "aab"}, "aaab: 0 1"},
+                 {{"bcd", "abcde"}, "abcde: 0 1"},
+                 {{"abcde", "bcd"}, "abcde: 1 0"},
+                 {{"abcde", "de"}, "abcde: 0 1"},
+                 {{"de", "abc", "bcd"}, "abcde: 1 2 0"},
+                 {{"abc", "xyz"}, "abc xyz: 0 1"},
+                 {{"xyz", "abc", "cd"}, "xyz abcd: 0 1 2"},
+                 {{"a", "b", "ab"}, "ab: 0 1 2"},
+         }) {
+        EXPECT_EQ(join(dumps), joined);
+    }
+    EXPECT_EQ(join({"xyz", "abc", "cd"}, {3, 1, 2}), "abcd xyz: 1 2 0");
+    EXPECT_EQ(join({"ab", "ab", "ab"}, {3, 1, 2}), "ab: 1 2 0");
+}
+
+TEST(DumpJoinTest, GivesALongCaptureAgainFromPiecesInAnyOrder) {
+    std::string all;
+    for (int i = 0; i < 200; ++i) all += static_cast<char>('A' + i % 7 * 5 + i / 50 + (i * i) % 11);
+    std::vector<std::string> pieces;
+    for (size_t begin = 0; begin < all.size(); begin += 23) pieces.push_back(all.substr(begin, 40));
+    for (int turn = 0; turn < 20; ++turn) {
+        std::rotate(pieces.begin(), pieces.begin() + 5, pieces.end());
+        std::swap(pieces[0], pieces[static_cast<size_t>(turn) % pieces.size()]);
+        EXPECT_EQ(join(pieces).substr(0, all.size() + 1), all + ":");
+    }
+}
+
+/** A report taken at `taken`, with registrations off at `times`, newest first. */
+std::string dump(const std::string& taken, const std::vector<std::string>& times,
+                 const std::string& history = "") {
+    std::string text = report(history, "");
+    const size_t line = text.find("10:00:00 -");
+    const std::string rest = text.substr(line + 8, text.find('\n', line) + 1 - line - 8);
+    std::string lines;
+    for (const std::string& time : times) lines += time + rest;
+    text.replace(line, 8 + rest.size(), lines);
+    for (const char* stamp : {"2024-05-02 11:59:00", "2024-05-02 12:00:00"}) {
+        text.replace(text.find(stamp), 19, taken);
+    }
+    return text;
+}
+
+TEST(DumpJoinTest, NamesAGapWithItsTimes) {
+    const auto dated = importTexts({dump("2024-05-04 12:00:00", {"10:00:00"}),
+                                    dump("2024-05-02 12:00:00", {"11:00:00", "09:00:00"})});
+    EXPECT_EQ(dated.warnings,
+              std::vector<std::string>{"0:13: warning: registrations are missing from 2024-05-02 "
+                                       "11:00:00 to 2024-05-04 10:00:00"});
+    ASSERT_EQ(dated.origin.gaps.size(), 1u);
+    EXPECT_EQ(dated.origin.gaps[0].from, 39'600'000);
+    EXPECT_EQ(dated.origin.gaps[0].to, 2 * 86'400'000 + 36'000'000);
+    EXPECT_EQ(dated.origin.files, (std::vector<std::string>{"1", "0"}));
+    EXPECT_EQ(dated.origin.taken, "2024-05-04 12:00:00");
+    const std::string list = kSensors + "Previous Registrations:\n";
+    EXPECT_EQ(importTexts({list + "09:00:00 - 0x00000000 pid=1 uid=1 package=a\n",
+                           list + "07:00:00 - 0x00000000 pid=1 uid=1 package=b\n"})
+                      .warnings[0],
+              "1:6: warning: registrations are missing from 09:00:00 to 07:00:00");
+}
+
+TEST(DumpJoinTest, DatesEachDumpByItself) {
+    // The line of 09:00 is of two days before the newest: the older dump says so.
+    const auto imported = importTexts({dump("2024-05-02 12:00:00", {"09:00:00"}),
+                                       dump("2024-05-04 12:00:00", {"10:00:00", "09:00:00"})});
+    EXPECT_EQ(imported.origin.registrations.to, 2 * 86'400'000 + 36'000'000);
+    // A date that is later than the newer dump allows is wrong.
+    const auto late = importTexts({dump("2024-05-04 12:00:00", {"09:00:00"}),
+                                   dump("2024-05-04 12:00:00", {"07:30:00", "09:00:00"})});
+    EXPECT_EQ(late.origin.registrations.to, 86'400'000 + 27'000'000);
+    EXPECT_EQ(late.origin.firstDay, 19846);
+}
+
+TEST(DumpJoinTest, TakesStatesFromEachDumpSinceTheOneBefore) {
+    const std::string first =
+            "0 (1) RESET:TIME: 2024-05-02-09-00-00\n0 (2) 050 plug=usb\n"
+            "+1h00m00s000ms (2) 050 +screen\n";
+    const std::string second =
+            "0 (1) RESET:TIME: 2024-05-02-10-30-00\n0 (2) 050 plug=ac +screen\n"
+            "+1h00m00s000ms (2) 050 -screen +camera\n";
+    const auto merge = [&](const char* secondTaken, const std::string& history) {
+        const auto imported = importTexts({dump("2024-05-02 11:00:00", {"09:30:00"}, first),
+                                           dump(secondTaken, {"10:50:00", "09:30:00"}, history)});
+        std::string known;
+        for (const auto& each : imported.origin.displayKnown) {
+            known +=
+                    " " + std::to_string(each.from / 60000) + "-" + std::to_string(each.to / 60000);
+        }
+        return statesOf(imported.trace) + known;
+    };
+    const std::string start = "09:29:50 d1 p2 c0 t0, 10:00:00 d2, ";
+    EXPECT_EQ(merge("2024-05-02 12:00:00", second),
+              start + "11:00:00 p1, 11:30:00 d1 c1, 12:00:00 p0 c0 569-720");
+    EXPECT_EQ(merge("2024-05-02 12:00:00", ""), start + "11:00:00 d1 p0 569-660");
+    EXPECT_EQ(merge("2024-05-02 12:00:00", "0 (1) RESET:TIME: 2024-05-02-11-10-00\n0 (2) 050\n"),
+              start + "11:00:00 d1 p0 569-660 670-720");
+}
+
+}  // namespace
