@@ -5,6 +5,7 @@
 #  - an operation of the facade that no trace can call, nor the stress run, which makes every call;
 #  - a call without a row in docs/trace.md, and its class in the recorder's map;
 #  - an event id or a property without a row in docs/output.md;
+#  - a property that the recorder does not look at;
 #  - an event id whose payload report/Payload.cpp does not take apart;
 #  - an option of sensor-replay that its manual or the completion does not have, and the reverse;
 #  - a version that the list of changes does not have.
@@ -51,6 +52,7 @@ for property in $(strings '(persist|ro|service)\.[a-z._]+'); do
     # A row may leave out the first two parts of a name that stand in the name before it.
     suffix=${property#*.*.}
     expect "$suffix\`" docs/output.md "the property $property"
+    expect "\"$property\"," record/Surroundings.cpp "the property $property"
 done
 
 options=$("$3" --help | sed -n 's/^  \(-h,\)\{0,1\}\(--[a-z-]*\).*/\2/p')
