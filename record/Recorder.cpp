@@ -1,7 +1,5 @@
 #include "record/Recorder.h"
 
-#include <algorithm>
-#include <cstdlib>
 #include <ctime>
 
 #include <android/log.h>
@@ -17,18 +15,8 @@ namespace record {
 
 namespace {
 
-constexpr size_t kDefaultMegabytes = 16;
-
 /** What a part keeps free for what the library does after a call has found room. */
 constexpr size_t kReserve = size_t{32} << 10;
-
-/** A setting: an environment variable or, without it, a property. */
-std::string setting(const char* variable, const char* property) {
-    if (const char* value = std::getenv(variable)) return value;
-    char value[PROPERTY_VALUE_MAX] = {};
-    property_get(property, value, "");
-    return value;
-}
 
 int64_t monotonicNow() {
     timespec now{};
@@ -72,29 +60,16 @@ Recorder* Recorder::getOnceStarted() {
 }
 
 void Recorder::start() {
-    const std::string folder = setting("SENSOR_PRIV_RECORD", "persist.debug.sensor_priv.record");
-    if (folder.empty()) return;
-    const std::string megabytes =
-            setting("SENSOR_PRIV_RECORD_MB", "persist.debug.sensor_priv.record_mb");
-    const std::string redact =
-            setting("SENSOR_PRIV_RECORD_REDACT", "persist.debug.sensor_priv.record_redact");
-    std::unique_ptr<Names> names;
-    std::optional<std::string> error;
-    if (!redact.empty() && redact != "0") {
-        const auto key = Names::loadKey(folder);
-        if (key) names = std::make_unique<Names>(*key);
-        if (!key) error = folder + " keeps no key";
-    }
-    auto* const recorder = new Recorder(std::move(names));  // never destroyed: the worker uses it
-    const size_t limit = std::strtoul(megabytes.c_str(), nullptr, 10);
-    if (!error) error = recorder->begin(folder, (limit > 0 ? limit : kDefaultMegabytes) << 20);
-    if (error) {
+    const Settings settings = Settings::read();
+    if (settings.folder.empty()) return;
+    auto* const recorder = new Recorder;  // never destroyed: the worker uses it
+    if (const auto error = recorder->begin(settings)) {
         __android_log_print(ANDROID_LOG_ERROR, kLogTag, "nothing is recorded: %s", error->c_str());
         delete recorder;
         return;
     }
-    sStarted.store(recorder, std::memory_order_release);
-    sWriting.store(recorder, std::memory_order_release);
+    sStarted = recorder;
+    sWriting = recorder;
     // A child would write into its parent's record, and may have got the lock locked.
     pthread_atfork(nullptr, nullptr, [] {
         sWriting = nullptr;
@@ -103,9 +78,14 @@ void Recorder::start() {
     });
 }
 
-std::optional<std::string> Recorder::begin(const std::string& folder, size_t bytes) {
+Parts::Error Recorder::begin(const Settings& settings) {
     const android::Mutex::Autolock lock(mLock);
-    if (auto error = mParts.open(folder, bytes)) return error;
+    if (settings.hidesNames) {
+        const auto key = Names::loadKey(settings.folder);
+        if (!key) return settings.folder + " keeps no key for names";
+        mNames = std::make_unique<Names>(*key);
+    }
+    if (auto error = mParts.open(settings.folder, settings.bytes)) return error;
     if (mParts.isFullFor(kReserve)) {
         if (auto error = mParts.startNext()) return error;
     }

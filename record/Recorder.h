@@ -7,7 +7,6 @@
 #include <set>
 #include <string>
 #include <string_view>
-#include <utility>
 #include <vector>
 
 #include <utils/Looper.h>
@@ -20,6 +19,7 @@
 #include "record/Run.h"
 #include "record/RunOrder.h"
 #include "record/Screen.h"
+#include "record/Settings.h"
 #include "record/Surroundings.h"
 #include "record/Timeline.h"
 
@@ -96,12 +96,12 @@ public:
     void noteProximity(bool enabled, const std::string& client) EXCLUDES(mLock);
 
 private:
-    explicit Recorder(std::unique_ptr<Names> names) : mNames(std::move(names)) {}
+    Recorder() = default;
 
     static void start();
 
     void waitForQuiet(const Run& message) REQUIRES(mLock);
-    std::optional<std::string> begin(const std::string& folder, size_t bytes) EXCLUDES(mLock);
+    Parts::Error begin(const Settings& settings) EXCLUDES(mLock);
     void expect(Run* run, std::string_view body) EXCLUDES(mLock);
 
     // Lines are gathered and then written at once.
@@ -118,7 +118,7 @@ private:
     static std::atomic<Recorder*> sStarted;
     static std::atomic<bool> sWantsEvents;
 
-    const std::unique_ptr<Names> mNames;
+    std::unique_ptr<Names> mNames;  // constant once the record has begun
 
     android::Mutex mLock;
     Parts mParts GUARDED_BY(mLock);

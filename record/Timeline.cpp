@@ -117,27 +117,30 @@ bool Timeline::hasBegun(const Run& message) const {
 
 std::vector<Run*> Timeline::start(Run* message) {
     std::vector<Run*> begun;
-    if (!hasBegun(*message)) {
-        const int64_t moment = nextMoment().value_or(mWait);
-        // A call at the very moment would come before what was posted at it.
-        bool isOver = moment == mWait;
-        std::vector<const Pending*> reached;
-        for (Pending& pending : mPending) {
-            if (pending.hasBegun || pending.due > moment) continue;
-            pending.hasBegun = true;
-            pending.message->now = moment;
-            reached.push_back(&pending);
-        }
-        std::sort(reached.begin(), reached.end(),
-                  [](const Pending* a, const Pending* b) { return a->comesBefore(*b); });
-        for (const Pending* pending : reached) begun.push_back(pending->message);
-        isOver = isOver || begun.size() > 1;
-        mFloor = std::max(mFloor, isOver ? moment + 1 : moment);
-        mWait = moment;
-    }
+    if (!hasBegun(*message)) begun = beginMoment();
     message->order = kLastOrder;
     message->isMessage = true;
     mPending.erase(mPending.begin() + (find(*message) - mPending.data()));
+    return begun;
+}
+
+std::vector<Run*> Timeline::beginMoment() {
+    const int64_t moment = nextMoment().value_or(mWait);
+    std::vector<const Pending*> reached;
+    for (Pending& pending : mPending) {
+        if (pending.hasBegun || pending.due > moment) continue;
+        pending.hasBegun = true;
+        pending.message->now = moment;
+        reached.push_back(&pending);
+    }
+    std::sort(reached.begin(), reached.end(),
+              [](const Pending* a, const Pending* b) { return a->comesBefore(*b); });
+    // A call at the moment itself would come before what was posted at it, or before the rest.
+    const bool isOver = moment == mWait || reached.size() > 1;
+    mFloor = std::max(mFloor, isOver ? moment + 1 : moment);
+    mWait = moment;
+    std::vector<Run*> begun;
+    for (const Pending* pending : reached) begun.push_back(pending->message);
     return begun;
 }
 

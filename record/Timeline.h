@@ -99,6 +99,7 @@ private:
         int32_t order;  // of the call
     };
 
+    std::vector<Run*> beginMoment();
     const Pending* find(const Run& message) const;
     bool isTakenBack(const Pending& posted) const;
     std::optional<int64_t> nextMoment() const;

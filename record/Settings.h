@@ -1,0 +1,17 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+
+namespace record {
+
+/** What docs/recording.md lists: environment variables or, where one is not set, properties. */
+struct Settings {
+    std::string folder;  // empty: nothing is recorded
+    size_t bytes = 0;    // what the record takes at most
+    bool hidesNames = false;
+
+    static Settings read();
+};
+
+}  // namespace record
