@@ -7,15 +7,6 @@
 
 namespace report {
 
-namespace {
-
-std::string share(const DayUse& use) {
-    if (!use.displayOn || use.held == 0) return "-";
-    return std::to_string(*use.displayOn * 100 / use.held) + " %";
-}
-
-}  // namespace
-
 void DayTable::add(int64_t boot, const Slice& slice, const Usage& usage) {
     for (int64_t number = slice.from / kNsPerDay;; ++number) {
         const int64_t midnight = (number + 1) * kNsPerDay;
@@ -24,7 +15,9 @@ void DayTable::add(int64_t boot, const Slice& slice, const Usage& usage) {
         use.app = slice.app;
         use.type = slice.type;
         use.held += span.to - span.from;
-        if (const auto on = usage.displayOn(span)) use.displayOn = use.displayOn.value_or(0) + *on;
+        const DisplayTime display = usage.displayIn(span);
+        use.display.known += display.known;
+        use.display.on += display.on;
         for (const Enable& enable : slice.enables) {
             if (enable.at / kNsPerDay != number) continue;
             ++use.enables;
@@ -61,9 +54,9 @@ Table layOut(const std::vector<DayUse>& uses, const trace::Origin* origin, size_
                  {""}},
                 limit);
     for (const DayUse& use : uses) {
-        table.add({use.app, nameSensor(use.type, origin), formatDuration(use.held), share(use),
-                   std::to_string(use.enables), use.fastest ? formatRate(*use.fastest) : "-",
-                   use.isOpen ? "still on" : ""});
+        table.add({use.app, nameSensor(use.type, origin), formatDuration(use.held),
+                   formatShare(use.display), std::to_string(use.enables),
+                   use.fastest ? formatRate(*use.fastest) : "-", use.isOpen ? "still on" : ""});
     }
     return table;
 }

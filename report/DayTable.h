@@ -30,7 +30,7 @@ struct DayUse {
     std::string app;
     int32_t type = 0;
     int64_t held = 0;
-    std::optional<int64_t> displayOn;  // of `held`; nothing: the display was never known
+    DisplayTime display;  // within `held`
     int64_t enables = 0;
     std::optional<int64_t> fastest;  // smallest sampling period, ns; nothing: no enable that day
     bool isOpen = false;             // still held when the day, or the replay, ended

@@ -114,11 +114,8 @@ void Timeline::takeSlice(const Slice& slice) {
     EventArguments arguments{{"rate in Hz", toJson(formatRate(fastest->periodNs))},
                              {"enables", std::to_string(slice.enables.size())},
                              {"still on", slice.isOpen ? "true" : "false"}};
-    const auto on = mUsage.displayOn({slice.from, slice.to});
-    if (on && slice.to > slice.from) {
-        arguments.emplace_back("display on in %",
-                               std::to_string(*on * 100 / (slice.to - slice.from)));
-    }
+    const DisplayTime display = mUsage.displayIn({slice.from, slice.to});
+    if (display.known > 0) arguments.emplace_back("display on", toJson(formatShare(display)));
     const std::string sensor = nameSensor(slice.type, mInput.origin);
     mEvents->slice({slice.app, true}, sensor, sensor, slice.from, slice.to, arguments);
 }
@@ -135,8 +132,7 @@ void Timeline::showStates(int64_t at) {
     if (state.charge) change("charger", &mCharge, nameCharge(*state.charge), at);
     if (state.camera) change("camera", &mCamera, *state.camera ? "on" : "off", at);
     if (state.voice) {
-        change("call", &mVoice, *state.voice == 0 ? "none" : std::to_string(*state.voice),
-               at);
+        change("call", &mVoice, *state.voice == 0 ? "none" : std::to_string(*state.voice), at);
     }
 }
 

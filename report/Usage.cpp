@@ -55,9 +55,10 @@ void Usage::end(int64_t at) {
     mState = {};
 }
 
-std::optional<int64_t> Usage::displayOn(Span span) const {
-    if (mDisplay.empty() || mDisplay.front().at >= span.to) return std::nullopt;
-    int64_t time = 0;
+DisplayTime Usage::displayIn(Span span) const {
+    DisplayTime time;
+    if (mDisplay.empty() || mDisplay.front().at >= span.to) return time;
+    time.known = span.to - std::max(mDisplay.front().at, span.from);
     auto change =
             std::upper_bound(mDisplay.begin(), mDisplay.end(), span.from,
                              [](int64_t at, const DisplayChange& each) { return at < each.at; });
@@ -65,9 +66,13 @@ std::optional<int64_t> Usage::displayOn(Span span) const {
     for (; change != mDisplay.end() && change->at < span.to; ++change) {
         const auto next = change + 1;
         const int64_t end = next == mDisplay.end() ? span.to : std::min(next->at, span.to);
-        if (change->isOn) time += std::max<int64_t>(end - std::max(change->at, span.from), 0);
+        if (change->isOn) time.on += end - std::max(change->at, span.from);
     }
     return time;
+}
+
+std::string formatShare(const DisplayTime& time) {
+    return time.known == 0 ? "-" : std::to_string(time.on * 100 / time.known) + " %";
 }
 
 std::string nameApp(const std::string& pkg, const std::string& opPkg) {

@@ -3,7 +3,6 @@
 #include <cstdint>
 #include <functional>
 #include <map>
-#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -35,6 +34,15 @@ struct Span {
     int64_t to;
 };
 
+/** For how much of a span the display is known, and for how much of that it was on; ns. */
+struct DisplayTime {
+    int64_t known = 0;
+    int64_t on = 0;
+};
+
+/** The share of the known time for which the display was on, as "46 %"; "-" if none is known. */
+std::string formatShare(const DisplayTime& time);
+
 /**
  * Follows which app holds which sensor, and when the display is on, through one boot of a trace.
  * Counting is a person's: a disable of what is not held means nothing.
@@ -52,8 +60,8 @@ public:
 
     const DeviceState& state() const { return mState; }
 
-    /** How long the display was on within `span`; nothing if it was never known in it. */
-    std::optional<int64_t> displayOn(Span span) const;
+    /** The display within `span`, which must not end later than the last call. */
+    DisplayTime displayIn(Span span) const;
 
 private:
     struct Held {
