@@ -156,9 +156,9 @@ private:
 
     PixelSums<Vector> mFirst;
     PixelSums<Vector> mSecond;
-    size_t mRoom = mFirst.kMaxVectors;  // for how many more in each
     ColorSums<Vector> mSums;
-    uint32_t mShort[3] = {};  // of rows shorter than a register
+    size_t mRoom = mFirst.kMaxVectors;  // for how many more in mFirst, and in mSecond
+    uint32_t mShort[3] = {};            // of rows shorter than a register
 };
 
 template <size_t VectorBytes>
