@@ -135,8 +135,7 @@ void Timeline::showStates(int64_t at) {
     if (state.charge) change("charger", &mCharge, nameCharge(*state.charge), at);
     if (state.camera) change("camera", &mCamera, *state.camera ? "on" : "off", at);
     if (state.voice) {
-        change("call", &mVoice, *state.voice == 0 ? "none" : std::to_string(*state.voice),
-               at);
+        change("call", &mVoice, *state.voice == 0 ? "none" : std::to_string(*state.voice), at);
     }
 }
 
