@@ -20,12 +20,12 @@ protected:
         flow->initDetectCount();
     }
 
-    /** A session of a/b that begins now and lasts so long. */
-    Lines playSession(double seconds) {
-        flow->setProxEnable("a", "b");
+    /** What a disable of a/b after so many seconds reports. */
+    std::string disableAfter(double seconds) {
         advanceTo(mNow += seconds * 1000);
         flow->setProxDisable("a", "b");
-        return taken();
+        const Lines lines = taken();
+        return lines.empty() ? "" : lines[0].substr(lines[0].find(' ') + 1);
     }
 
     FlowingDataException* const flow = FlowingDataException::getInstance();
@@ -85,9 +85,100 @@ TEST_F(FlowingDataExceptionTest, OnlyARecordOfSixFieldsIsLoaded) {
     }
 }
 
+TEST_F(FlowingDataExceptionTest, ACountStopsOneBeforeTheLargestNumberAndAFullOneIsNotStored) {
+    const struct {
+        const char* stored;
+        const char* once;
+        const char* twice;
+    } kCases[] = {{"2147483644", "2147483645", "2147483646"},
+                  {"2147483645", "2147483646", "2147483646"},
+                  {"2147483646", "2147483646", "2147483646"},
+                  {"2147483647", "2147483647", "2147483647"},
+                  {"-2147483648", "-2147483647", "-2147483646"},
+                  {"-1", "0", "1"}};
+    for (const auto& [stored, once, twice] : kCases) {
+        const auto record = [](const char* count) { return "0,0,0,0,0," + std::string(count); };
+        load(record(stored));
+        for (const auto& [before, after] : {std::pair(stored, once), std::pair(once, twice)}) {
+            taken();
+            flow->updateDetectCountByType(7);
+            Lines expected{std::string("0 ") + kRecord + '=' + record(after)};
+            if (before == std::string(after)) expected.clear();
+            EXPECT_EQ(taken(), expected) << before;
+        }
+    }
+    for (const int code : {-1, 1, 8, 9, 16}) flow->updateDetectCountByType(code);
+    EXPECT_EQ(taken(), Lines{});
+}
+
+TEST_F(FlowingDataExceptionTest, TheMorningsReportsPrecedeTheFirstOfTheResets) {
+    const auto reset = [](const std::string& ms) {
+        return Lines{ms + " log 3 sd resetDetectCount", ms + ' ' + kRecord + "=0,0,0,0,0,0"};
+    };
+    Lines expected{"0 N273|10003 reason:1", "0 N273|10005 reason:-3", "0 N273|10006 reason:4",
+                   "0 N273|10007 reason:5", "0 N273|10008 reason:2147483647"};
+    for (const char* ms : {"0", "2000"}) {
+        for (const std::string& line : reset(ms)) expected.push_back(line);
+    }
+    load("1,0,-3,4,5,2147483647");
+    flow->putDetectTally();
+    advanceTo(10'000);
+    EXPECT_EQ(taken(), expected);
+
+    flow->putDetectTally();
+    flow->notifyFlowReset();  // replaces all resets that wait
+    advanceTo(11'999);
+    EXPECT_EQ(taken(), Lines{});
+    flow->notifyFlowReset();
+    advanceTo(20'000);
+    EXPECT_EQ(taken(), reset("13999"));
+}
+
+TEST_F(FlowingDataExceptionTest, ACountThatFallsBetweenTheTwoResetsIsLost) {
+    flow->notifyUpdateDetectCount(5);
+    advanceTo(11'000);
+    flow->notifyUpdateDetectCount(2);
+    advanceTo(21'999);
+    flow->putDetectTally();
+    advanceTo(30'000);
+    const Lines lines = taken();
+    ASSERT_EQ(lines.size(), 7u);
+    EXPECT_EQ(lines[1], "21999 N273|10006 reason:1");
+    EXPECT_EQ(lines[4], std::string("22000 ") + kRecord + "=0,0,1,0,0,0");
+    EXPECT_EQ(lines[6], std::string("23999 ") + kRecord + "=0,0,0,0,0,0");
+}
+
+TEST_F(FlowingDataExceptionTest, AFamilysReportCanBeAskedForByItsCode) {
+    load("1,2,3,4,5,6");
+    std::map<int, const char*> events{{10, "0 N273|10003 reason:1"}, {11, "0 N273|10004 reason:2"},
+                                      {12, "0 N273|10005 reason:3"}, {13, "0 N273|10006 reason:4"},
+                                      {14, "0 N273|10007 reason:5"}, {15, "0 N273|10008 reason:6"}};
+    for (int code = -1; code < 20; ++code) {
+        flow->notifyPutTally(code);
+        EXPECT_EQ(taken(), events.count(code) > 0 ? Lines{events[code]} : Lines{}) << code;
+    }
+}
+
+TEST_F(FlowingDataExceptionTest, ASessionIsReportedIfItLastsLongerThanHalfAnHour) {
+    const auto enable = [this] { flow->setProxEnable("a", "b"); };
+    enable();
+    EXPECT_EQ(disableAfter(1800.999'999), "");
+    enable();
+    EXPECT_EQ(disableAfter(1801), "N273|10010 pkg:a/b&time:1801");
+    enable();
+    enable();
+    EXPECT_EQ(disableAfter(1801.9), "") << "still held once";
+    enable();
+    EXPECT_EQ(disableAfter(0.9), "");
+    EXPECT_EQ(disableAfter(0.9), "N273|10010 pkg:a/b&time:1802") << "a nesting cuts to seconds";
+    EXPECT_EQ(disableAfter(2000), "");
+    enable();
+    EXPECT_EQ(disableAfter(1800), "") << "nothing of the last session is left";
+}
+
 TEST_F(FlowingDataExceptionTest, SessionsOfSystemPackagesAreNotReported) {
     for (const char* name : {"com.android.incallui", "com.android.mms", "com.android.systemui",
-                             "com.android.server.telecom", "my.com.zunophone"}) {
+                             "com.android.server", "my.com.zunophone"}) {
         flow->setProxTally(name, "b", 5);
         flow->setProxTally("a", name, 5);
     }

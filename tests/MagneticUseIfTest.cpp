@@ -3,6 +3,7 @@
 #include <regex>
 #include <sstream>
 
+#include "core/Log.h"
 #include "tests/DeviceTest.h"
 
 namespace android {
@@ -151,6 +152,74 @@ TEST_F(MagneticUseIfTest, TheTotalsAreLoadedAtBootAndStoredOnlyAfterwards) {
               (Lines{"14000 persist.sys.fc_oriut=-2147483646", "14000 persist.sys.uc_oriut=4",
                      "14000 persist.sys.oc_oriut=0", "14000 persist.sys.sc_oriut=-2147483648",
                      "14000 persist.sys.total_oriut=3", "14000 persist.sys.ds_oriut=0"}));
+}
+
+TEST_F(MagneticUseIfTest, WithoutANameTheReportsAppIsUnknow) {
+    play("0 d1 0 + 0.5 -");
+    const Lines lines = taken();
+    ASSERT_EQ(lines.size(), 1u) << "a span below a second brings the report too";
+    EXPECT_NE(lines[0].find("&pkg:unknow&"), std::string::npos) << lines[0];
+}
+
+TEST_F(MagneticUseIfTest, ABucketTakesSecondsByItsNumberAndWraps) {
+    mUse->sendUsedTime(1);
+    for (const long bucket : {0L, 1L, 2L, 3L, 4L, 6L, -1L}) {
+        mUse->calCurretUseTotalTime("a", 2147483647, static_cast<int>(bucket));
+        mUse->calCurretUseTotalTime("a", bucket, static_cast<int>(bucket));
+    }
+    EXPECT_EQ(taken(), Lines{});
+    mUse->calCurretUseTotalTime("a", -5, 5);
+    EXPECT_EQ(taken().size(), 1u) << "the total's bucket reports the day";
+    EXPECT_EQ(totals(), "-2147483648 -2147483647 -2147483646 -2147483645 -5 1 ");
+}
+
+TEST_F(MagneticUseIfTest, TellsEachStepInTheLogWhileItIsOn) {
+    const auto during = [this](auto act) {
+        taken();
+        act();
+        Lines lines = taken();
+        for (std::string& line : lines) line = line.substr(line.find(' ') + 1);
+        return lines;
+    };
+    const auto all = [&] {
+        play("1 c2 1 d3 1 +a 3 c0 4 -a");
+        mUse->sendBootShutdownRebootState(1);
+        play("5 c0");
+        mUse->sendBootShutdownRebootState(3);
+        play("6 c0");
+    };
+    mLogSwitch = 1;
+    const Lines lines = during(all);
+    const Lines start{
+            "log 3 currentPCState = 2 ,mLastPCState = 0 ",
+            "log 3 mIsChargeState=1, mEnableNumbers=0, mBeginCountTime=0",
+            "log 3 uds = 3",
+            "log 3 Enable mEnableNumbers = 1",
+            "log 3 mIsChargeState=1, mEnableNumbers=1, mBeginCountTime=0",
+            "log 3 dealWithOrientationTotalTime mEnableNumbers = 1, mTotalBeginCountTime = 0",
+            "log 3 currentPCState = 0 ,mLastPCState = 2 ",
+            "log 3 mIsChargeState=0, mEnableNumbers=1, mBeginCountTime=1",
+            "log 3 tt = 2, type = 2",
+            "log 3 Disable mEnableNumbers = 0",
+            "log 3 mIsChargeState=0, mEnableNumbers=0, mBeginCountTime=0",
+            "log 3 dealWithOrientationTotalTime mEnableNumbers = 0, mTotalBeginCountTime = 1",
+            "log 3 mUD=3, mLastUD=3, mLastRUD=0",
+            "log 6 SDC Event = N273|10012",
+            "N273|10012 days:3&fastChargeTime:0&otherChargeTime:0&pkg:a&shockAndChargeTime:0"
+            "&totalTime:3&usbChargeTime:2",
+            "log 3 oritt == 3",
+            "log 3 boot state = 1"};
+    ASSERT_GT(lines.size(), start.size());
+    EXPECT_EQ(Lines(lines.begin(), lines.begin() + static_cast<long>(start.size())), start);
+    const std::string totals =
+            "mZunoFastChargeUT=0, mUsbChargeUT=2, mOtherChargeUT=0, mShockAndChargeUT=0, "
+            "mTotalOrientationUT=3, mTotalD=3";
+    EXPECT_EQ(lines[start.size()], "log 3 set " + totals);
+    EXPECT_EQ(lines[start.size() + 1], "persist.sys.fc_oriut=0");
+    EXPECT_NE(std::find(lines.begin(), lines.end(), "log 3 get " + totals), lines.end());
+
+    mLogSwitch = 0;
+    for (const std::string& line : during(all)) EXPECT_NE(line.substr(0, 4), "log ") << line;
 }
 
 TEST_F(MagneticUseIfTest, ReportsTheFiftyLongestByNameAmongEqualsAndDropsTheOthers) {

@@ -2,7 +2,6 @@
 
 #include <json/json.h>
 
-#include "core/SDCImpl.h"
 #include "tests/DeviceTest.h"
 #include "usage/RegisterConnectionList.h"
 
@@ -31,9 +30,11 @@ protected:
     }
 
     /** What the list reports, a line each: "a 10 s on 5 s at 20000" for the connection "a/a". */
-    Lines reported() {
+    Lines reported() { return reported(&mList); }
+
+    static Lines reported(RegisterConnectionList* list) {
         Lines lines;
-        const std::string text = mList.getRegisterConnectionInfo();
+        const std::string text = list->getRegisterConnectionInfo();
         EXPECT_EQ(text.find_first_of("\n\r"), std::string::npos);
         Json::Value root;
         EXPECT_TRUE(text.empty() || Json::Reader().parse(text, root));
@@ -57,6 +58,38 @@ TEST_F(RegisterConnectionListTest, CreditsTimeToWhoeverSetsTheRate) {
     disable(45.9, "a");
     EXPECT_EQ(reported(), (Lines{"b 30 s on 0 s at 5000", "a 15 s on 0 s at 20000"}));
     EXPECT_EQ(reported(), (Lines{}));
+}
+
+TEST_F(RegisterConnectionListTest, ARateMayBeAnyNumberAndTheSmallestIsTheCurrentOne) {
+    const struct {
+        long long first;
+        long long second;
+        Lines report;  // "a" from 0 s, "b" from 10 s to 30 s
+    } kCases[] = {
+            {1, 0, {"b 20 s on 0 s at 0", "a 10 s on 0 s at 1"}},
+            {0, 1, {"a 30 s on 0 s at 0"}},
+            {5, 4, {"b 20 s on 0 s at 4", "a 10 s on 0 s at 5"}},
+            {4, 5, {"a 30 s on 0 s at 4"}},
+            // -1 stands for none: any rate takes its place.
+            {-1, 5, {"b 20 s on 0 s at 5", "a 10 s on 0 s at -1"}},
+            {-2, -1, {"a 30 s on 0 s at -2"}},
+            {-2, 5, {"a 30 s on 0 s at -2"}},
+    };
+    double second = 0;
+    for (const auto& [first, other, report] : kCases) {
+        SCOPED_TRACE(std::to_string(first) + " and " + std::to_string(other));
+        RegisterConnectionList list;
+        const auto update = [&](double at, const char* pkg, bool enable, long long rate) {
+            advanceTo(kStartMs + (second + at) * 1000);
+            list.update(pkg, pkg, enable, rate);
+        };
+        update(0, "a", true, first);
+        update(10, "b", true, other);
+        update(30, "b", false, 0);
+        update(30, "a", false, 0);
+        second += 100;
+        EXPECT_EQ(reported(&list), report);
+    }
 }
 
 TEST_F(RegisterConnectionListTest, CountsEnablesOfOneConnectionAndKeepsItsFirstRate) {
@@ -123,78 +156,6 @@ TEST_F(RegisterConnectionListTest, TheResetKeepsTheCurrentRateThatNobodyHolds) {
     enable(4100, "d", 20000);
     disable(4120, "d");
     EXPECT_EQ(reported(), (Lines{"d 20 s on 0 s at 20000", "c 10 s on 0 s at 5000"}));
-}
-
-/** The facade's routes to the registrations and the sample count. */
-class SDCImplTest : public DeviceTest {
-protected:
-    void connect(double second, bool enabled, int type, const char* pkg) {
-        advanceTo(kStartMs + second * 1000);
-        mSdc->enableSuccess(enabled, type, pkg, "op", 1000);
-    }
-
-    SDCImpl* const mSdc = SDCImpl::getInstance();
-};
-
-TEST_F(SDCImplTest, RoutesFourSensorTypesToTwoDailyReports) {
-    for (int type : {0, 1, 4, 5, 16, 35, 36, -1}) {
-        const std::string pkg = "t" + std::to_string(type);
-        connect(10, true, type, pkg.c_str());
-        connect(20 + type, false, type, pkg.c_str());
-    }
-    for (int hour : {0, 7, 22, 23}) mSdc->notifySdcClock(hour);
-    EXPECT_EQ(taken(), (Lines{}));  // posted, not sent at once
-    advanceTo(60'000);
-    const Lines lines = taken();
-    ASSERT_EQ(lines.size(), 2u);
-    EXPECT_NE(lines[0].find("N273|10003 app_list:{"), std::string::npos);
-    EXPECT_NE(lines[0].find("\"t1/op\""), std::string::npos);
-    EXPECT_NE(lines[0].find("\"t35/op\""), std::string::npos);
-    EXPECT_NE(lines[1].find("N273|10004 app_list:{"), std::string::npos);
-    EXPECT_NE(lines[1].find("\"t4/op\""), std::string::npos);
-    EXPECT_NE(lines[1].find("\"t16/op\""), std::string::npos);
-}
-
-TEST_F(SDCImplTest, ACleanUpIsADisable) {
-    connect(0, true, 1, "pkg");
-    mSdc->enableSuccess(true, 1, "slow", "op", (1LL << 32) + 1);  // in 32 bits it would be faster
-    advanceTo(kStartMs + 5000);
-    mSdc->cleanupConnection(String8("pkg"), String8("op"), 1);
-    mSdc->notifySdcClock(23);
-    advanceTo(kStartMs + 6000);
-    EXPECT_EQ(taken().size(), 1u);
-}
-
-TEST_F(SDCImplTest, AResetThatFollowsItsTickAtOnceOvertakesTheReport) {
-    for (int type : {1, 4}) connect(0, true, type, "pkg");
-    for (int type : {1, 4}) connect(10, false, type, "pkg");
-    mSdc->notifySdcReset(22);
-    mSdc->notifySdcClock(23);
-    mSdc->notifySdcReset(23);
-    advanceTo(20'000);
-    EXPECT_EQ(taken(), (Lines{"11000 persist.zuno.wechat.count.info=0_0_0_0"}));
-}
-
-TEST_F(SDCImplTest, TakesTheDisplayStateFromWholeNotificationsOfItsKind) {
-    const auto notify = [this](std::initializer_list<int> values) {
-        Vector<int> list;
-        for (int value : values) list.add(value);
-        mSdc->setNotification(list);
-    };
-    for (int type : {1, 4}) connect(0, true, type, "pkg");
-    notify({});
-    notify({2, 0});
-    notify({2, 0, 2});
-    advanceTo(kStartMs + 10'000);
-    notify({3, 0, 1});
-    advanceTo(kStartMs + 20'000);
-    notify({2, 7, 1, 9});
-    for (int type : {1, 4}) connect(30, false, type, "pkg");
-    mSdc->notifySdcClock(23);
-    advanceTo(40'000);
-    for (const std::string& line : taken()) {
-        EXPECT_NE(line.find("\"ontime\" : \"20\""), std::string::npos) << line;
-    }
 }
 
 }  // namespace

@@ -118,6 +118,16 @@ TEST_F(ReplayTest, AProcessBootKeepsTheClockAndThePropertiesADeviceBootOnlyWhatP
     EXPECT_EQ(played.out, joined({boot("0", "device"), saved("1500", 1), boot("1500", "process"),
                                   boot("1500", "process"), reported("3500", 1), boot("7", "device"),
                                   reported("8", 0)}));
+
+    const std::string set =
+            line("0", R"("property": {"sys.x": "1", "ro.x": "2", "persist.x": "3"})");
+    for (const auto& [kind, kept] : {std::pair("process", "123"), std::pair("device", "23")}) {
+        write("trace", joined({set, boot("0", kind)}));
+        EXPECT_EQ(run("--properties store trace").status, 0);
+        std::string stored;
+        for (const char* name : {"sys.x", "ro.x", "persist.x"}) stored += storedIn("store", name);
+        EXPECT_EQ(stored, kept) << kind;
+    }
 }
 
 TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {

@@ -1,8 +1,8 @@
 #include "rgb/RgbShotManager.h"
 
-#include <algorithm>
+#include <cmath>
 #include <functional>
-#include <random>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -47,9 +47,36 @@ protected:
         return *managers->back();
     }
 
+    /** A step of a course, see below. */
+    void take(RgbShotManager* manager, const std::string& step) {
+        const std::string rest = step.substr(1);
+        const int number = rest.empty() ? 0 : std::stoi(rest);
+        switch (step[0]) {
+            case '+':
+                return manager->setRgbShotDelay(number, std::stoi(rest.substr(rest.find('@') + 1)));
+            case '=':
+                return manager->setRgbShot(number);
+            case 'c':
+                return manager->clearQueue();
+            case '?':
+                EXPECT_EQ(allowedNow(manager), number);
+                return;
+            case 'y':
+            case 'n':
+                EXPECT_EQ(manager->allowRgbShot(), step == "y");
+                return;
+            default:
+                EXPECT_EQ(manager->stopRgbThread(), step == ".");
+        }
+    }
+
     /** How many samples are allowed at `ms`, at most 100. */
     int allowedAt(double ms, RgbShotManager* manager) {
         advanceTo(ms);
+        return allowedNow(manager);
+    }
+
+    static int allowedNow(RgbShotManager* manager) {
         int count = 0;
         while (count < 100 && manager->allowRgbShot()) ++count;
         return count;
@@ -192,68 +219,54 @@ TEST_F(RgbShotManagerTest, TheClockWrapsAt32Bits) {
     }
 }
 
-/** What a manager should do, in the plainest way: a list to search. */
-struct Model {
-    std::vector<std::pair<long long, int>> queue;
-    std::vector<std::pair<long long, int>> pending;  // at most one
-    int budget = 0;
-
-    void schedule(long long ms, int delayMs, int shots) {
-        queue.emplace_back(static_cast<long long>(static_cast<int32_t>(ms)) + delayMs, shots);
-    }
-
-    void raise(int shots) { budget = std::max(budget, shots); }
-
-    bool allow(long long ms) {
-        if (pending.empty() && !queue.empty()) {
-            const auto first = std::min_element(queue.begin(), queue.end());
-            pending.push_back(*first);
-            queue.erase(first);
-        }
-        if (!pending.empty() && pending[0].first < static_cast<int32_t>(ms)) {
-            raise(pending[0].second);
-            pending.clear();
-        }
-        return budget > 0 && budget-- > 0;
-    }
+struct Course {
+    const char* name;
+    double start;  // in ms of the manager's clock, as if it counted from 0 to 2^32
+    const char* steps;
 };
 
-TEST_F(RgbShotManagerTest, AgreesWithAPlainModelAlsoAcrossTheClocksWrap) {
-    std::mt19937 random(1);
-    const auto below = [&](unsigned limit) { return static_cast<int>(random() % limit); };
-    for (const long long wrap : {1LL << 31, 1LL << 32}) {
-        long long ms = wrap - 15'000;
+/** Where the clock turns negative. It comes back to 0 at twice this. */
+constexpr double kTurn = 2147483648;
+
+TEST_F(RgbShotManagerTest, AQueuedEntryIsTakenInOrderAndBecomesDueAlone) {
+    // Pairs of a time after the start and a step: "+3@50" queues 3 samples for 50 ms later, "=2"
+    // raises the budget to 2, "c" clears the queue, "?4" finds 4 samples allowed, "y" and "n" ask
+    // for one, "." and "!" find that the sampling may end or not.
+    const Course kCourses[] = {
+            {"an entry is due after its time", 0, "0 . 0 +3@50 0 ! 50 n 51 ?3 52 ."},
+            {"an earlier one waits for the pending one", 0,
+             "0 +5@100 0 n 0 +3@50 60 n 99 n 101 y 101 ?4 102 ."},
+            {"an earlier one is taken first if none is pending", 0,
+             "0 +5@100 0 +3@50 60 ?3 60 ! 101 ?5 102 ."},
+            {"of equal times the smaller budget comes first", 0, "0 +5@10 0 +1@10 11 ?6"},
+            {"equal entries are both kept", 0, "0 +2@10 0 +2@10 11 y 11 y 11 y 11 n"},
+            {"a raise does not add", 0, "0 =5 0 +3@0 1 ?5 1 =1 1 =3 1 ?3"},
+            {"a budget below what is there changes nothing", 0, "0 =2 0 =-9 0 =0 0 ?2"},
+            {"no samples and fewer grant nothing", 0, "0 +0@1 0 +-3@1 5 n 5 n 5 ."},
+            {"a clear leaves the pending one and the budget", 0,
+             "0 =1 0 +2@9 0 +4@20 0 y 0 c 5 n 10 ?2 30 n 30 ."},
+            {"a clear without a pending one leaves nothing", 0, "0 +2@9 0 c 0 . 30 n"},
+            {"a delay may be negative", 0, "0 +2@-1 0 ?2"},
+            {"nothing happens as the clock reaches its end", kTurn - 100, "0 +3@50 51 ?3 99 ."},
+            {"a time beyond the end of the clock never comes", kTurn - 100,
+             "0 +3@200 0 n 300 n 4000000000 n 9000000000 n 9000000000 !"},
+            {"what is due before the end comes a whole turn later", kTurn - 100,
+             "0 +3@50 0 n 101 n 1000 n 4294967346 n 4294967347 ?3"},
+            {"times of the negative clock are as good", kTurn, "0 +3@50 0 n 50 n 51 ?3"},
+            {"zero is a time like others", 2 * kTurn - 25, "0 +3@50 50 n 51 ?3 52 ."},
+    };
+    double ms = 0;
+    for (const Course& course : kCourses) {
+        const double turns = std::ceil((ms - course.start) / (2 * kTurn));
+        const double start = turns * 2 * kTurn + course.start;
         RgbShotManager& manager = newManager();
-        Model model;
-        for (int step = 0; step < 10'000; ++step) {
-            if (below(4) == 0) ms += below(step % 2 == 0 ? 40 : 4);
-            advanceTo(static_cast<double>(ms));
-            const int shots = below(5) - 1;
-            const int delayMs = below(400) - 20;
-            switch (below(8)) {
-                case 0:
-                    manager.setRgbShotDelay(shots, delayMs);
-                    model.schedule(ms, delayMs, shots);
-                    break;
-                case 1:
-                    manager.policyChange();
-                    model.schedule(ms, 200, 5);
-                    break;
-                case 2:
-                    manager.setRgbShot(shots);
-                    model.raise(shots);
-                    break;
-                case 3:
-                    if (below(20) != 0) break;
-                    manager.clearQueue();
-                    model.queue.clear();
-                    break;
-                default:
-                    ASSERT_EQ(manager.allowRgbShot(), model.allow(ms)) << step << " at " << ms;
-            }
-            ASSERT_EQ(manager.isEmpty(), model.queue.empty()) << step << " at " << ms;
-            ASSERT_EQ(manager.stopRgbThread(),
-                      model.budget <= 0 && model.queue.empty() && model.pending.empty());
+        std::istringstream steps(course.steps);
+        double after = 0;
+        std::string step;
+        while (steps >> after >> step) {
+            SCOPED_TRACE(std::string(course.name) + ": " + std::to_string(after) + ' ' + step);
+            advanceTo(ms = start + after);
+            take(&manager, step);
         }
     }
 }

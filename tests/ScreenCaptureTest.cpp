@@ -1,9 +1,14 @@
 #include <algorithm>
 #include <array>
+#include <csignal>
 #include <random>
+#include <string>
+#include <utility>
 
 #include <binder/Status.h>
+#include <dlfcn.h>
 #include <gui/SurfaceComposerClient.h>
+#include <ui/GraphicBuffer.h>
 
 #include "core/Log.h"
 #include "platform/Display.h"
@@ -11,7 +16,47 @@
 #include "rgb/SyncScreenCaptureListener.h"
 #include "tests/DeviceTest.h"
 
+namespace {
+
+/** The last request for a capture, and what was done to its buffer: "lock 3 unlock ". */
+android::DisplayCaptureArgs request;
+std::string buffered;
+
+template <typename Function>
+Function* platforms(const char* name) {
+    return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
+}
+
+}  // namespace
+
 namespace android {
+
+// These stand before the platform's own.
+
+status_t ScreenshotClient::captureDisplay(const DisplayCaptureArgs& args,
+                                          const sp<IScreenCaptureListener>& listener) {
+    static auto* const next = platforms<decltype(captureDisplay)>(
+            "_ZN7android16ScreenshotClient14captureDisplayERKNS_18DisplayCaptureArgsE"
+            "RKNS_2spINS_3gui22IScreenCaptureListenerEEE");
+    request = args;
+    return next(args, listener);
+}
+
+status_t GraphicBuffer::lock(uint32_t usage, void** base, int32_t* pixel, int32_t* row) {
+    static auto* const next =
+            platforms<status_t(GraphicBuffer*, uint32_t, void**, int32_t*, int32_t*)>(
+                    "_ZN7android13GraphicBuffer4lockEjPPvPiS3_");
+    buffered += "lock " + std::to_string(usage) + ' ';
+    return next(this, usage, base, pixel, row);
+}
+
+status_t GraphicBuffer::unlock() {
+    static auto* const next =
+            platforms<status_t(GraphicBuffer*)>("_ZN7android13GraphicBuffer6unlockEv");
+    buffered += "unlock ";
+    return next(this);
+}
+
 namespace {
 
 using platform::changeDisplay;
@@ -79,6 +124,38 @@ TEST_F(ScreenCaptureTest, AveragesAnyRectangleOfAPicture) {
     }
 }
 
+TEST_F(ScreenCaptureTest, AsksForTheRectangleWithAllItsLayersUnscaled) {
+    EXPECT_EQ(sample({20, 10, 53, 54}), Rgb{});
+    EXPECT_EQ(request.displayToken, SurfaceComposerClient::getInternalDisplayToken());
+    EXPECT_EQ(request.sourceCrop.left, 20);
+    EXPECT_EQ(request.sourceCrop.top, 10);
+    EXPECT_EQ(request.sourceCrop.right, 53);
+    EXPECT_EQ(request.sourceCrop.bottom, 54);
+    EXPECT_EQ(request.width, 33u);
+    EXPECT_EQ(request.height, 44u);
+    EXPECT_TRUE(request.captureSecureLayers && request.useIdentityTransform);
+    EXPECT_FALSE(request.allowProtected || request.grayscale);
+    EXPECT_EQ(request.pixelFormat, ui::PixelFormat::RGBA_8888);
+    EXPECT_EQ(request.frameScaleX * request.frameScaleY, 1);
+    EXPECT_EQ(request.uid, -1);
+    EXPECT_EQ(buffered, "lock 3 unlock ");
+}
+
+TEST_F(ScreenCaptureTest, OnlyARectangleOfFourZerosIsNoScope) {
+    DisplayChange change;
+    change.color = {200, 100, 52};
+    changeDisplay(change);
+    EXPECT_EQ(sample({0, 0, 0, 0}), kUntouched);
+    EXPECT_EQ(sample({-1, 0, 1, 1}), (Rgb{100, 50, 26}));
+    EXPECT_EQ(sample({0, -1, 1, 1}), (Rgb{100, 50, 26}));
+    EXPECT_EQ(sample({-1, -1, 0, 0}), Rgb{});
+    EXPECT_EQ(taken(), (Lines{"0 log 3 ic scope is 0. not support pixcel"}));
+    for (Rectangle rect : {Rectangle{0, 0, 1, 0}, Rectangle{0, 0, 0, 1}}) {
+        EXPECT_EQ(sample(rect), kUntouched);
+        EXPECT_EQ(taken(), (Lines{"0 log 6 UL: captureDisplay failed!"}));
+    }
+}
+
 TEST_F(ScreenCaptureTest, CountsAndLogsASample) {
     DisplayChange change;
     change.color = {200, 100, 50};
@@ -123,6 +200,8 @@ TEST_F(ScreenCaptureTest, AFailureIsLoggedLeavesTheOutputAndCountsNothing) {
         changeDisplay(change);
         EXPECT_EQ(sample(rect), kUntouched);
         EXPECT_EQ(taken(), Lines{log});
+        EXPECT_EQ(std::exchange(buffered, ""),
+                  fault == DisplayFault::kLock ? "lock 3 unlock " : "");
     }
     advanceTo(1000);
     EXPECT_EQ(property(kCount), "");
@@ -143,8 +222,11 @@ TEST_F(ScreenCaptureTest, AListenerServesOneCapture) {
         EXPECT_EQ(listener->waitForResults().result, OK);
         use(listener);
     };
-    EXPECT_DEATH(useTwice([](const auto& l) { l->onScreenCaptureCompleted({}); }), "");
-    EXPECT_DEATH(useTwice([](const auto& l) { l->waitForResults(); }), "");
+    const auto aborts = ::testing::KilledBySignal(SIGABRT);
+    EXPECT_EXIT(useTwice([](const auto& l) { l->onScreenCaptureCompleted({}); }), aborts,
+                "terminate called");
+    EXPECT_EXIT(useTwice([](const auto& l) { l->waitForResults(); }), aborts,
+                "Future already retrieved");
 }
 
 TEST_F(ScreenCaptureTest, APictureGivesTheDisplayItsSizeUntilAColorOrASizeEndsIt) {

@@ -105,6 +105,16 @@ TEST_F(SensorHandlerThreadTest, AfterQuittingNothingIsDelivered) {
     EXPECT_FALSE(mThread->isRunning());
 }
 
+TEST_F(SensorHandlerThreadTest, EndsAtTheNextWakeOnceItsExitIsRequested) {
+    advanceTo(0);
+    mThread->requestExit();
+    EXPECT_TRUE(mThread->isRunning());
+    mThread->sendMessageDelayed(mA, 1, 100);
+    advanceTo(1000);
+    EXPECT_EQ(mLines, Lines{});
+    EXPECT_FALSE(mThread->isRunning());
+}
+
 /** Creates no thread; 0 is the failure. */
 int createNoThread(android_thread_func_t, void*, const char*, int32_t, size_t,
                    android_thread_id_t*) {

@@ -6,12 +6,13 @@
 
 #include <unistd.h>
 
+#include "core/Log.h"
 #include "platform/PropertyService.h"
 #include "tests/DeviceTest.h"
 
 namespace {
 
-/** How often the library napped; the boot animation ends during the third nap. */
+/** How often the library napped; the boot animation ends during the fifth nap. */
 int naps = 0;
 
 }  // namespace
@@ -25,7 +26,7 @@ extern "C" int usleep(useconds_t us) {
         const timespec time{0, static_cast<long>(us) * 1000};
         return nanosleep(&time, nullptr);
     }
-    constexpr const char* kStates[] = {"0", "unkown", "1"};
+    constexpr const char* kStates[] = {"0", "unkown", "2", "-1", " 1x"};
     platform::setDeviceProperty("service.bootanim.exit", kStates[naps++]);
     return 0;
 }
@@ -43,6 +44,25 @@ TEST_F(TallyCommonTest, SendsPairsInBytewiseOrderOfTheirKeysUnescaped) {
     mTally->trackEvent("N273|10009", {{"count", "3"}});
     EXPECT_EQ(taken(), (Lines{"0 N273|10013 10:ten&9:nine&Z:&a:1:2&3", "0 N273|10009 count:3"}));
     EXPECT_EQ(mTally->convertMapToTally({}), "");
+}
+
+TEST_F(TallyCommonTest, NamesAnEventInTheLogBeforeItIsSentWhileTheLogIsOn) {
+    for (const int isOn : {0, 1, -2}) {
+        mLogSwitch = isOn;
+        mTally->setTally({"N273|1", "x"});
+        Lines expected{"0 log 6 SDC Event = N273|1", "0 N273|1 x"};
+        if (isOn == 0) expected.erase(expected.begin());
+        EXPECT_EQ(taken(), expected) << isOn;
+    }
+}
+
+TEST_F(TallyCommonTest, WritesEveryNumberInDecimal) {
+    EXPECT_EQ(mTally->intToStr(std::numeric_limits<int>::min()), "-2147483648");
+    EXPECT_EQ(mTally->intToStr(std::numeric_limits<int>::max()), "2147483647");
+    EXPECT_EQ(mTally->longToStr(0), "0");
+    for (const long value : {std::numeric_limits<long>::min(), -1L}) {
+        EXPECT_EQ(mTally->longToStr(value), std::to_string(value));
+    }
 }
 
 TEST_F(TallyCommonTest, CutsATextAtItsDelimiterAndKeepsEmptyPieces) {
@@ -75,10 +95,10 @@ TEST_F(TallyCommonTest, CutsATextThatLiesWhereThePiecesGoAsItsDelimiterMay) {
 
 TEST_F(TallyCommonTest, WaitsForTheEndOfTheBootAnimationOnce) {
     mTally->BootNotFinish();
-    EXPECT_EQ(naps, 3);
+    EXPECT_EQ(naps, 5);
     setProperty("service.bootanim.exit", "0");
     mTally->BootNotFinish();
-    EXPECT_EQ(naps, 3);
+    EXPECT_EQ(naps, 5);
 }
 
 }  // namespace

@@ -47,15 +47,113 @@ TEST_F(UltraExceptionTest, EnergiesAreCutToWholeNumbers) {
             {301, 2147483648, "2147483647/0"},
             {302, -kInfinity, "2147483647/-2147483648"},
     };
+    std::vector<Lines> logged;
     for (const auto& [marker, energy, energies] : cases) {
         sensors_event_t event{};
         event.data[3] = marker;
         event.data[4] = energy;
         ultra->setUltraEnergy(event);
+        logged.push_back(taken());
         ultra->trackEvent("N273|10011", -5, -6);
         EXPECT_EQ(taken().back(),
                   std::string("2000 N273|10011 TempInvalidRate:-6/0&pkg:unknown&ultraEnergy:") +
                           energies + "&ultraExpired:-5");
+    }
+    EXPECT_EQ(logged[0], (Lines{"2000 log 3 mBackgroundEnergy: 55"}));
+    EXPECT_EQ(logged[1], (Lines{"2000 log 3 mFluctuantEnergy: -12"}));
+    EXPECT_EQ(logged[2], Lines{});
+    mLogSwitch = 0;
+    for (const float marker : {301.0F, 302.0F}) {
+        sensors_event_t event{};
+        event.data[3] = marker;
+        event.data[4] = 7;
+        ultra->setUltraEnergy(event);
+    }
+    EXPECT_EQ(taken(), Lines{});
+    ultra->resetUltraStatus();
+    ultra->trackEvent("", 0, 0);
+    EXPECT_EQ(taken(),
+              (Lines{"2000  TempInvalidRate:0/0&pkg:unknown&ultraEnergy:0/0&ultraExpired:0"}));
+}
+
+TEST_F(UltraExceptionTest, EachCountIsLoadedFromItsPropertyAfterTwoSeconds) {
+    const char* const kNames[] = {"ultra.enable",   "ultra.invalid", "ultra.phone.enable",
+                                  "device.invalid", "route.invalid", "rx.close"};
+    int value = 10;
+    for (const char* name : kNames) {
+        setProperty(std::string("persist.zuno.") + name + ".count", std::to_string(++value));
+    }
+    UltraException* ultra = UltraException::getInstance();
+    advanceTo(1999.999);
+    EXPECT_EQ(taken(), Lines{});
+    advanceTo(2000);
+    EXPECT_EQ(taken(), (Lines{"2000 log 3 PF, enable:11 device:14 route:15 close:16."}));
+    act(RX_CLOSED);
+    EXPECT_EQ(taken(), (Lines{"2000 N273|10011 TempInvalidRate:17/11&pkg:unknown&ultraEnergy:0/0"
+                              "&ultraExpired:102",
+                              "2000 persist.zuno.rx.close.count=17"}));
+    ultra->putPhoneOpenUltraTally();
+    ultra->doAction(PHONE_STATE, {"", 1});  // overtaken by nothing
+    advanceTo(2000);
+    EXPECT_EQ(taken(), (Lines{"2000 N273|10011 TempInvalidRate:12/13&pkg:unknown&ultraEnergy:0/0"
+                              "&ultraExpired:103",
+                              "2000 persist.zuno.ultra.phone.enable.count=0",
+                              "2000 persist.zuno.ultra.invalid.count=0"}));
+    ultra->putPhoneOpenUltraTally();
+    advanceTo(3000);
+    EXPECT_EQ(taken(), Lines{}) << "no call, no report and no reset";
+}
+
+TEST_F(UltraExceptionTest, TheDaysReportLeavesItsResetToTheWorkerBehindWhatWaits) {
+    UltraException* ultra = loaded();
+    setProperty("persist.zuno.ultra.phone.enable.count", "-3");
+    ultra->initUltraSoundCount();
+    act(ENABLED, {kInCall, 0});
+    taken();
+    ultra->doAction(ROUTE_INVALID, {});
+    ultra->putPhoneOpenUltraTally();
+    ultra->putPhoneOpenUltraTally();
+    advanceTo(2000);
+    const std::string end = std::string("&pkg:") + kInCall + "&ultraEnergy:0/0&ultraExpired:";
+    const std::string daily = "2000 N273|10011 TempInvalidRate:0/-3" + end + "103";
+    const std::string calls = "2000 persist.zuno.ultra.phone.enable.count=0";
+    const std::string failed = "2000 persist.zuno.ultra.invalid.count=";
+    EXPECT_EQ(taken(), (Lines{daily, daily, failed + "1",
+                              "2000 N273|10011 TempInvalidRate:1/1" + end + "100",
+                              "2000 persist.zuno.route.invalid.count=1", calls, failed + "0", calls,
+                              failed + "0"}));
+}
+
+TEST_F(UltraExceptionTest, ACountOfFailuresStopsOneBeforeTheLargestNumber) {
+    constexpr char kRoute[] = "persist.zuno.route.invalid.count";
+    const struct {
+        const char* stored;
+        const char* once;
+        const char* twice;
+    } kCases[] = {{"2147483644", "2147483645", "2147483646"},
+                  {"2147483645", "2147483646", "2147483646"},
+                  {"2147483647", "2147483647", "2147483647"},
+                  {"-2147483648", "-2147483647", "-2147483646"}};
+    UltraException* ultra = loaded();
+    for (const auto& [stored, once, twice] : kCases) {
+        for (const char* name : {"ultra.enable", "route.invalid", "ultra.invalid"}) {
+            setProperty(std::string("persist.zuno.") + name + ".count", stored);
+        }
+        ultra->initUltraSoundCount();
+        for (const auto& [before, after] : {std::pair(stored, once), std::pair(once, twice)}) {
+            taken();
+            act(PHONE_STATE, {"", 0});  // another call
+            act(ENABLED, {kInCall, 0});
+            act(ROUTE_INVALID);
+            Lines expected{std::string("2000 persist.zuno.ultra.enable.count=") + after};
+            if (before != std::string(after)) {
+                expected.push_back(std::string("2000 persist.zuno.ultra.invalid.count=") + after);
+                expected.push_back(std::string("2000 N273|10011 TempInvalidRate:") + after + '/' +
+                                   after + "&pkg:" + kInCall + "&ultraEnergy:0/0&ultraExpired:100");
+                expected.push_back(std::string("2000 ") + kRoute + '=' + after);
+            }
+            EXPECT_EQ(taken(), expected);
+        }
     }
 }
 
@@ -114,6 +212,11 @@ TEST_F(UltraExceptionTest, ACallUsesTheSensorIfAnAppIsKnownOrEnablesItMeanwhile)
     begin();
     end();
     EXPECT_EQ(taken(), (Lines{kEnables + "3"}));
+
+    act(ENABLED, {"unknown.app", 0});
+    begin();
+    end();
+    EXPECT_EQ(taken(), (Lines{kEnables + "4", kCalls + "3"}));
 }
 
 TEST_F(UltraExceptionTest, FullCountsStayButTheCallsWrap) {

@@ -103,6 +103,8 @@ const Call kCalls[] = {
         {"0 v0 100 + 200 D 300 d 1000 p0 3000 -", {}, "0_0_0_0"},
         {"0 v3 100 + 200 D 300 d 1000 p0 3000 -", {}, "0_0_0_0"},
         {"0 v1 0 s1 100 + 200 D 300 d 1000 p0 3000 -", {}, "0_0_0_0"},
+        {"0 v2 0 s2 100 + 200 D 300 d 1000 p0 3000 -", {"1500 0.000000"}, "1_1_1_1"},
+        {"0 v-1 100 + 200 D 300 d 1000 p0 3000 -", {}, "0_0_0_0"},
         {"0 v1 100 p0 150 D 200 d 200 + 300 D 310 D 320 d 400 - 500 D", {}, "0_0_2_0"},
         {"0 v1 100 + 200 p0 200 p0.9 200 p-0.9 200 pnan 200 p5.9 200 p5 200 p0 210 p5 300 -",
          {},
@@ -114,6 +116,7 @@ const Call kCalls[] = {
         {"0 v1 100 + 1000 p0 1250 D 1350 d 3000 -", {}, "1_0_1_1"},
         {"0 v1 100 + 1000 p0 1150 p5 1190 p3 3000 -", {}, "1_0_0_1"},
         {"0 v1 100 + 1000 p0 1020 p3e9 1040 p0 3000 -", {"1540 0.000000"}, "1_1_0_2"},
+        {"0 v1 100 + 1000 p0 1250 p3 1260 p0 3000 -", {"1760 0.000000"}, "1_1_0_2"},
         // One report a session; a second end counts its session again.
         {"0 v1 100 + 1000 p0 2000 p5 2100 p0 3000 - 3000 -", {"1500 0.000000"}, "2_2_0_2"},
         {"0 v1 100 + 1000 p0 2000 - 2000 + 2100 p0 3000 - 3000 + 3000 -",
@@ -124,6 +127,7 @@ const Call kCalls[] = {
         {"0 v1 100 a7 100 + 200 a1 220 a20 220.000001 a3 1000 p0 3000 -",
          {"1500 1.000000"},
          "1_1_0_1"},
+        {"0 v1 100 + 200 p-7 220 a1 240.000001 a3 1000 p0 3000 -", {"1500 1.000000"}, "1_1_0_1"},
         {"0 v1 100 + 200 a1 300 p5 400 a3 500 a5 1000 p0 3000 -", {"1500 1.000000"}, "1_1_0_1"},
         {"0 v1 2100 + 2200 a1 2300 a3 2400 - 2400 + 2500 a3 3000 p0 5000 -",
          {"3500 0.000000"},
@@ -164,7 +168,7 @@ TEST_F(WechatProxExceptionTest, TheDayIsReportedUnlessTheResetOvertakesTheReport
     advanceTo(2000);
     mMonitor->notifyDayNight();
     mMonitor->notifyDayNight();
-    play("2000 + 2000 - 2000 - 3000 +");
+    play("2000 + 2000 - 2000 - 3000 +");  // one save for both ends
     const std::string report =
             "2000 N273|10013 invalid:1&status:{\t\"lock\" : \"7\",\t\"near\" : \"12\"}&total:3";
     EXPECT_EQ(taken(), (Lines{report, report, std::string("2000 ") + kRecord + "=3_1_7_12"}));
@@ -174,6 +178,22 @@ TEST_F(WechatProxExceptionTest, TheDayIsReportedUnlessTheResetOvertakesTheReport
     mMonitor->resetWechatCount();
     advanceTo(3000);
     EXPECT_EQ(taken(), (Lines{std::string("3000 ") + kRecord + "=0_0_0_0"}));
+}
+
+TEST_F(WechatProxExceptionTest, CountersWrapAndEveryTotalButZeroIsReported) {
+    setProperty(kRecord, "2147483647_2147483646_2147483647_2147483647");
+    advanceTo(2000);
+    play("2000 v1 2000 + 2000 D 2000 d 2000 p0 4000 -");
+    mMonitor->notifyDayNight();
+    play("5000 v1");
+    const Lines lines = taken();
+    ASSERT_EQ(lines.size(), 3u);
+    EXPECT_EQ(lines[1],
+              std::string("4000 ") + kRecord + "=-2147483648_2147483647_-2147483648_-2147483648");
+    EXPECT_EQ(
+            lines[2],
+            "4000 N273|10013 invalid:2147483647&status:{\t\"lock\" : \"-2147483648\",\t\"near\" : "
+            "\"-2147483648\"}&total:-2147483648");
 }
 
 TEST_F(WechatProxExceptionTest, AStoredRecordIsTakenIfItHasFourPieces) {
