@@ -7,7 +7,7 @@ BUILD_PACKAGES='g++ cmake ninja-build pkg-config android-libutils-dev android-li
 
 # To test them as well. llvm-14 has the symbolizer, by which sanitizers know what is suppressed.
 TEST_PACKAGES='clang-14 libclang-rt-14-dev clang-format-14 clang-tidy-14 libgtest-dev
-    llvm-14 g++-arm-linux-gnueabihf qemu-user chromium dpkg-dev file lintian'
+    llvm-14 g++-arm-linux-gnueabihf qemu-user chromium dpkg-dev file lintian sqlite3'
 
 # To measure them.
 BENCH_PACKAGES='libbenchmark-dev jq'
