@@ -1,0 +1,184 @@
+#include <algorithm>
+#include <cstdio>
+#include <fstream>
+#include <iterator>
+#include <string>
+#include <utility>
+
+#include "tests/ReplayTool.h"
+
+namespace {
+
+constexpr char kCapture[] = EXAMPLES "/registrations.capture.txt";
+constexpr char kThreeBoots[] = EXAMPLES "/three-boots.jsonl";
+constexpr char kReport[] = R"({"at": 0, "call": "SDCImpl.putRgbShotTally", "args": [7]})"
+                           "\n";
+
+size_t count(const std::string& text, const std::string& part) {
+    size_t number = 0;
+    for (size_t at = text.find(part); at != text.npos; at = text.find(part, at + 1)) ++number;
+    return number;
+}
+
+std::string contents(const std::string& file) {
+    std::ifstream stream(file);
+    return {std::istreambuf_iterator<char>(stream), {}};
+}
+
+class ReplayOutputTest : public ReplayToolTest {
+protected:
+    ReplayOutputTest() {
+        write("good", kReport);
+        write("bad", std::string(kReport) + "{}\n" + kReport);
+    }
+};
+
+TEST_F(ReplayOutputTest, EachKindOfLineIsLaidOutForAPerson) {
+    write("trace", R"({"at": 59999, "set": {"mLogSwitch": 1}}
+{"at": 61001, "call": "RgbShotManager.stopRgbThread"}
+{"at": 3661002.000001, "call": "FlowingDataException.notifyBootCompleted"}
+{"at": 90061003.5, "call": "FlowingDataException.setSensorException", "args": [2, -5]}
+{"at": 90061003.5, "call": "UltraException.doAction", "args": [3, {"packageName": "é\t b\u0001\u007f\n  c\\\u001b[1m"}]}
+{"at": 90061004, "call": "UltraException.doAction", "args": [4, {}]}
+)");
+    EXPECT_EQ(run("--log trace").out,
+              "day 1 00:00:59.999  boot      device\n"
+              "day 1 00:01:01.001  log       I UL: isTestMode = 0\n"
+              "day 1 00:01:01.001  result    RgbShotManager.stopRgbThread = true\n"
+              "day 1 01:01:01.002000001  log       D sd resetDetectCount\n"
+              "day 1 01:01:01.002000001  property  persist.zuno.flow.detect.count = 0,0,0,0,0,0\n"
+              "day 2 01:01:01.003500000  log       E SDC Event = N273|10005\n"
+              "day 2 01:01:01.003500000  event     N273|10005 reason:-5\n"
+              "day 2 01:01:01.003500000  property  persist.zuno.ultra.enable.count = 1\n"
+              "day 2 01:01:01.004  log       E SDC Event = N273|10011\n"
+              "day 2 01:01:01.004  event     N273|10011 TempInvalidRate:1/1&pkg:é b??? c\\?[1m"
+              "&ultraEnergy:0/0&ultraExpired:101\n"
+              "day 2 01:01:01.004  property  persist.zuno.device.invalid.count = 1\n");
+}
+
+TEST_F(ReplayOutputTest, ABadFileEndsTheReplayAndKeepsWhatCameBefore) {
+    write("noCapture", "no capture\n");
+    const std::string capture = kCapture;
+    const struct {
+        std::string files;
+        size_t boots;
+        size_t reports;
+        const char* error;
+    } kCases[] = {
+            {"good good", 2, 2, ""},
+            {"good bad good", 2, 2, "bad:2: "},
+            {"good good bad", 3, 3, "bad:2: "},
+            {"bad good", 1, 1, "bad:2: "},
+            {"good missing good", 1, 1, "missing: cannot open"},
+            {"good good missing", 2, 2, "missing: cannot open"},
+            {"noCapture good", 0, 0, "noCapture"},
+            {"good noCapture good", 1, 1, "noCapture"},
+            {capture + " good bad " + capture, 3, 3, "bad:2: "},
+            {capture + ' ' + capture + " noCapture " + capture + " good", 2, 2, "noCapture"},
+            {capture + " noCapture", 1, 1, "noCapture"},
+    };
+    for (const auto& [files, boots, reports, error] : kCases) {
+        const Played one = run("--json --jobs 1 " + files);
+        EXPECT_EQ(one.status, *error == '\0' ? 0 : 2) << files;
+        EXPECT_EQ(count(one.out, R"("boot": "device")"), boots) << files << '\n' << one.out;
+        EXPECT_EQ(count(one.out, "N273|10009"), reports) << files;
+        EXPECT_EQ(count(one.out, ", \"file\": "), count(one.out, "\n")) << files;
+        EXPECT_NE(one.err.find(error), std::string::npos) << one.err;
+        const Played three = run("--json --jobs 3 " + files);
+        EXPECT_EQ(three.status, one.status) << files;
+        EXPECT_EQ(three.out, one.out) << files;
+        EXPECT_EQ(three.err, one.err) << files;
+    }
+}
+
+TEST_F(ReplayOutputTest, WrongArgumentsAreRefusedBeforeAnythingIsPlayed) {
+    for (const char* arguments :
+         {"", "--json --log good", "--check --log good", "--check --json good",
+          "--check --print-trace good", "--jobs 0 good", "--jobs x good", "--page p good good",
+          "--timeline t good good", "--page p --print-trace good", "--nothing good"}) {
+        const Played played = run(arguments);
+        EXPECT_EQ(played.status, 2) << arguments;
+        EXPECT_EQ(played.out, "") << arguments;
+        EXPECT_NE(played.err, "") << arguments;
+    }
+    const Played calls = run("--list-calls");
+    EXPECT_EQ(calls.status, 0);
+    EXPECT_NE(calls.out.find("SDCImpl.putRgbShotTally [integer]\n"), std::string::npos);
+    EXPECT_EQ(run("--version").status, 0);
+}
+
+TEST_F(ReplayOutputTest, AFileThatCannotBeWrittenIsNamedAndTheSummaryIsThere) {
+    for (const char* option : {"--page", "--timeline"}) {
+        for (const auto& [file, why] : {std::pair("/dev/full", "No space left on device"),
+                                        std::pair("no/where", "No such file or directory"),
+                                        std::pair(".", "Is a directory")}) {
+            const Played played = run(std::string(option) + ' ' + file + ' ' + kThreeBoots);
+            EXPECT_EQ(played.status, 2) << option << file;
+            EXPECT_EQ(played.err, std::string(file) + ": cannot write: " + why + "\n");
+            EXPECT_NE(played.out.find("\nPlayed 3 boots, "), std::string::npos);
+        }
+    }
+    EXPECT_EQ(run("--json good >/dev/full 2>error; echo $?").out, "1\n");
+    EXPECT_EQ(contents("error"), "cannot write standard output: No space left on device\n");
+}
+
+TEST_F(ReplayOutputTest, AReplayThatStopsSaysSoInEveryReport) {
+    const Played played = run("--page page --timeline timeline bad");
+    EXPECT_EQ(played.status, 2);
+    EXPECT_NE(played.out.find("\nStopped after 1 boot, 0:00:00 of"), std::string::npos);
+    EXPECT_EQ(count(contents("page"), "The replay has stopped before the end."), 1u);
+    EXPECT_EQ(count(contents("timeline"), "\"telemetry\""), 1u);
+    EXPECT_EQ(run("--page page good").status, 0);
+    EXPECT_EQ(count(contents("page"), "The replay has stopped before the end."), 0u);
+
+    const Played checked = run("--check bad");
+    EXPECT_EQ(checked.status, 2);
+    EXPECT_EQ(checked.out, "");
+    EXPECT_EQ(checked.err, "bad:2: \"at\" is missing\n");
+    write("first", "{}\n");
+    EXPECT_EQ(run("first").out, "") << "nothing was played";
+}
+
+TEST_F(ReplayOutputTest, TheSummaryShowsTwentyRowsOrAll) {
+    const std::string some = run(kThreeBoots).out;
+    EXPECT_EQ(count(some, "app.15"), 1u);
+    EXPECT_EQ(count(some, "app.16"), 0u);
+    EXPECT_EQ(count(some, "  and 5 more (--all shows them)\n"), 1u);
+    const std::string all = run(std::string("--all ") + kThreeBoots).out;
+    EXPECT_EQ(count(all, "app.20"), 0u);
+    EXPECT_EQ(count(all, "app.18"), 1u);
+    EXPECT_EQ(count(all, "--all"), 0u);
+}
+
+TEST_F(ReplayOutputTest, ColoursAreForATerminalUnlessTheyAreNotWanted) {
+    EXPECT_EQ(run("good").out.find('\x1b'), std::string::npos);
+    for (const auto& [variable, colours] :
+         {std::pair("-u NO_COLOR", true), {"NO_COLOR=", true}, {"NO_COLOR=0", false}}) {
+        const std::string shown = run(std::string("good >plain; script -qec \"env ") + variable +
+                                      " '" + SENSOR_REPLAY + "' good\" /dev/null")
+                                          .out;
+        EXPECT_EQ(shown.find("\x1b[1mgood\x1b[0m") != std::string::npos, colours) << shown;
+    }
+}
+
+TEST_F(ReplayOutputTest, ATraceIsToldByItsFirstBraceAndMustNotBePacked) {
+    write("indented", "\xEF\xBB\xBF\n# day\n \t" + std::string(kReport));
+    EXPECT_EQ(run("--json indented").status, 0);
+    EXPECT_EQ(run("--json -", kReport).status, 0);
+    const Played packed = run("good >plain; gzip good; '" SENSOR_REPLAY "' --json good.gz");
+    EXPECT_EQ(packed.status, 2);
+    EXPECT_EQ(packed.err, "good.gz: a trace must be plain UTF-8, not packed or UTF-16\n");
+}
+
+TEST_F(ReplayOutputTest, TracesOfSeveralCapturesAreJoinedByABoot) {
+    const std::string capture = kCapture;
+    const Played printed = run("--print-trace " + capture + ' ' + capture);
+    EXPECT_EQ(printed.status, 0);
+    EXPECT_EQ(count(printed.out, R"("boot": "device")"), 1u);
+    write("trace", printed.out);
+    const Played played = run("--json trace");
+    EXPECT_EQ(played.status, 0) << played.err;
+    EXPECT_EQ(count(played.out, R"("boot": "device")"), 2u);
+}
+
+}  // namespace
