@@ -5,6 +5,7 @@
 #include <utility>
 
 #include <fcntl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include "capture/TextSource.h"
@@ -33,6 +34,19 @@ std::optional<trace::Failure> open(const std::string& name, InputFile* file) {
         return trace::Failure{name + ": a trace must be plain UTF-8, not packed or UTF-16"};
     }
     return std::nullopt;
+}
+
+bool isSurelyCapture(const std::string& name) {
+    struct stat info {};
+    if (name == "-" || stat(name.c_str(), &info) != 0 || !S_ISREG(info.st_mode)) return false;
+    const int fd = ::open(name.c_str(), O_RDONLY | O_CLOEXEC);
+    char bytes[4096];
+    const ssize_t count = fd < 0 ? 0 : read(fd, bytes, sizeof(bytes));
+    if (fd >= 0) close(fd);
+    if (count <= 0) return false;
+    const std::string_view text(bytes, static_cast<size_t>(count));
+    const size_t first = text.find_first_not_of(" \t\r\n\xEF\xBB\xBF");
+    return first != std::string_view::npos && text[first] != '{' && text[first] != '#';
 }
 
 }  // namespace replay

@@ -23,4 +23,10 @@ struct InputFile {
 /** Opens `name` into `*file`. Returns nothing, or why it cannot be read. */
 std::optional<trace::Failure> open(const std::string& name, InputFile* file);
 
+/**
+ * Whether the file `name` is a capture for sure, as its first bytes tell. Only a regular file is
+ * looked at; one that begins with a comment may be either.
+ */
+bool isSurelyCapture(const std::string& name);
+
 }  // namespace replay

@@ -5,8 +5,11 @@
 #include <csignal>
 #include <cstdio>
 #include <cstring>
-#include <vector>
+#include <new>
+#include <utility>
 
+#include <fcntl.h>
+#include <poll.h>
 #include <sys/mman.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
@@ -19,93 +22,153 @@ namespace replay {
 
 namespace {
 
-/** Ended jobs that wait for their turn hold two descriptors each. */
-constexpr size_t kMaxWaiting = 200;
+/** What stands in front of a file's output in a worker's pipe. */
+struct Header {
+    uint64_t file;
+    uint64_t outSize;
+    uint64_t errorSize;
+    int32_t status;
+};
 
-/** Prints the memory file `fd` on `to`, and closes it; false if that fails. */
-bool print(int fd, int to) {
+std::atomic<size_t>* sharedCounter() {
+    void* memory = mmap(nullptr, sizeof(std::atomic<size_t>), PROT_READ | PROT_WRITE,
+                        MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+    return memory == MAP_FAILED ? nullptr : new (memory) std::atomic<size_t>(0);
+}
+
+/** Makes `fd` a memory file; what is printed there can then be taken out by `takeOutput`. */
+bool gather(int fd) {
+    const int file = memfd_create("output", MFD_CLOEXEC);
+    return file >= 0 && dup2(file, fd) == fd && close(file) == 0;
+}
+
+std::vector<unsigned char> takeOutput(int fd) {
     lseek(fd, 0, SEEK_SET);
-    const std::vector<unsigned char> bytes = trace::readAll(fd);
-    close(fd);
-    return trace::writeAll(to, bytes.data(), bytes.size());
+    std::vector<unsigned char> bytes = trace::readAll(fd);
+    lseek(fd, 0, SEEK_SET);
+    if (ftruncate(fd, 0) != 0) _exit(trace::kStatusFailed);
+    return bytes;
 }
 
 }  // namespace
 
+Jobs::Jobs(int count, Work work, std::function<void(size_t)> tell)
+      : mCount(count),
+        mWork(std::move(work)),
+        mTell(std::move(tell)),
+        mNext(sharedCounter()) {}
+
 Jobs::~Jobs() {
-    for (const Job& job : mJobs) {
-        if (!job.ended) {
-            kill(job.process, SIGKILL);
-            waitpid(job.process, nullptr, 0);
-        }
-        close(job.out);
-        close(job.error);
-    }
+    endWorkers();
+    if (mNext != nullptr) munmap(mNext, sizeof(*mNext));
 }
 
-int Jobs::start(const std::function<int()>& work) {
-    while (mRunning == mCount || mJobs.size() == kMaxWaiting) {
-        if (const int status = waitForOne()) return status;
+int Jobs::run(const std::vector<std::string>& names) {
+    mResults.clear();
+    mPrinted = 0;
+    if (mNext != nullptr) *mNext = 0;
+    const size_t count = std::min(static_cast<size_t>(mCount), names.size());
+    for (size_t i = 0; i < count; ++i) {
+        if (mNext != nullptr && startWorker(names)) continue;
+        std::fprintf(stderr, "cannot start a process: %s\n", std::strerror(errno));
+        return trace::kStatusFailed;
     }
-    Job job{};
-    job.out = memfd_create("output", MFD_CLOEXEC);
-    job.error = memfd_create("errors", MFD_CLOEXEC);
+    int status = 0;
+    while (!mWorkers.empty() && status == 0) {
+        std::vector<pollfd> ready;
+        for (const Worker& worker : mWorkers) ready.push_back({worker.results, POLLIN, 0});
+        poll(ready.data(), ready.size(), -1);
+        for (size_t i = ready.size(); i-- > 0;) {
+            if (ready[i].revents == 0 || receive(&mWorkers[i])) continue;
+            close(mWorkers[i].results);
+            waitpid(mWorkers[i].process, nullptr, 0);
+            mWorkers.erase(mWorkers.begin() + static_cast<ptrdiff_t>(i));
+        }
+        status = printDone();
+    }
+    endWorkers();
+    if (status != 0 || mPrinted == names.size()) return status;
+    std::fprintf(stderr, "%s: the process died\n", names[mPrinted].c_str());
+    return trace::kStatusFailed;
+}
+
+bool Jobs::startWorker(const std::vector<std::string>& names) {
+    int ends[2];
+    if (pipe2(ends, O_CLOEXEC) != 0) return false;
     const pid_t tool = getpid();
-    job.process = job.out < 0 || job.error < 0 ? -1 : fork();
-    if (job.process == 0) {
+    const pid_t process = fork();
+    if (process == 0) {
         prctl(PR_SET_PDEATHSIG, SIGKILL);
         if (getppid() != tool) _exit(trace::kStatusFailed);
-        dup2(job.out, STDOUT_FILENO);
-        dup2(job.error, STDERR_FILENO);
-        _exit(work());
+        close(ends[0]);
+        work(names, ends[1]);
     }
-    if (job.process < 0) {
-        const int status = finish();
-        std::fprintf(stderr, "cannot start a process: %s\n", std::strerror(errno));
-        return status != 0 ? status : trace::kStatusFailed;
+    close(ends[1]);
+    if (process < 0) {
+        close(ends[0]);
+        return false;
     }
-    mJobs.push_back(job);
-    ++mRunning;
-    return 0;
+    mWorkers.push_back({process, ends[0], {}});
+    return true;
 }
 
-int Jobs::finish() {
-    while (!mJobs.empty()) {
-        if (const int status = waitForOne()) return status;
-    }
-    return 0;
-}
-
-int Jobs::waitForOne() {
+void Jobs::work(const std::vector<std::string>& names, int results) {
+    if (!gather(STDOUT_FILENO) || !gather(STDERR_FILENO)) _exit(trace::kStatusFailed);
     int status = 0;
-    const pid_t ended = waitpid(-1, &status, 0);
-    const auto job = std::find_if(mJobs.begin(), mJobs.end(),
-                                  [&](const Job& each) { return each.process == ended; });
-    if (job != mJobs.end()) {
-        job->ended = true;
-        job->status = status;
-        --mRunning;
-        mTell(++mEnded);
+    // Nothing behind a file that fails is printed, so this process need not go on.
+    for (size_t file; status == 0 && (file = mNext->fetch_add(1)) < names.size();) {
+        status = mWork(names[file]);
+        const auto out = takeOutput(STDOUT_FILENO);
+        const auto error = takeOutput(STDERR_FILENO);
+        const Header header{file, out.size(), error.size(), status};
+        const bool told = trace::writeAll(results, &header, sizeof(header)) &&
+                          trace::writeAll(results, out.data(), out.size()) &&
+                          trace::writeAll(results, error.data(), error.size());
+        if (!told) _exit(trace::kStatusFailed);
     }
-    return printEnded();
+    _exit(0);
 }
 
-int Jobs::printEnded() {
-    while (!mJobs.empty() && mJobs.front().ended) {
-        const Job job = mJobs.front();
-        mJobs.pop_front();
-        if (!print(job.out, STDOUT_FILENO)) {
+bool Jobs::receive(Worker* worker) {
+    char block[size_t{64} << 10];
+    const ssize_t count = read(worker->results, block, sizeof(block));
+    if (count < 0) return errno == EINTR;
+    if (count == 0) return false;
+    std::string& received = worker->received;
+    received.append(block, static_cast<size_t>(count));
+    for (Header header; received.size() >= sizeof(header);) {
+        std::memcpy(&header, received.data(), sizeof(header));
+        if (received.size() < sizeof(header) + header.outSize + header.errorSize) break;
+        mResults[header.file] = {
+                header.status, received.substr(sizeof(header), header.outSize),
+                received.substr(sizeof(header) + header.outSize, header.errorSize)};
+        received.erase(0, sizeof(header) + header.outSize + header.errorSize);
+        mTell(mPrinted + mResults.size());
+    }
+    return true;
+}
+
+int Jobs::printDone() {
+    for (auto done = mResults.begin(); done != mResults.end() && done->first == mPrinted;
+         done = mResults.erase(done), ++mPrinted) {
+        const auto& [status, out, error] = done->second;
+        if (!trace::writeAll(STDOUT_FILENO, out.data(), out.size())) {
             std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
             return trace::kStatusFailed;
         }
-        print(job.error, STDERR_FILENO);
-        if (WIFSIGNALED(job.status)) {
-            std::fprintf(stderr, "a process died: %s\n", strsignal(WTERMSIG(job.status)));
-            return trace::kStatusFailed;
-        }
-        if (WEXITSTATUS(job.status) != 0) return WEXITSTATUS(job.status);
+        trace::writeAll(STDERR_FILENO, error.data(), error.size());
+        if (status != 0) return status;
     }
     return 0;
+}
+
+void Jobs::endWorkers() {
+    for (const Worker& worker : mWorkers) {
+        kill(worker.process, SIGKILL);
+        waitpid(worker.process, nullptr, 0);
+        close(worker.results);
+    }
+    mWorkers.clear();
 }
 
 }  // namespace replay

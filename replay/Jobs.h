@@ -1,22 +1,28 @@
 #pragma once
 
+#include <atomic>
 #include <cstddef>
-#include <deque>
+#include <cstdint>
 #include <functional>
-#include <utility>
+#include <map>
+#include <string>
+#include <vector>
 
 #include <sys/types.h>
 
 namespace replay {
 
 /**
- * Runs work in processes, several at once, and prints what they have printed one after another, in
- * the order in which they were started.
+ * Does the same work with many files in several processes at once, and prints what they print one
+ * file after another, in the order of the files. What is not printed yet is kept in memory.
  */
 class Jobs {
 public:
-    /** At most `count` run at once; `tell` hears how many have ended, each time one does. */
-    Jobs(int count, std::function<void(size_t)> tell) : mCount(count), mTell(std::move(tell)) {}
+    /** What is done with a file; the result is an exit status. */
+    using Work = std::function<int(const std::string& name)>;
+
+    /** `count` processes; `tell` hears how many files are done, each time one is. */
+    Jobs(int count, Work work, std::function<void(size_t)> tell);
 
     /** Ends what still runs. */
     ~Jobs();
@@ -24,33 +30,39 @@ public:
     Jobs(const Jobs&) = delete;
     Jobs& operator=(const Jobs&) = delete;
 
-    /**
-     * Starts `work`, whose result is an exit status, as soon as fewer than `count` run. Returns the
-     * status of the first job that has failed, after which nothing more is printed; else 0.
-     */
-    int start(const std::function<int()>& work);
-
-    /** Waits for all jobs. Returns as `start` does. */
-    int finish();
+    /** Returns the status of the first file that failed, after which nothing is printed; else 0. */
+    int run(const std::vector<std::string>& names);
 
 private:
-    struct Job {
-        pid_t process;
-        int out;  // memory files: standard output and standard error
-        int error;
-        bool ended = false;
-        int status = 0;  // as waitpid has it
+    /** What came of a file. */
+    struct Result {
+        int status;
+        std::string out;
+        std::string error;
     };
 
-    /** Waits until a job ends, then prints those whose turn it is. */
-    int waitForOne();
-    int printEnded();
+    /** A process that takes one file after another. */
+    struct Worker {
+        pid_t process;
+        int results;           // the pipe on which it tells them
+        std::string received;  // the beginning of a result
+    };
+
+    bool startWorker(const std::vector<std::string>& names);
+    [[noreturn]] void work(const std::vector<std::string>& names, int results);
+
+    /** Takes what a worker tells; false when it has ended. */
+    bool receive(Worker* worker);
+    int printDone();
+    void endWorkers();
 
     const int mCount;
+    const Work mWork;
     const std::function<void(size_t)> mTell;
-    size_t mEnded = 0;
-    int mRunning = 0;
-    std::deque<Job> mJobs;  // not printed yet
+    std::atomic<size_t>* const mNext;  // file that nobody has taken; shared by the processes
+    std::vector<Worker> mWorkers;
+    std::map<size_t, Result> mResults;  // not printed yet
+    size_t mPrinted = 0;
 };
 
 }  // namespace replay

@@ -1,11 +1,13 @@
 #include "replay/Replay.h"
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
 #include <new>
 #include <optional>
 #include <string>
 #include <utility>
+#include <vector>
 
 #include <unistd.h>
 
@@ -42,17 +44,29 @@ public:
           : mOptions(options),
             mProgress(options.inputs(), !showsItself(options)),
             mPlayer(options, &mProgress),
-            mJobs(options.jobs, [this](size_t ended) { mProgress.show(ended, "", 0); }) {
+            mJobs(
+                    options.jobs, [this](const std::string& name) { return playInMemory(name); },
+                    [this](size_t done) { mProgress.show(done, "", 0); }) {
         mDevice.propertyFile = options.properties;
     }
 
     int run() {
-        const std::string& first = mOptions.files.front();
-        if (mOptions.merge) return inMemory(first, [&] { return runMerged(); });
-        for (const std::string& name : mOptions.files) {
-            if (const int status = inMemory(name, [&] { return runFile(name); })) return status;
+        const std::vector<std::string>& files = mOptions.files;
+        if (mOptions.merge) return inMemory(files.front(), [&] { return runMerged(); });
+        const bool mayUseJobs = mOptions.jobs > 1 && !mOptions.properties && !mOptions.printTrace;
+        for (auto next = files.begin(); next != files.end();) {
+            const auto end =
+                    mayUseJobs ? std::find_if_not(next, files.end(), isSurelyCapture) : next;
+            int status = 0;
+            if (end - next > 1) {
+                status = mJobs.run({next, end});
+                next = end;
+            } else {
+                status = playInMemory(*next++);
+            }
+            if (status != 0) return status;
         }
-        return mJobs.finish();
+        return 0;
     }
 
 private:
@@ -70,17 +84,13 @@ private:
         return say(mOptions.printTrace ? mPlayer.printMerged() : mPlayer.playMerged(&mDevice));
     }
 
-    int runFile(const std::string& name) {
+    int playInMemory(const std::string& name) {
+        return inMemory(name, [&] { return play(name); });
+    }
+
+    int play(const std::string& name) {
         InputFile file;
-        const auto failure = open(name, &file);
-        const bool mayBeJob = mOptions.jobs > 1 && mOptions.files.size() > 1 &&
-                              !mOptions.properties && !mOptions.printTrace;
-        const bool isJob = mayBeJob && !failure && file.isCapture();
-        if (isJob) {
-            return mJobs.start([&] { return say(mPlayer.play(std::move(file), &mDevice)); });
-        }
-        if (const int status = mJobs.finish()) return status;
-        if (failure) return say(failure);
+        if (const auto failure = open(name, &file)) return say(failure);
         if (mOptions.printTrace) return say(mPlayer.printTrace(std::move(file)));
         return say(mPlayer.play(std::move(file), &mDevice));
     }
