@@ -61,7 +61,7 @@ void CaptureImport::add(const std::string& name, std::string_view firstLine,
         mError =
                 trace::at(name, firstNumber) + "neither a JSON object nor part of a device capture";
     } else if (const std::string what = missing(dump); !what.empty()) {
-        mMissing.push_back(name + ": " + what);
+        mMissing.push_back({name, what});
     } else {
         warnOfSkipped(name, dump.registrations, &mWarnings);
         mSources.push_back({name, std::move(dump)});
@@ -71,9 +71,13 @@ void CaptureImport::add(const std::string& name, std::string_view firstLine,
 ImportedCapture CaptureImport::finish() {
     ImportedCapture result;
     result.error = mError;
-    if (mError.empty() && mSources.empty() && !mMissing.empty()) result.error = mMissing.front();
+    if (mError.empty() && mSources.empty() && !mMissing.empty()) {
+        result.error = mMissing.front().name + ": " + mMissing.front().what;
+    }
     if (!result.error.empty() || mSources.empty()) return result;
-    for (const std::string& what : mMissing) mWarnings.push_back(what + "; left out");
+    for (const Missing& missing : mMissing) {
+        mWarnings.push_back(trace::at(missing.name, 1) + "warning: left out: " + missing.what);
+    }
     result.warnings = std::move(mWarnings);
     TraceBuilder(&mSources, &result).build();
     return result;

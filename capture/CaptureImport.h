@@ -32,8 +32,14 @@ public:
     ImportedCapture finish();
 
 private:
+    /** A capture without registrations, and why it has none. */
+    struct Missing {
+        std::string name;
+        std::string what;
+    };
+
     std::vector<Source> mSources;
-    std::vector<std::string> mMissing;  // by capture without registrations: what is wrong
+    std::vector<Missing> mMissing;
     std::vector<std::string> mWarnings;
     std::string mError;
 };

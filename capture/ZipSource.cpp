@@ -45,6 +45,10 @@ ZipSource::~ZipSource() {
 }
 
 ssize_t ZipSource::read(char* data, size_t size) {
+    return readEntry(data, size);
+}
+
+ssize_t ZipSource::readEntry(char* data, size_t size) {
     const la_ssize_t count = archive_read_data(mArchive, data, size);
     if (count >= 0) return count;
     fail();
@@ -86,7 +90,7 @@ std::string ZipSource::findReport() {
 std::string ZipSource::readName(archive_entry* entry) {
     if (!isReadable(entry)) return "";
     std::array<char, 4096> text;
-    const ssize_t count = read(text.data(), text.size());
+    const ssize_t count = readEntry(text.data(), text.size());
     if (count < 0) return "";
     const std::string_view line(text.data(), static_cast<size_t>(count));
     return std::string(trimmed(line.substr(0, line.find('\n'))));

@@ -39,6 +39,7 @@ private:
     /** The name of the entry with the report; empty after an error. */
     std::string findReport();
     std::string readName(archive_entry* entry);
+    ssize_t readEntry(char* data, size_t size);
     void openEntry(const std::string& name);
 
     /** Sets the error if the entry is encrypted. */
