@@ -4,7 +4,7 @@
 #  - a class that is marked as exported and has no entry in the map;
 #  - an operation of the facade that no trace can call, nor the stress run, which makes every call;
 #  - a call without a row in docs/trace.md, and its class in the recorder's map;
-#  - an event id or a property without a row in docs/output.md;
+#  - an event id, a property or a reason of the summary without a row in docs/output.md;
 #  - a property that the recorder does not look at;
 #  - an event id whose payload report/Payload.cpp does not take apart;
 #  - an option of sensor-replay that its manual or the completion does not have, and the reverse;
@@ -13,6 +13,8 @@
 set -eu
 cd "$1"
 status=0
+reasons=$(mktemp)
+trap 'rm -f "$reasons"' EXIT
 
 # $1 must stand in file $2; $3 says what it is.
 expect() {
@@ -54,6 +56,12 @@ for property in $(strings '(persist|ro|service)\.[a-z._]+'); do
     expect "$suffix\`" docs/output.md "the property $property"
     expect "\"$property\"," record/Surroundings.cpp "the property $property"
 done
+
+sed -n '/kTexts\[\]/,/};/p' report/Reasons.cpp | tr -d '\n' | sed 's/" *"//g' |
+    grep -o '"[^"]*"' | tr -d '"' >"$reasons"
+while read -r reason; do
+    expect "| $reason |" docs/output.md "the reason"
+done <"$reasons"
 
 options=$("$3" --help | sed -n 's/^  \(-h,\)\{0,1\}\(--[a-z-]*\).*/\2/p')
 for option in $options; do
