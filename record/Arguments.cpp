@@ -34,13 +34,10 @@ void appendArgument(std::string* out, long long value) {
 }
 
 void appendArgument(std::string* out, const std::string& name) {
+    const std::string text(name.c_str());  // a trace's text ends at a NUL
     Recorder* const recorder = Recorder::get();
     Names* const names = recorder != nullptr ? recorder->names() : nullptr;
-    if (names != nullptr) {
-        appendText(out, names->replace(name.c_str()));
-    } else {
-        appendText(out, name.c_str());
-    }
+    appendText(out, names != nullptr ? names->replace(text) : text);
 }
 
 void appendArgument(std::string* out, const android::String8& name) {

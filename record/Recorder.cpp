@@ -125,7 +125,7 @@ Timeline::Turn Recorder::beginMessage(Run* message, bool canYield) {
 
 void Recorder::waitForQuiet(const Run& message) {
     for (int turn = 0; turn < kMostTurns && mParts.isOpen(); ++turn) {
-        if (mTimeline.hasBegun(message) || mTimeline.isQuiet(monotonicNow(), kQuietUs * 1000)) {
+        if (mTimeline.hasBegun(message) || mTimeline.isQuiet(monotonicNow(), int64_t{kQuietUs} * 1000)) {
             return;
         }
         if (turn >= kQuietTurns && !mTimeline.hasOpenCalls()) return;

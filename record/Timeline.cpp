@@ -140,6 +140,7 @@ std::vector<Run*> Timeline::beginMoment() {
     mFloor = std::max(mFloor, isOver ? moment + 1 : moment);
     mWait = moment;
     std::vector<Run*> begun;
+    begun.reserve(reached.size());
     for (const Pending* pending : reached) begun.push_back(pending->message);
     return begun;
 }

@@ -87,7 +87,9 @@ protected:
 
 private:
     const std::unique_ptr<std::FILE, int (*)(std::FILE*)> mOutput{
-            popen(("'" SENSOR_HOST "' --hour-ms 1 --socket '" + mPath + "' 2>&1").c_str(), "r"),
+            popen(("'" SENSOR_HOST "' --hour-ms 1 --no-clock --socket '" + mPath + "' 2>&1")
+                          .c_str(),
+                  "r"),
             pclose};
 };
 

@@ -33,6 +33,7 @@ struct Options {
     std::string socket;
     std::string properties;
     int hourMs = 3'600'000;
+    bool noClock = false;
 };
 
 int fail(int status, const std::string& what) {
@@ -132,6 +133,7 @@ int run(const Options& options) {
         std::thread(acceptClients, listener, service, hour).detach();
         std::printf("listening\n");
     }
+    if (options.script.empty() && options.noClock) pause();  // clients tell the hours, and the end
     if (options.script.empty()) runClock(service, hour);
     int status = 0;
     {
@@ -151,6 +153,7 @@ int main(int argc, char** argv) {
             "sensor-host");
     app.add_option("--hour-ms", options.hourMs, "how long an hour lasts, in milliseconds")
             ->check(CLI::PositiveNumber);
+    app.add_flag("--no-clock", options.noClock, "without a script: hours pass by command only");
     app.add_option("--socket", options.socket, "take commands of clients at a Unix socket")
             ->type_name("PATH");
     app.add_option("--properties", options.properties,
