@@ -123,34 +123,44 @@ TEST_F(PropertyStoreTest, TakesStoresOfEveryBuildAndRefusesTheRestUntouched) {
             {ID VERSION "CREATE TABLE properties (name, value)", "not a property store"},
             {VERSION "CREATE TABLE properties (name, value)", "not a property store"},
     };
+    const struct {
+        const char* what;
+        bool isOpen;
+        const char* lost;  // of a copy made while it was open; null: the original
+    } kStates[] = {
+            {"closed", false, nullptr},
+            {"in use", true, nullptr},
+            {"left behind by a killed program", true, ""},
+            {"left behind without its index", true, "-shm"},
+            {"left behind without its log", true, "-wal"},
+    };
     for (const auto& [sql, refusal] : kDatabases) {
-        for (const char* state : {"closed", "in use", "left behind"}) {
-            SCOPED_TRACE(std::string(state) + ": " + sql);
+        for (const auto& [what, isOpen, lost] : kStates) {
+            SCOPED_TRACE(std::string(what) + ": " + sql);
             fs::remove_all(mFolder / "a");
             fs::remove_all(mFolder / "b");
             fs::create_directories(mFolder / "a");
             auto other = std::make_unique<Database>(mFolder / "a/x?%41#", sql);
-            std::string folder = "a";
-            if (state == std::string("closed")) other = nullptr;
-            if (state == std::string("left behind")) {
-                // As the other program's death leaves it.
-                fs::copy(mFolder / "a", mFolder / "b");
-                folder = "b";
-            }
+            if (!isOpen) other = nullptr;
+            if (lost != nullptr) fs::copy(mFolder / "a", mFolder / "b");
+            const std::string folder = lost == nullptr ? "a" : "b";
             const std::string file = mFolder / (folder + "/x?%41#");
+            // These databases have all they hold in their logs, if they have one.
+            const bool isGone = lost != nullptr && *lost != '\0' && fs::remove(file + lost);
+            const char* const expected = isGone ? "not a property store" : refusal;
             auto before = files(folder);
-            if (refusal == nullptr) {
+            if (expected == nullptr) {
                 expectStore(file, "1");
-            } else {
-                EXPECT_EQ(platform::openProperties(file), file + kReason + refusal);
-                auto after = files(folder);
-                if (state == std::string("in use")) {
-                    // A reader within the same process marks its place in the index.
-                    before.erase("x?%41#-shm");
-                    after.erase("x?%41#-shm");
-                }
-                EXPECT_TRUE(after == before);
+                continue;
             }
+            EXPECT_EQ(platform::openProperties(file), file + kReason + expected);
+            auto after = files(folder);
+            if (isOpen && lost == nullptr) {
+                // A reader within the same process marks its place in the index.
+                before.erase("x?%41#-shm");
+                after.erase("x?%41#-shm");
+            }
+            EXPECT_TRUE(after == before);
         }
     }
 }

@@ -164,9 +164,9 @@ TEST_F(ScreenCaptureTest, CountsAndLogsASample) {
     EXPECT_EQ(sample({0, 0, 10, 10}), (Rgb{200, 100, 50}));
     EXPECT_EQ(taken(), Lines{});
     mLogSwitch = 1;
-    EXPECT_EQ(sample({1079, 2399, 1081, 2400}), (Rgb{100, 50, 25})) << "half of it is outside";
+    EXPECT_EQ(sample({1079, 2399, 1081, 2401}), (Rgb{50, 25, 12})) << "one pixel is inside";
     advanceTo(8000);
-    EXPECT_EQ(taken(), (Lines{"5000 log 3 UL: Pixcel changed: red = 100, green = 50, blue = 25",
+    EXPECT_EQ(taken(), (Lines{"5000 log 3 UL: Pixcel changed: red = 50, green = 25, blue = 12",
                               "5500 persist.zuno.rgb.shot.count=2"}));
 }
 
