@@ -75,7 +75,7 @@ void BatteryHistory::takeAt(int64_t time, const NumberedLine& line) {
         case Kind::kShutdown:
             return shutdown();
         case Kind::kOverflow:
-            return pause(HistoryStep::Kind::kOverflow);
+            return pause(HistoryStep::Kind::kPause);
         case Kind::kRecord:
             return record(line.line);
     }
@@ -88,8 +88,9 @@ void BatteryHistory::start() {
     }
 }
 
+// The display is off, whatever the log said last.
 void BatteryHistory::shutdown() {
-    pause(HistoryStep::Kind::kShutdown);
+    pause(HistoryStep::Kind::kPause);
     value(State::kDisplay, kDisplayOff);
 }
 

@@ -13,11 +13,10 @@ namespace capture {
 /** What a battery history says at a moment. */
 struct HistoryStep {
     enum class Kind {
-        kRecords,   // it records from here on
-        kFull,      // it pauses, because the battery is full and the device is plugged
-        kOverflow,  // it pauses, because it has grown too long
-        kShutdown,  // it pauses, because the device goes down
-        kValue,     // a state changes
+        kRecords,  // it records from here on
+        kFull,     // it pauses, because the battery is full and the device is plugged
+        kPause,    // it pauses for another reason
+        kValue,    // a state changes
     };
 
     int64_t at;  // local time of the device, see WallTime.h

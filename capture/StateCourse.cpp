@@ -34,7 +34,6 @@ public:
             setByHistory(step.value);
         } else if (step.kind == Kind::kRecords) {
             mRecords = true;
-            mIsFull = false;
         } else {
             pause(step);
         }
@@ -53,12 +52,12 @@ private:
         if (!mRecords && !isKept) setByLog(value);
     }
 
-    /** The log's last values hold from here on, but for those that the pause itself tells. */
+    /** The log's last values hold from here on, but for the plug of a device that is full. */
     void pause(const HistoryStep& step) {
         mRecords = false;
         mIsFull = step.kind == Kind::kFull;
         for (const State state : {State::kDisplay, State::kCharge}) {
-            const bool isKept = state == State::kCharge ? mIsFull : step.kind == Kind::kShutdown;
+            const bool isKept = state == State::kCharge && mIsFull;
             if (ofLog(state) && !isKept) setByLog({step.at, state, *ofLog(state)});
         }
     }
@@ -91,7 +90,7 @@ private:
     const StateValue* mEnd = nullptr;
 
     bool mRecords = false;                     // the history does
-    bool mIsFull = false;                      // it pauses with a full battery
+    bool mIsFull = false;                      // in its last pause the battery was full
     std::array<std::optional<int>, 2> mOfLog;  // the log's last values, by State
     std::array<std::optional<int64_t>, 2> mLooksBack;
 };

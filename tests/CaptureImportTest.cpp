@@ -235,12 +235,17 @@ TEST_F(CaptureImportTest, TakesTheFirstOfSeveralDumpsThatHasRegistrations) {
     const std::string none = "No Sensors on the device\n";
     const std::string dump = kSensors + kHeading + offs({"01:00:00"});
     for (const std::string& text :
-         {service + none + service + dump, none + dump, service + kSensors + service + dump,
+         {service + none + service + dump, none + dump,
+          service + "0000000000) X | M | ver: 1 | type: x(7) | perm: n/a\n" + service + dump,
+          "DUMP OF SERVICE x:\n\xEF\xBB\xBF" + service + dump,
+          service + dump + ">   " + service + ">   DUMP OF SERVICE x:\n",
           "== dumpstate: 2024-01-01 00:00:00\n" + service + none +
                   "== dumpstate: 2024-02-01 02:00:00\n" + service + dump}) {
         const auto imported = importText(text);
         EXPECT_EQ(imported.error, "");
-        EXPECT_EQ(linesWith("enableSuccess", imported.trace).size(), 1u) << text;
+        EXPECT_EQ(linesWith("enableSuccess", imported.trace),
+                  Lines{enable(3'600'000, R"(false, 1, "a", "a", 0)")})
+                << text;
     }
     const auto twice = importText(service + dump + service + dump);
     EXPECT_EQ(linesWith("enableSuccess", twice.trace).size(), 1u);

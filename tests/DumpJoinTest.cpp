@@ -61,6 +61,9 @@ TEST(DumpJoinTest, JoinsAtTheLongestRunThatEndsTheOlderAndBeginsTheNewer) {
                  {{"abc", "xyz"}, "abc xyz: 0 1"},
                  {{"xyz", "abc", "cd"}, "xyz abcd: 0 1 2"},
                  {{"a", "b", "ab"}, "ab: 0 1 2"},
+                 {{"bcab", "bca"}, "bcab: 1 0"},
+                 {{"ababa", "aba"}, "ababa: 0 1"},
+                 {{"ab", "ba"}, "aba: 0 1"},
          }) {
         EXPECT_EQ(join(dumps), joined);
     }
@@ -118,6 +121,12 @@ TEST(DumpJoinTest, DatesEachDumpByItself) {
     const auto imported = importTexts({dump("2024-05-02 12:00:00", {"09:00:00"}),
                                        dump("2024-05-04 12:00:00", {"10:00:00", "09:00:00"})});
     EXPECT_EQ(imported.origin.registrations.to, 2 * 86'400'000 + 36'000'000);
+    EXPECT_EQ(importText(dump("2024-05-02 12:00:00", {"12:00:00"})).origin.firstDay, 19845);
+    EXPECT_EQ(importText(dump("2024-05-02 12:00:00", {"12:00:01"})).origin.firstDay, 19844);
+    // Where two dumps could follow each other either way, their dates tell.
+    const auto either = importTexts({dump("2024-05-03 12:00:00", {"09:00:00", "10:30:00"}),
+                                     dump("2024-05-02 12:00:00", {"10:30:00", "09:00:00"})});
+    EXPECT_EQ(either.origin.registrations.from, 32'400'000);
     // A date that is later than the newer dump allows is wrong.
     const auto late = importTexts({dump("2024-05-04 12:00:00", {"09:00:00"}),
                                    dump("2024-05-04 12:00:00", {"07:30:00", "09:00:00"})});
@@ -131,7 +140,7 @@ TEST(DumpJoinTest, TakesStatesFromEachDumpSinceTheOneBefore) {
             "+1h00m00s000ms (2) 050 +screen\n";
     const std::string second =
             "0 (1) RESET:TIME: 2024-05-02-10-30-00\n0 (2) 050 plug=ac +screen\n"
-            "+1h00m00s000ms (2) 050 -screen +camera\n";
+            "+30m00s500ms (2) 050 plug=wireless\n+1h00m00s000ms (2) 050 -screen +camera\n";
     const auto merge = [&](const char* secondTaken, const std::string& history) {
         const auto imported = importTexts({dump("2024-05-02 11:00:00", {"09:30:00"}, first),
                                            dump(secondTaken, {"10:50:00", "09:30:00"}, history)});
@@ -144,10 +153,22 @@ TEST(DumpJoinTest, TakesStatesFromEachDumpSinceTheOneBefore) {
     };
     const std::string start = "09:29:50 d1 p2 c0 t0, 10:00:00 d2, ";
     EXPECT_EQ(merge("2024-05-02 12:00:00", second),
-              start + "11:00:00 p1, 11:30:00 d1 c1, 12:00:00 p0 c0 569-720");
+              start + "11:00:00 p3, 11:30:00 d1 c1, 12:00:00 p0 c0 569-720");
     EXPECT_EQ(merge("2024-05-02 12:00:00", ""), start + "11:00:00 d1 p0 569-660");
     EXPECT_EQ(merge("2024-05-02 12:00:00", "0 (1) RESET:TIME: 2024-05-02-11-10-00\n0 (2) 050\n"),
               start + "11:00:00 d1 p0 569-660 670-720");
+    const std::string restart =
+            first + "+1h10m00s000ms (2) START\n+1h10m00s000ms (2) TIME: 2024-05-02-10-10-00\n";
+    EXPECT_EQ(importTexts({dump("2024-05-02 11:00:00", {"09:30:00"}, restart),
+                           dump("2024-05-02 11:30:00", {"09:30:00"}, restart)})
+                      .warnings.size(),
+              1u);
+}
+
+TEST(DumpJoinTest, EndsTheDayAfterTheLastChangeOfAState) {
+    const std::string history = "0 (1) RESET:TIME: 2024-05-02-09-00-00\n0 (2) 050 plug=usb\n";
+    const std::string late = importText(dump("2024-05-02 23:30:00", {"10:00:00"}, history)).trace;
+    EXPECT_EQ(linesWith("", late).back(), R"({"at": 169220000})");
 }
 
 }  // namespace

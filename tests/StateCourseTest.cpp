@@ -47,7 +47,8 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
             {"items match whole, and nothing in quotes does",
              kReset + kComplete +
                      "+1h (2) 050 +screen_doze screenwake=1:\"x +screen y\" Wake +running\n"
-                     "+1h00m01s000ms (2) 050 +job=\"a\"b\" +camera \"c\" +screen=1 -camera,\n"
+                     "+1h00m01s000ms (2) 050 +job=\"a\"b\" +camera \"c\" +camera2 +screen=1 "
+                     "-camera,\n"
                      "+1h00m02s000ms (2) 050 plug=dockx plug= +Screen\n"
                      "+1h00m03s000ms (2) 050 +screen unpaired=\" +camera\n",
              "", "09:59:50 d1 p2 c0 t0, 10:00:03 d2 c1, 12:00:00 d1 p0 c0"},
@@ -59,7 +60,7 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
              "", "09:59:50 d1 p2 c0 t0, 10:01:00 d2, 12:00:00 d1 p0"},
             {"kinds of plugs, of which all but two are one",
              kReset + kComplete +
-                     "+1h00m01s000ms (2) 050 plug=wireless\n+1h00m02s000ms (2) 050 plug=dock\n"
+                     "+1h00m01s000ms (2) 050 plug=dock\n+1h00m02s000ms (2) 050 plug=wireless\n"
                      "+1h00m03s000ms (2) 050 plug=ac\n+1h00m04s000ms (2) 050 plug=16\n",
              "", "09:59:50 d1 p2 c0 t0, 10:00:01 p3, 10:00:03 p1, 10:00:04 p3, 12:00:00 p0"},
             {"the last of a second counts, and only if it is a change",
@@ -73,6 +74,10 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
                      "+1h11m00s000ms (2) TIME: 2024-05-02-10-05-00\n"
                      "+1h12m00s000ms (2) 050 -screen\n+1h20m00s000ms (2) 050 +camera\n",
              "", "09:59:50 d1 p2 c0 t0, 10:14:00 c1, 12:00:00 p0 c0"},
+            {"a prefix may be negative",
+             kReset + kComplete +
+                     "-10s000ms (2) TIME: 2024-05-02-10-00-00\n+5s000ms (2) 050 +screen\n",
+             "", "09:59:50 d1 p2 c0 t0, 10:00:15 d2, 12:00:00 d1 p0"},
             {"each time is a new anchor",
              kReset + kComplete +
                      "+1d01h00m00s000ms (2) TIME: 2024-05-02-10-00-07\n"
@@ -89,25 +94,26 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
              "12:00:00 d1 p0"},
             {"a start without a time is left out, up to the next one",
              kReset + kComplete +
-                     "+1h (2) 050 +screen\n+1h00m05s000ms (8) START\n"
+                     "+1h (2) 050 +screen +phone_in_call\n+1h00m05s000ms (8) START\n"
                      "+1h00m06s000ms (2) 050 plug=ac +camera\n+1h00m07s000ms (8) START\n"
                      "+1h00m09s000ms (8) TIME: 2024-05-02-10-30-00\n+2h (8) START\n"
                      "+2h (2) 050 +phone_in_call\n",
-             "", "09:59:50 d1 p2 c0 t0, 10:00:00 d2, 10:30:00 d1, 12:00:00 p0"},
+             "", "09:59:50 d1 p2 c0 t0, 10:00:00 d2 t1, 10:30:00 d1 t0, 12:00:00 p0"},
             {"lines before the first reset, start or time count for nothing",
              "0 (2) 050 plug=ac +screen\n+1s000ms (2) TIME: 2024-05-02-09-00-00\n"
              "+1h00m06s000ms (2) 050 +camera\n",
              "", "10:00:05 c1, 12:00:00 c0"},
     });
     const std::string local =
-            "05-02 09:00:00.000 RESET:TIME: 2020-01-01-00-00-00\n"
-            "  05-02 09:00:00.500 050 80000000 plug=usb\n"
+            "05-02 08:00:00.000 SHUTDOWN\n"
+            "05-02 10:00:01.000 RESET:TIME: 2020-01-01-00-00-00\n"
+            "  05-02 10:00:01.500 050 80000000 plug=usb\n"
             "05-02 10:00:05.999 050 +screen\n05-02 10:30:00.000 START\n"
             "05-02 12:00:01.000 050 +camera\n";
     std::string text = report(local, "");
     text.replace(text.find("History ("), 8, "History [Format: 2] ");
     EXPECT_EQ(statesOf(importText(text).trace),
-              "09:59:50 d1 p2 c0 t0, 10:00:05 d2, 10:30:00 d1, 12:00:00 p0");
+              "10:00:01 d1 p2 c0 t0, 10:00:05 d2, 10:30:00 d1, 12:00:00 p0");
 }
 
 TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
@@ -130,8 +136,13 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
              "05-02 10:00:03.000  logd   519 I screen_toggled: 1\n" +
                      logged("10:00:04.000", "screen_toggled: 1x") +
                      logged("10:00:05.000", "x: screen_toggled: 1") +
+                     logged("10:00:05.000", "x_screen_toggled: 1") +
                      logged("10:00:06.000", "battery_status: [2,2,1]"),
              "10:00:01 d2, 10:00:02 d1"},
+            {"a time that goes back becomes the one before", "",
+             logged("10:00:06.000", "x: 1") + logged("10:00:03.000", off) +
+                     logged("10:00:07.000", charge("2")),
+             "10:00:06 d1, 10:00:07 p2, 12:00:00 p0"},
             {"what the history says first held since the log's first line", kReset + kComplete,
              logged("08:59:55.000", "x: 1") + logged("09:00:00.000", off) +
                      logged("11:00:00.000", on),
@@ -173,6 +184,14 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
              kReset + "0 (2) *OVERFLOW*\n0 (2) 050 plug=usb +screen\n"
                       "+1s000ms (2) TIME: 2024-05-02-09-00-01\n+2s000ms (2) 050 plug=ac\n",
              "", "09:59:50 p1, 12:00:00 p0"},
+            {"so does the first after a start, here before a time that ends a pause",
+             kReset + kComplete + "+1h00m10s000ms (2) START\n" +
+                     "+1h00m10s000ms (2) TIME: 2024-05-02-10-00-10\n" +
+                     "+1h00m10s000ms (2) *OVERFLOW*\n" +
+                     "+1h10m00s000ms (2) TIME: 2024-05-02-10-10-00\n" +
+                     "+1h10m01s000ms (2) 050 plug=ac\n",
+             logged("10:05:00.000", on),
+             "09:59:50 d1 p2 c0 t0, 10:05:00 d2 p1, 10:10:01 d1, 12:00:00 p0"},
             {"in a pause the log's first line looks back, but not for the plug of a full device",
              kReset + kComplete + "+1h00m10s000ms (2) 100 status=full +screen\n" +
                      "+1h30m00s000ms (2) TIME: 2024-05-02-10-30-00\n" +
@@ -181,6 +200,32 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
              "09:59:50 d1 p2 c0 t0, 10:00:10 d2, 10:10:00 d1, 10:20:00 d2, 10:30:01 p0, "
              "12:00:00 d1"},
     });
+}
+
+TEST_F(StateCourseTest, ReadsSectionsFromWhereTheyBeginToWhereTheyEnd) {
+    const std::string text = report(kReset + kComplete, "");
+    const std::string states = "09:59:50 d1 p2 c0 t0, 12:00:00 p0";
+    const std::string on = "+1h00m00s000ms (2) 050 +screen\n";
+    const std::string heading = "Battery History (1):\n" + kReset + on + "\n";
+    const std::string log = "------ EVENT LOG (x) ------\n";
+    for (const auto& [before, inserted] : std::vector<std::pair<std::string, std::string>>{
+                 {"DUMP OF SERVICE b", "DUMP OF SERVICE other:\n" + heading},
+                 {"DUMP OF SERVICE b", "DUMP OF SERVICE batterystats2:\n" + heading},
+                 {"DUMP OF SERVICE b", " " + heading + "x " + heading},
+                 {"DUMP OF SERVICE CRITICAL", on},
+                 {"DUMP OF SERVICE b", logged("10:00:00.000", "screen_toggled: 1")},
+                 {"DUMP OF SERVICE b", "------ EVENT LOG TAGS (x) ------\n" +
+                                               logged("10:00:00.000", "screen_toggled: 1")},
+                 {"", "== dumpstate: 2024-05-01 11:59:00\n"},
+                 {"end", "== dumpstate: 2024-05-03 11:59:00\n" + log +
+                                 logged("10:00:00.000", "screen_toggled: 1") +
+                                 "------\nDUMP OF SERVICE batterystats:\n" + heading +
+                                 "DUMP OF SERVICE sensorservice:\n--------- 0.1s was the duration "
+                                 "of dumpsys sensorservice, ending at: 2024-05-02 13:00:00\n"}}) {
+        std::string changed = text;
+        changed.insert(before == "end" ? text.size() : text.find(before), inserted);
+        EXPECT_EQ(statesOf(importText(changed).trace), states) << inserted;
+    }
 }
 
 TEST_F(StateCourseTest, SaysWhatCannotBeDated) {
