@@ -89,6 +89,11 @@ TEST(TextTest, ATableFitsItsWidthByCuttingTheWidestNamesFirst) {
               std::string::npos)
             << html;
     EXPECT_NE(html.find("<p>and 1 more</p>"), std::string::npos);
+
+    Table wide(std::vector<Table::Column>(12, {"A", Table::Column::kCut}), 1);
+    wide.add(std::vector<std::string>(12, std::string(30, 'a')));
+    const std::string text = wide.text(0);
+    EXPECT_EQ(width(text.substr(text.find('\n') + 1)), 12 * 10 + 11 * 2u) << "10 of each are kept";
 }
 
 }  // namespace
