@@ -275,10 +275,4 @@ TEST_F(ReplayTest, AStoreThatGoesAwayWhileTheReplayRunsIsAnError) {
     }
 }
 
-TEST_F(ReplayTest, ReadsLinesLongerThanABlock) {
-    const std::string blanks(600'000, ' ');
-    EXPECT_EQ(happened(play({blanks + report("0"), "{" + blanks + report("1").substr(1)})),
-              (Lines{reported("0", 0), reported("1", 0)}));
-}
-
 }  // namespace
