@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include "report/EventText.h"
+
 namespace report {
 namespace {
 
@@ -44,6 +46,17 @@ TEST(PayloadTest, TakesEachPayloadApartWhateverItsNamesHold) {
         const Fields fields = takeApart(id, payload);
         EXPECT_EQ(toJson(fields), json);
         EXPECT_EQ(describeEvent(id, fields), meaning) << payload;
+    }
+}
+
+TEST(EventTextTest, AValueIsShownAsItsKindAndAsItIsIfItIsNoNumber) {
+    for (const auto& [seconds, shown] :
+         {std::pair("1801", "0:30:01"), {"-5", "-5"}, {"12x", "12x"}, {"", ""}, {"0", "0:00:00"}}) {
+        const std::string payload = std::string("pkg:a/a&time:") + seconds;
+        const EventText text = layOut(Event{0, "N273|10010", takeApart("N273|10010", payload)}, 1);
+        ASSERT_EQ(text.values.size(), 2u);
+        EXPECT_EQ(text.values[0].second, "a");
+        EXPECT_EQ(text.values[1].second, shown);
     }
 }
 

@@ -143,7 +143,7 @@ TEST_F(ReplayOutputTest, TheSummaryShowsTwentyRowsOrAll) {
     const std::string some = run(kThreeBoots).out;
     EXPECT_EQ(count(some, "app.15"), 1u);
     EXPECT_EQ(count(some, "app.16"), 0u);
-    EXPECT_EQ(count(some, "  and 5 more (--all shows them)\n"), 1u);
+    EXPECT_EQ(count(some, "  and 6 more (--all shows them)\n"), 1u);
     const std::string all = run(std::string("--all ") + kThreeBoots).out;
     EXPECT_EQ(count(all, "app.20"), 0u);
     EXPECT_EQ(count(all, "app.18"), 1u);

@@ -61,6 +61,8 @@ TEST(TextTest, TimesRatesAndDaysAreWrittenForAPerson) {
     EXPECT_EQ(formatDate(19'782), "2024-02-29");
     EXPECT_EQ(formatRate(66'667'000), "15.0");
     EXPECT_EQ(formatRate(5'000'000'000), "0.2");
+    EXPECT_EQ(formatRate(10'000), "100000.0");
+    EXPECT_EQ(formatRate(1000), "1e+06");
     EXPECT_EQ(formatRate(0), "fastest");
     EXPECT_EQ(formatRate(-1), "fastest");
     EXPECT_EQ(formatClock(86'399'999'999'999), "day 1 23:59:59.999999999");
@@ -89,6 +91,11 @@ TEST(TextTest, ATableFitsItsWidthByCuttingTheWidestNamesFirst) {
               std::string::npos)
             << html;
     EXPECT_NE(html.find("<p>and 1 more</p>"), std::string::npos);
+
+    Table wide(std::vector<Table::Column>(12, {"A", Table::Column::kCut}), 1);
+    wide.add(std::vector<std::string>(12, std::string(30, 'a')));
+    const std::string text = wide.text(0);
+    EXPECT_EQ(width(text.substr(text.find('\n') + 1)), 12 * 10 + 11 * 2u) << "10 of each are kept";
 }
 
 }  // namespace

@@ -10,6 +10,7 @@
 
 #include "trace/CallTable.h"
 #include "trace/LineReader.h"
+#include "trace/TraceTime.h"
 
 namespace trace {
 namespace {
@@ -41,6 +42,9 @@ TEST(TraceLineTest, ATimeHasSixDecimalsUpToTheLastMoment) {
             {"1e-6", 1},
             {"0.0000010", 1},
             {"1234567890123e-6", 1234567890123},
+            {"1.0020e+0", 1'002'000},
+            {"10.03E2", 1'003'000'000},
+            {"86400000000.1234560 ", 86'400'000'000'123'456},
             {"9e12", 9'000'000'000'000'000'000},
             {"9000000000000", 9'000'000'000'000'000'000},
             {"9000000000000.000000", 9'000'000'000'000'000'000},
@@ -53,6 +57,8 @@ TEST(TraceLineTest, ATimeHasSixDecimalsUpToTheLastMoment) {
             {"9000000000001", -1},
             {"9000000000000.000001", -1},
             {"9.0000000000000000001e12", -1},
+            {"1.5e-99999999999999999999", -1},
+            {"1e300", -1},
             {"90e12", -1},
             {"true", -1},
             {"\"1\"", -1},
@@ -60,12 +66,24 @@ TEST(TraceLineTest, ATimeHasSixDecimalsUpToTheLastMoment) {
     };
     for (const auto& [text, ns] : kTimes) {
         TraceLine line;
-        const std::string error = judge(std::string("{\"at\":") + text + "}", &line);
-        EXPECT_EQ(error.find(ns < 0 ? R"("at" must be)" : ""), 0u) << text << error;
-        if (ns < 0) continue;
-        EXPECT_EQ(error, "") << text;
-        EXPECT_EQ(line.at, ns) << text;
+        const std::string error = judge(std::string(R"({"args": [], "\u0061t":)") + text +
+                                                R"(, "call": "SDCImpl.getInstance"})",
+                                        &line);
+        const char* const expected =
+                ns < 0 ? R"("at" must be a number of at most six decimals, from 0 to 9e12)" : "";
+        EXPECT_EQ(error, expected) << text;
+        EXPECT_EQ(line.at, std::max<int64_t>(ns, 0)) << text;
     }
+}
+
+TEST(TraceLineTest, ATimeIsWrittenWithTheDecimalsThatItHas) {
+    const std::pair<int64_t, const char*> kTimes[] = {
+            {0, "0"},
+            {1, "0.000001"},
+            {10'020'000, "10.02"},
+            {1'003'000'000, "1003"},
+            {8'999'999'999'999'750'000, "8999999999999.75"}};
+    for (const auto& [ns, text] : kTimes) EXPECT_EQ(formatMs(ns), text);
 }
 
 TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
@@ -81,8 +99,27 @@ TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
     const std::string v(91, 'v');
     const std::string digits(40, '9');
     const std::pair<std::string, const char*> kLines[] = {
+            {"[1]", "not a JSON object"},
+            {R"({"at": 1} {"at": 2})", "not valid JSON"},
+            {R"({"args": []})", R"("at" is missing)"},
+            {R"({"at": 1, "at": 2})", R"(the key "at" twice)"},
+            {R"({"at": 1, "what": 1})", R"(unknown key "what")"},
+            {R"({"at": 1, "boot": "device", "set": {}})", "more than one action"},
+            {R"({"at": 1, "boot": "cold"})", R"("boot" must be)"},
+            {R"({"at": 1, "call": 1})", R"("call" must be a text)"},
+            {R"({"at": 1, "call": "SDCImpl.putRgbShotTally"})", "takes 1 arguments, not 0"},
+            {R"({"at": 1, "call": "SDCImpl.putRgbShotTally", "args": 7})", "must be an array"},
+            {R"({"args": [1], "at": 1, "call": "SDCImpl.getInstance"})",
+             "takes 0 arguments, not 1"},
+            {R"({"at": 1, "set": {"mLogSwitch": true}})", R"("mLogSwitch" must be an integer)"},
+            {R"({"at": 1, "set": {"nothing": 1}})", R"(unknown variable "nothing")"},
             {hour("2147483647"), ""},
-            {hour("2147483648"), "integer of 32 bits"},
+            {hour("2147483648"), "argument 1 of SDCImpl.putRgbShotTally must be an integer of 32"},
+            {hour("7.0"), "integer of 32 bits"},
+            {call("SDCImpl.enableSuccess", R"(1, 1, "a", "b", 1)"),
+             "1 of SDCImpl.enableSuccess must"},
+            {call("SDCImpl.enableSuccess", R"(true, 1, "a\u0000", "b", 1)"), "a text without NUL"},
+            {call("SDCImpl.setNotification", "[1, true]"), "each element must be an integer of 32"},
             {hour("-2147483648"), ""},
             {hour("-2147483649"), "integer of 32 bits"},
             {rate("9223372036854775807"), ""},
@@ -105,6 +142,7 @@ TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
             {data(0), ""},
             {data(16), ""},
             {data(17), "at most 16 numbers"},
+            {call("SDCImpl.process", R"({"type": 1, "data": [], "x": 1})"), "must be an event"},
             {call("SDCImpl.process", R"({"type": 1})"), R"(an event with "type" and "data")"},
             {call("SDCImpl.process", R"({"data": [], "data": []})"), R"("type" and "data")"},
             {call("SDCImpl.process", R"({"type": 1, "data": [true]})"), "must hold numbers"},
@@ -112,6 +150,8 @@ TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
             {call("UltraException.doAction", R"(1, {})"), ""},
             {call("UltraException.doAction", R"(1, {"packageName": "a", "phoneState": 1})"), ""},
             {call("UltraException.doAction", R"(1, {"state": 1})"), R"("state" is unknown)"},
+            {call("UltraException.doAction", R"(6, {"phoneState": 1, "phoneState": 0})"),
+             R"(the key "phoneState" twice)"},
             {call("RgbShotManager.getScreenPixcel", "[1, 2, 3, 4]"), ""},
             {call("RgbShotManager.getScreenPixcel", "[1, 2, 3]"), "4 integers"},
             {call("RgbShotManager.getScreenPixcel", "[1, 2, 3, 4, 5]"), "4 integers"},
@@ -119,6 +159,8 @@ TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
             {property("a", '"' + v + '"'), ""},
             {property("a", "\"v" + v + '"'), "at most 91 bytes"},
             {property("a", "null"), ""},
+            {property("a", "1"), R"("a" must be a text or null)"},
+            {property("", "null"), "needs a name"},
             {property("a", "\"\""), ""},
             {property("a\\u0000b", "\"\""), "a property's name holds a NUL"},
             {property("a", "\"\\u0000\""), "must be a text without NUL or null"},
