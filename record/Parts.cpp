@@ -9,8 +9,6 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "trace/FileIo.h"
-
 namespace record {
 
 Parts::Error Parts::open(const std::string& folder, size_t bytes) {
@@ -33,8 +31,9 @@ Parts::Error Parts::startNext() {
 }
 
 Parts::Error Parts::write(std::string_view lines) {
-    if (!trace::writeAll(mFd, lines.data(), lines.size())) {
-        const int reason = errno;
+    const ssize_t written = ::write(mFd, lines.data(), lines.size());
+    if (written != static_cast<ssize_t>(lines.size())) {
+        const int reason = written < 0 ? errno : ENOSPC;
         if (ftruncate(mFd, static_cast<off_t>(mSize)) != 0) { /* `open` will do it */
         }
         errno = reason;
