@@ -6,7 +6,6 @@
 #include <unistd.h>
 
 #include "record/JsonText.h"
-#include "trace/FileIo.h"
 
 namespace record {
 
@@ -79,7 +78,7 @@ std::optional<Names::Key> Names::loadKey(const std::string& folder) {
     if (!valid) {
         const int random = open("/dev/urandom", O_RDONLY | O_CLOEXEC);
         valid = read(random, key.data(), sizeof(key)) == sizeof(key) &&
-                trace::writeAll(fd, key.data(), sizeof(key));
+                write(fd, key.data(), sizeof(key)) == sizeof(key);
         close(random);
     }
     close(fd);

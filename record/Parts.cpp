@@ -9,8 +9,6 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "trace/FileIo.h"
-
 namespace record {
 
 Parts::Error Parts::open(const std::string& folder, size_t bytes) {
@@ -33,10 +31,10 @@ Parts::Error Parts::startNext() {
 }
 
 Parts::Error Parts::write(std::string_view lines) {
-    if (!trace::writeAll(mFd, lines.data(), lines.size())) {
-        const int reason = errno;
-        if (ftruncate(mFd, static_cast<off_t>(mSize)) != 0) { /* `open` will do it */
-        }
+    const ssize_t written = ::write(mFd, lines.data(), lines.size());
+    if (written != static_cast<ssize_t>(lines.size())) {
+        const int reason = written < 0 ? errno : ENOSPC;
+        [[maybe_unused]] const int cut = ftruncate(mFd, static_cast<off_t>(mSize));  // or by `open`
         errno = reason;
         return fail("cannot be written");
     }

@@ -16,7 +16,7 @@ namespace record {
 namespace {
 
 /** What a part keeps free for what the library does after a call has found room. */
-constexpr size_t kReserve = size_t{32} << 10;
+constexpr size_t kReserve = size_t{64} << 10;
 
 int64_t monotonicNow() {
     timespec now{};
@@ -70,12 +70,16 @@ void Recorder::start() {
     }
     sStarted = recorder;
     sWriting = recorder;
-    // A child would write into its parent's record, and may have got the lock locked.
-    pthread_atfork(nullptr, nullptr, [] {
-        sWriting = nullptr;
-        sStarted = nullptr;
-        sWantsEvents = false;
-    });
+    pthread_atfork(nullptr, nullptr, leaveToParent);
+}
+
+/** In a forked child, which has no worker, and may have got the lock locked. */
+void Recorder::leaveToParent() {
+    Recorder* const recorder = sStarted.exchange(nullptr);
+    if (recorder == nullptr) return;
+    sWriting = nullptr;
+    sWantsEvents = false;
+    recorder->mParts.close();  // the parent's next process could not write the file otherwise
 }
 
 Parts::Error Recorder::begin(const Settings& settings) {
@@ -125,7 +129,8 @@ Timeline::Turn Recorder::beginMessage(Run* message, bool canYield) {
 
 void Recorder::waitForQuiet(const Run& message) {
     for (int turn = 0; turn < kMostTurns && mParts.isOpen(); ++turn) {
-        if (mTimeline.hasBegun(message) || mTimeline.isQuiet(monotonicNow(), int64_t{kQuietUs} * 1000)) {
+        if (mTimeline.hasBegun(message) ||
+            mTimeline.isQuiet(monotonicNow(), int64_t{kQuietUs} * 1000)) {
             return;
         }
         if (turn >= kQuietTurns && !mTimeline.hasOpenCalls()) return;

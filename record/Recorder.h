@@ -99,6 +99,7 @@ private:
     Recorder() = default;
 
     static void start();
+    static void leaveToParent() NO_THREAD_SAFETY_ANALYSIS;
 
     void waitForQuiet(const Run& message) REQUIRES(mLock);
     Parts::Error begin(const Settings& settings) EXCLUDES(mLock);
