@@ -237,8 +237,7 @@ TEST_F(CaptureImportTest, TakesTheFirstOfSeveralDumpsThatHasRegistrations) {
     for (const std::string& text :
          {service + none + service + dump, none + dump,
           service + "0000000000) X | M | ver: 1 | type: x(7) | perm: n/a\n" + service + dump,
-          "DUMP OF SERVICE x:\n\xEF\xBB\xBF" + service + dump,
-          service + dump + ">   " + service + ">   DUMP OF SERVICE x:\n",
+          "DUMP OF SERVICE x:\n\xEF\xBB\xBF" + service + dump, ">   DUMP OF SERVICE x:\n" + dump,
           "== dumpstate: 2024-01-01 00:00:00\n" + service + none +
                   "== dumpstate: 2024-02-01 02:00:00\n" + service + dump}) {
         const auto imported = importText(text);

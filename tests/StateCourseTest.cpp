@@ -42,13 +42,13 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
              kReset + kComplete +
                      "+1h00m01s999ms (2) 050 +screen\n"
                      "+1h30m00s000ms (2) 050 c0000000 plug=none +camera -screen +phone_in_call\n"
-                     "+3h00m01s000ms (2) 050 +screen\n",
+                     "+3h00m01s000ms (2) 050 +screen\n+3h00m02s000ms (2) 050 -screen\n",
              "", "09:59:50 d1 p2 c0 t0, 10:00:01 d2, 10:30:00 d1 p0 c1 t1, 12:00:00 c0 t0"},
             {"items match whole, and nothing in quotes does",
              kReset + kComplete +
                      "+1h (2) 050 +screen_doze screenwake=1:\"x +screen y\" Wake +running\n"
-                     "+1h00m01s000ms (2) 050 +job=\"a\"b\" +camera \"c\" +camera2 +screen=1 "
-                     "-camera,\n"
+                     "+1h00m01s000ms (2) 050 +job=\"a\"b\" +camera \"c\" +screen=1 -camera, "
+                     "+camera2\n"
                      "+1h00m02s000ms (2) 050 plug=dockx plug= +Screen\n"
                      "+1h00m03s000ms (2) 050 +screen unpaired=\" +camera\n",
              "", "09:59:50 d1 p2 c0 t0, 10:00:03 d2 c1, 12:00:00 d1 p0 c0"},
@@ -203,8 +203,8 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
 }
 
 TEST_F(StateCourseTest, ReadsSectionsFromWhereTheyBeginToWhereTheyEnd) {
-    const std::string text = report(kReset + kComplete, "");
-    const std::string states = "09:59:50 d1 p2 c0 t0, 12:00:00 p0";
+    const std::string text = report("0 (1) RESET:TIME: 2024-05-02-11-00-00\n" + kComplete, "");
+    const std::string states = "11:00:00 d1 p2 c0 t0, 12:00:00 p0";
     const std::string on = "+1h00m00s000ms (2) 050 +screen\n";
     const std::string heading = "Battery History (1):\n" + kReset + on + "\n";
     const std::string log = "------ EVENT LOG (x) ------\n";
