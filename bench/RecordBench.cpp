@@ -1,5 +1,6 @@
 #include <cstdlib>
 #include <cstring>
+#include <filesystem>
 #include <string>
 
 #include <benchmark/benchmark.h>
@@ -15,13 +16,19 @@ namespace {
 using android::RgbShotManager;
 using android::SDCImpl;
 
-/** Records into a folder of this process's own. */
-const bool gRecords = [] {
-    const char* const parent = std::getenv("TMPDIR");
-    std::string folder = std::string(parent != nullptr ? parent : "/tmp") + "/record-bench-XXXXXX";
-    setenv("SENSOR_PRIV_RECORD", mkdtemp(folder.data()), 1);
-    return true;
-}();
+/** Records into a folder of this process's own, which goes with it. */
+class Folder {
+public:
+    Folder() {
+        const char* const parent = std::getenv("TMPDIR");
+        mPath = std::string(parent != nullptr ? parent : "/tmp") + "/record-bench-XXXXXX";
+        setenv("SENSOR_PRIV_RECORD", mkdtemp(mPath.data()), 1);
+    }
+    ~Folder() { std::filesystem::remove_all(mPath); }
+
+private:
+    std::string mPath;
+} gFolder;
 
 /** The library's own function of the name that the recorder's function at `address` has. */
 template <typename Function, typename Operation>
@@ -99,6 +106,21 @@ void enableRecorded(benchmark::State& state) {
     for (auto _ : state) sdc->enableSuccess(true, 4, kName, kName, 20000);
 }
 
+void clockDirect(benchmark::State& state) {
+    using Function = int (*)(clockid_t, timespec*);
+    const auto read = reinterpret_cast<Function>(
+            dlsym(dlopen("libc.so.6", RTLD_NOW | RTLD_NOLOAD), "clock_gettime"));
+    timespec now{};
+    for (auto _ : state) benchmark::DoNotOptimize(read(CLOCK_MONOTONIC, &now));
+}
+
+void clockBehindRecorder(benchmark::State& state) {
+    timespec now{};
+    for (auto _ : state) benchmark::DoNotOptimize(clock_gettime(CLOCK_MONOTONIC, &now));
+}
+
+BENCHMARK(clockDirect);
+BENCHMARK(clockBehindRecorder);
 BENCHMARK(writeAlone);
 BENCHMARK(processDirect);
 BENCHMARK(processNotRecorded);

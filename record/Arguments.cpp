@@ -1,6 +1,7 @@
 #include "record/Arguments.h"
 
 #include <iterator>
+#include <string_view>
 
 #include "record/JsonText.h"
 #include "record/Recorder.h"
@@ -34,10 +35,14 @@ void appendArgument(std::string* out, long long value) {
 }
 
 void appendArgument(std::string* out, const std::string& name) {
-    const std::string text(name.c_str());  // a trace's text ends at a NUL
+    const std::string_view text = std::string_view(name).substr(0, name.find('\0'));
     Recorder* const recorder = Recorder::get();
     Names* const names = recorder != nullptr ? recorder->names() : nullptr;
-    appendText(out, names != nullptr ? names->replace(text) : text);
+    if (names != nullptr) {
+        appendText(out, names->replace(std::string(text)));
+    } else {
+        appendText(out, text);
+    }
 }
 
 void appendArgument(std::string* out, const android::String8& name) {

@@ -28,7 +28,9 @@ void appendArgument(std::string* out, const int* rect);
 /** The body of a call line. */
 template <typename... Parameters>
 std::string callBody(const char* name, const Parameters&... parameters) {
-    std::string body = R"("call": ")";
+    std::string body;
+    body.reserve(256);
+    body += R"("call": ")";
     body += name;
     body += '"';
     if constexpr (sizeof...(parameters) > 0) {

@@ -1,5 +1,6 @@
 #include "record/Settings.h"
 
+#include <algorithm>
 #include <cstdlib>
 
 #include <cutils/properties.h>
@@ -8,7 +9,8 @@ namespace record {
 
 namespace {
 
-constexpr size_t kDefaultMegabytes = 16;
+constexpr unsigned long kDefaultMegabytes = 16;
+constexpr unsigned long kMostMegabytes = 2000;  // so that sizes and places in files fit 32 bits
 
 std::string read(const char* variable, const char* property) {
     if (const char* value = std::getenv(variable)) return value;
@@ -26,7 +28,7 @@ Settings Settings::read() {
     const std::string hidesNames =
             record::read("SENSOR_PRIV_RECORD_REDACT", "persist.debug.sensor_priv.record_redact");
     return {record::read("SENSOR_PRIV_RECORD", "persist.debug.sensor_priv.record"),
-            (megabytes > 0 ? megabytes : kDefaultMegabytes) << 20,
+            size_t{std::min(megabytes > 0 ? megabytes : kDefaultMegabytes, kMostMegabytes)} << 20,
             !hidesNames.empty() && hidesNames != "0"};
 }
 
