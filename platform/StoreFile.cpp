@@ -107,7 +107,7 @@ std::optional<std::string> StoreFile::refuseContent() const {
     sqlite3* database = nullptr;
     const int error = sqlite3_open_v2(readOnlyUri(mAbsolutePath).c_str(), &database,
                                       SQLITE_OPEN_READONLY | SQLITE_OPEN_URI, nullptr);
-    const auto reason = error == SQLITE_OK ? refuseDatabase(database) : sqlite3_errstr(error);
+    auto reason = error == SQLITE_OK ? refuseDatabase(database) : sqlite3_errstr(error);
     sqlite3_close(database);
     return reason;
 }
