@@ -64,7 +64,7 @@ std::string nameType(int32_t type) {
 }
 
 std::string nameSensor(int32_t type, const trace::Origin* origin) {
-    const std::string word = nameType(type);
+    std::string word = nameType(type);
     std::string names;
     if (origin != nullptr) {
         const auto found = origin->namesOfType.find(type);
