@@ -56,6 +56,11 @@ private:
     sqlite3* mDb = nullptr;
 };
 
+/** Runs `sql` on the database `file` and closes it. */
+void change(const std::string& file, const std::string& sql) {
+    const Database database(file, sql);
+}
+
 void write(const std::string& file, const std::string& text) {
     std::ofstream(file, std::ios::binary) << text;
 }
@@ -76,7 +81,7 @@ protected:
     /** A store with "persist.a" = "1" in it. */
     std::string makeStore(const std::string& name) const {
         for (const char* end : {"", "-wal", "-shm"}) fs::remove(mFolder / name + end);
-        Database(mFolder / name, TABLE ROW ID VERSION WAL);
+        change(mFolder / name, TABLE ROW ID VERSION WAL);
         return mFolder / name;
     }
 
@@ -241,9 +246,9 @@ TEST_F(PropertyStoreTest, AFileThatCannotBeWrittenIsRefusedWithNothingLeftBeside
 TEST_F(PropertyStoreTest, AStoreWithADamagedPageIsRefusedAndTheOneBeforeStaysOpen) {
     const std::string store = makeStore("store");
     const std::string torn = makeStore("torn");
-    Database(torn,
-             "WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n LIMIT 2000)"
-             " INSERT INTO properties SELECT 'persist.' || i, 'value' FROM n");
+    change(torn,
+           "WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n LIMIT 2000)"
+           " INSERT INTO properties SELECT 'persist.' || i, 'value' FROM n");
     ASSERT_EQ(platform::openProperties(store), std::nullopt);
     const auto size = static_cast<std::streamoff>(fs::file_size(torn));
     std::fstream(torn, std::ios::in | std::ios::out).seekp(size / 2)
@@ -275,7 +280,7 @@ TEST_F(PropertyStoreTest, TheFirstFailedWriteIsRememberedAndWhatIsStoredCanStill
 
     EXPECT_EQ(property_set("persist.b", "4"), 0);
     EXPECT_EQ(Database(store).value("SELECT value FROM properties"), "14");
-    Database(store, "DROP TABLE properties");
+    change(store, "DROP TABLE properties");
     EXPECT_EQ(property("persist.a"), "") << "another failure, of another kind";
     EXPECT_EQ(platform::closeProperties(), error);
     EXPECT_EQ(platform::propertyFileError(), std::nullopt) << "it is the closed file's";
@@ -319,9 +324,9 @@ TEST_F(PropertyStoreTest, APinnedFileIsTheOnlyOneThatItsPathMayName) {
 
 TEST_F(PropertyStoreTest, OtherProgramsLongerValuesAreCut) {
     const std::string store = makeStore("store");
-    Database(store, "UPDATE properties SET value = '" + std::string(200, 'v') + "';" +
-                            "INSERT INTO properties VALUES ('persist.b', '" + std::string(91, 'w') +
-                            "'), ('persist.c', 5)");
+    change(store, "UPDATE properties SET value = '" + std::string(200, 'v') + "';" +
+                          "INSERT INTO properties VALUES ('persist.b', '" + std::string(91, 'w') +
+                          "'), ('persist.c', 5)");
     ASSERT_EQ(platform::openProperties(store), std::nullopt);
     char value[PROP_VALUE_MAX + 1];
     value[PROP_VALUE_MAX] = '!';

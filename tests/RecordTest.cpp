@@ -10,9 +10,7 @@ namespace {
 using ::testing::AllOf;
 using ::testing::ContainsRegex;
 using ::testing::ElementsAre;
-using ::testing::EndsWith;
 using ::testing::HasSubstr;
-using ::testing::IsEmpty;
 using ::testing::Not;
 using ::testing::StartsWith;
 
