@@ -15,9 +15,8 @@ namespace {
 
 /** "2 lines ..., the first is "..."" */
 std::string namingFirst(const SkippedLines& lines, const std::string& what) {
-    constexpr size_t kMostText = 200;
-    const std::string text = lines.firstText.substr(0, kMostText);
-    return std::to_string(lines.count) + ' ' + what + ", the first is " + trace::toJson(text);
+    return std::to_string(lines.count) + ' ' + what + ", the first is " +
+           trace::toJson(lines.firstText);
 }
 
 /** What keeps a capture from being a trace; empty if nothing does. */

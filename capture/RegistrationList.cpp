@@ -6,10 +6,16 @@
 
 namespace capture {
 
+namespace {
+
+constexpr size_t kMostText = 200;  // bytes of a line that are shown
+
+}  // namespace
+
 void SkippedLines::add(std::string_view text, int64_t lineNumber) {
     if (count++ > 0) return;
     firstNumber = lineNumber;
-    firstText = text;
+    firstText = text.substr(0, kMostText);
 }
 
 void RegistrationList::begin() {

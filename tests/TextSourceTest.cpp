@@ -109,7 +109,7 @@ std::string fromPipe(const std::string& bytes) {
         }
         close(ends[1]);
     });
-    const std::string text = unpacked(ends[0]);
+    std::string text = unpacked(ends[0]);
     writer.join();
     return text;
 }
