@@ -223,8 +223,7 @@ TEST(TraceLineTest, ACallIsOfferedForAnUnknownNameAndAllAreListed) {
           "SDCImpl.process [{\"type\": integer, \"data\": [number, ...]}]\n",
           "SDCImpl.setNotification [[integer, ...]]\n",
           "RgbShotManager.getScreenPixcel [[left, top, right, bottom]]\n",
-          "UltraException.doAction [integer, {\"packageName\": text, \"phoneState\": "
-          "integer}]\n"}) {
+          R"(UltraException.doAction [integer, {"packageName": text, "phoneState": integer}])"}) {
         EXPECT_NE(list.find(line), std::string::npos) << line;
     }
 }
