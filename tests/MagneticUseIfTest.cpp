@@ -205,8 +205,8 @@ TEST_F(MagneticUseIfTest, TellsEachStepInTheLogWhileItIsOn) {
             "log 3 dealWithOrientationTotalTime mEnableNumbers = 0, mTotalBeginCountTime = 1",
             "log 3 mUD=3, mLastUD=3, mLastRUD=0",
             "log 6 SDC Event = N273|10012",
-            "N273|10012 days:3&fastChargeTime:0&otherChargeTime:0&pkg:a&shockAndChargeTime:0"
-            "&totalTime:3&usbChargeTime:2",
+            ("N273|10012 days:3&fastChargeTime:0&otherChargeTime:0&pkg:a&shockAndChargeTime:0"
+             "&totalTime:3&usbChargeTime:2"),
             "log 3 oritt == 3",
             "log 3 boot state = 1"};
     ASSERT_GT(lines.size(), start.size());
