@@ -192,23 +192,20 @@ TEST_F(MagneticUseIfTest, TellsEachStepInTheLogWhileItIsOn) {
     const Lines lines = during(all);
     const Lines start{
             "log 3 currentPCState = 2 ,mLastPCState = 0 ",
-            "log 3 mIsChargeState=1, mEnableNumbers=0, mBeginCountTime=0",
-            "log 3 uds = 3",
+            "log 3 mIsChargeState=1, mEnableNumbers=0, mBeginCountTime=0", "log 3 uds = 3",
             "log 3 Enable mEnableNumbers = 1",
             "log 3 mIsChargeState=1, mEnableNumbers=1, mBeginCountTime=0",
             "log 3 dealWithOrientationTotalTime mEnableNumbers = 1, mTotalBeginCountTime = 0",
             "log 3 currentPCState = 0 ,mLastPCState = 2 ",
-            "log 3 mIsChargeState=0, mEnableNumbers=1, mBeginCountTime=1",
-            "log 3 tt = 2, type = 2",
+            "log 3 mIsChargeState=0, mEnableNumbers=1, mBeginCountTime=1", "log 3 tt = 2, type = 2",
             "log 3 Disable mEnableNumbers = 0",
             "log 3 mIsChargeState=0, mEnableNumbers=0, mBeginCountTime=0",
             "log 3 dealWithOrientationTotalTime mEnableNumbers = 0, mTotalBeginCountTime = 1",
-            "log 3 mUD=3, mLastUD=3, mLastRUD=0",
-            "log 6 SDC Event = N273|10012",
+            "log 3 mUD=3, mLastUD=3, mLastRUD=0", "log 6 SDC Event = N273|10012",
+            // NOLINTNEXTLINE(bugprone-suspicious-missing-comma): one text in two pieces
             ("N273|10012 days:3&fastChargeTime:0&otherChargeTime:0&pkg:a&shockAndChargeTime:0"
              "&totalTime:3&usbChargeTime:2"),
-            "log 3 oritt == 3",
-            "log 3 boot state = 1"};
+            "log 3 oritt == 3", "log 3 boot state = 1"};
     ASSERT_GT(lines.size(), start.size());
     EXPECT_EQ(Lines(lines.begin(), lines.begin() + static_cast<long>(start.size())), start);
     const std::string totals =
