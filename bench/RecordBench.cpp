@@ -3,16 +3,20 @@
 #include <filesystem>
 #include <string>
 
+#include <android/log.h>
 #include <benchmark/benchmark.h>
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <unistd.h>
 
 #include "core/SDCImpl.h"
+#include "exception/FlowingDataException.h"
+#include "platform/Telemetry.h"
 #include "rgb/RgbShotManager.h"
 
 namespace {
 
+using android::FlowingDataException;
 using android::RgbShotManager;
 using android::SDCImpl;
 
@@ -23,6 +27,8 @@ public:
         const char* const parent = std::getenv("TMPDIR");
         mPath = std::string(parent != nullptr ? parent : "/tmp") + "/record-bench-XXXXXX";
         setenv("SENSOR_PRIV_RECORD", mkdtemp(mPath.data()), 1);
+        __android_log_set_logger([](const __android_logger_data*, const char*) {});
+        platform::observeEvents([](const char*, const char*, const char*) {});
     }
     ~Folder() { std::filesystem::remove_all(mPath); }
 
@@ -91,6 +97,29 @@ void skipLuxRecorded(benchmark::State& state) {
     for (auto _ : state) benchmark::DoNotOptimize(manager->skipLux());
 }
 
+void testModeDirect(benchmark::State& state) {
+    RgbShotManager* const manager = RgbShotManager::getInstance();
+    const auto read = direct<void (*)(RgbShotManager*)>(&RgbShotManager::isTestMode);
+    for (auto _ : state) read(manager);
+}
+
+void testModeRecorded(benchmark::State& state) {
+    RgbShotManager* const manager = RgbShotManager::getInstance();
+    for (auto _ : state) manager->isTestMode();
+}
+
+void sendDirect(benchmark::State& state) {
+    FlowingDataException* const exception = FlowingDataException::getInstance();
+    const auto send = direct<void (*)(FlowingDataException*, int, int)>(
+            &FlowingDataException::setSensorException);
+    for (auto _ : state) send(exception, 1, 3);
+}
+
+void sendRecorded(benchmark::State& state) {
+    FlowingDataException* const exception = FlowingDataException::getInstance();
+    for (auto _ : state) exception->setSensorException(1, 3);
+}
+
 const std::string kName = "com.example.application.with.a.usual.name";
 
 void enableDirect(benchmark::State& state) {
@@ -126,6 +155,10 @@ BENCHMARK(processDirect);
 BENCHMARK(processNotRecorded);
 BENCHMARK(processRecorded);
 BENCHMARK(skipLuxRecorded);
+BENCHMARK(testModeDirect);
+BENCHMARK(testModeRecorded);
+BENCHMARK(sendDirect);
+BENCHMARK(sendRecorded);
 BENCHMARK(enableDirect);
 BENCHMARK(enableRecorded);
 

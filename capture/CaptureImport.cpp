@@ -1,92 +1,90 @@
 #include "capture/CaptureImport.h"
 
-#include <algorithm>
 #include <cstdint>
 #include <utility>
 
-#include "capture/DumpReader.h"
 #include "capture/TraceBuilder.h"
-#include "trace/Failure.h"
-#include "trace/JsonText.h"
+#include "capture/dump/DumpReader.h"
 
 namespace capture {
 
 namespace {
-
-/** "2 lines ..., the first is "..."" */
-std::string namingFirst(const SkippedLines& lines, const std::string& what) {
-    return std::to_string(lines.count) + ' ' + what + ", the first is " +
-           trace::toJson(lines.firstText);
-}
 
 /** What keeps a capture from being a trace; empty if nothing does. */
 std::string missing(const Dump& dump) {
     const RegistrationList& list = dump.registrations;
     if (!dump.hasService) return "no sensor service in the bug report";
     if (!list.empty()) return "";
-    if (dump.hasNoSensors && dump.sensors.sensors().empty()) {
+    if (dump.hasNoSensors && dump.service.sensors.sensors().empty()) {
         return "no sensors on the device, so no registrations";
     }
     const SkippedLines& lines = list.unreadable().count > 0 ? list.unreadable() : list.unknown();
-    if (lines.count == 0) return "no previous registrations";
-    return "no previous registrations that can be read: " +
-           namingFirst(lines, "lines of an unknown form");
+    if (lines.count > 0) {
+        return "no previous registrations that can be read: " +
+               lines.naming("lines of an unknown form");
+    }
+    return list.refused().empty() ? "no previous registrations"
+                                  : "no previous registrations that were not refused";
 }
 
-void warnOfSkipped(const std::string& name, const RegistrationList& list,
-                   std::vector<std::string>* warnings) {
-    const auto warn = [&](const SkippedLines& lines, const std::string& what) {
-        if (lines.count == 0) return;
-        warnings->push_back(trace::at(name, lines.firstNumber) +
-                            "warning: " + namingFirst(lines, what));
+/** Tells of all that a dump holds but nothing can be made of. */
+void warnOfLost(const std::string& name, const Dump& dump, std::vector<std::string>* warnings) {
+    const auto warn = [&](int64_t lineNumber, const std::string& text) {
+        warnings->push_back(base::at(name, lineNumber) + "warning: " + text);
     };
-    warn(list.unreadable(), "registrations left out: they cannot be read");
-    warn(list.behind(), "registrations left out: they stand behind the end of their section");
+    const auto warnOf = [&](const SkippedLines& lines, const std::string& what) {
+        if (lines.count > 0) warn(lines.firstNumber, lines.naming(what));
+    };
+    const RegistrationList& list = dump.registrations;
+    warnOf(list.unreadable(), "registrations left out: they cannot be read");
+    warnOf(list.behind(), "registrations left out: they stand behind the end of their section");
+    if (const auto& connections = dump.service.connections) {
+        warnOf(connections->unreadable(), "lines of connections left out: they cannot be read");
+        if (connections->found() != connections->announced()) {
+            warn(connections->lineNumber(),
+                 "not all connections are there: " + std::to_string(connections->found()) + " of " +
+                         std::to_string(connections->announced()));
+        }
+    }
+    warnOf(dump.service.direct.unreadable(),
+           "lines of direct connections left out: they cannot be read");
+    warnOf(dump.statistics.unreadable(),
+           "lines of the battery statistics left out: they cannot be read");
 }
 
 }  // namespace
 
 void CaptureImport::add(const std::string& name, std::string_view firstLine,
-                        trace::LineReader* reader) {
-    if (!mError.empty()) return;
+                        base::LineReader* reader) {
+    if (mFailure) return;
     DumpReader dumpReader;
     const int64_t firstNumber = reader->lineNumber();
-    dumpReader.line(firstLine, firstNumber);
-    while (const auto line = reader->next()) dumpReader.line(*line, reader->lineNumber());
+    dumpReader.takeLine(firstLine, firstNumber);
+    while (const auto line = reader->next()) dumpReader.takeLine(*line, reader->lineNumber());
     Dump dump = dumpReader.finish();
     if (reader->error()) {
-        mError = trace::at(name, reader->lineNumber()) + *reader->error();
+        mFailure = base::Failure{base::at(name, reader->lineNumber()) + *reader->error()};
     } else if (!dump.isCapture) {
-        mError =
-                trace::at(name, firstNumber) + "neither a JSON object nor part of a device capture";
+        mFailure = base::Failure{base::at(name, firstNumber) +
+                                 "neither a JSON object nor part of a device capture"};
     } else if (const std::string what = missing(dump); !what.empty()) {
         mMissing.push_back({name, what});
     } else {
-        warnOfSkipped(name, dump.registrations, &mWarnings);
-        mSources.push_back({name, std::move(dump)});
+        warnOfLost(name, dump, &mWarnings);
+        mDumps.push_back({name, std::move(dump)});
     }
 }
 
-ImportedCapture CaptureImport::finish() {
-    ImportedCapture result;
-    result.error = mError;
-    if (mError.empty() && mSources.empty() && !mMissing.empty()) {
-        result.error = mMissing.front().name + ": " + mMissing.front().what;
+base::Result<ImportedCapture> CaptureImport::finish() {
+    if (mFailure) return tl::unexpected(*mFailure);
+    if (mDumps.empty()) {
+        if (mMissing.empty()) return ImportedCapture{};
+        return base::fail(mMissing.front().name + ": " + mMissing.front().what);
     }
-    if (!result.error.empty() || mSources.empty()) return result;
     for (const Missing& missing : mMissing) {
-        mWarnings.push_back(trace::at(missing.name, 1) + "warning: left out: " + missing.what);
+        mWarnings.push_back(base::at(missing.name, 1) + "warning: left out: " + missing.what);
     }
-    result.warnings = std::move(mWarnings);
-    TraceBuilder(&mSources, &result).build();
-    return result;
-}
-
-ImportedCapture importCapture(const std::string& name, std::string_view firstLine,
-                              trace::LineReader* reader) {
-    CaptureImport import;
-    import.add(name, firstLine, reader);
-    return import.finish();
+    return TraceBuilder(std::move(mDumps), std::move(mWarnings)).build();
 }
 
 }  // namespace capture

@@ -1,12 +1,14 @@
 #pragma once
 
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "base/LineReader.h"
+#include "base/Result.h"
 #include "capture/ImportedCapture.h"
-#include "capture/Source.h"
-#include "trace/LineReader.h"
+#include "capture/NamedDump.h"
 
 namespace capture {
 
@@ -17,7 +19,8 @@ namespace capture {
  * The trace's clock starts at the midnight before the oldest registration. Each registration
  * becomes an enable or a disable. Between them stand the calls that a host makes at its start,
  * every hour, and when the display, the charger, the camera or a call changes, as far as the
- * captures tell that. The trace ends after the last day's reports.
+ * captures tell that. What they tell beside that, and of the sensors that were on before and after,
+ * stands in notes (trace/Note.h). The trace ends after the last day's reports.
  */
 class CaptureImport {
 public:
@@ -26,10 +29,10 @@ public:
      * `name` is the file's name for warnings and errors. After an error nothing more is read.
      * Beside others a capture without registrations is no error, but a warning.
      */
-    void add(const std::string& name, std::string_view firstLine, trace::LineReader* reader);
+    void add(const std::string& name, std::string_view firstLine, base::LineReader* reader);
 
-    /** The trace of all that was added. */
-    ImportedCapture finish();
+    /** The trace of all that was added, or why there is none. */
+    base::Result<ImportedCapture> finish();
 
 private:
     /** A capture without registrations, and why it has none. */
@@ -38,14 +41,10 @@ private:
         std::string what;
     };
 
-    std::vector<Source> mSources;
+    std::vector<NamedDump> mDumps;
     std::vector<Missing> mMissing;
     std::vector<std::string> mWarnings;
-    std::string mError;
+    std::optional<base::Failure> mFailure;
 };
-
-/** Makes a trace of one capture. */
-ImportedCapture importCapture(const std::string& name, std::string_view firstLine,
-                              trace::LineReader* reader);
 
 }  // namespace capture

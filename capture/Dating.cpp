@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "capture/WallTime.h"
+#include "capture/dump/WallTime.h"
 
 namespace capture {
 
@@ -68,6 +68,7 @@ Dating dateLines(const JoinedLines& joined, const std::vector<std::optional<int6
         const int64_t skipped = bases[dump].value_or(0) - bases.front().value_or(0);
         const int64_t time =
                 (midnights[i] + skipped) * kMsPerDay + joined.lines[i].registration.timeOfDay;
+        dating.printed.push_back(time);
         const int64_t before = dating.times.empty() ? 0 : dating.times.back();
         if (time < before) dating.setBack.push_back(i);
         dating.times.push_back(std::max(time, before));

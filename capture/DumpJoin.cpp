@@ -13,7 +13,9 @@ bool isSame(const DumpLine& a, const DumpLine& b) {
     return isSameLine(a.registration, b.registration);
 }
 
-/** For each length of a start of the first `count` lines: the longest shorter start that ends it.
+/**
+ * The table of Knuth, Morris and Pratt for the first `count` lines: `border[n]` is the longest
+ * proper prefix of the first n lines that is also their suffix.
  */
 std::vector<size_t> borders(const std::vector<DumpLine>& lines, size_t count) {
     std::vector<size_t> border(count + 1, 0);
@@ -44,8 +46,8 @@ void DumpJoin::add(std::vector<Registration> lines, std::optional<int64_t> taken
 }
 
 JoinedLines DumpJoin::finish() {
-    sortPieces();
     JoinedLines joined;
+    joined.unordered = sortPieces();
     for (Piece& piece : mPieces) {
         const size_t first = joined.lines.size();
         if (first > 0) joined.gaps.push_back(first);
@@ -60,8 +62,8 @@ JoinedLines DumpJoin::finish() {
     return joined;
 }
 
-// Searches the newer one's lines in the older one (Knuth, Morris, Pratt). What counts is how many
-// of them end the older one, or else that it holds them all further inside.
+// Searches the newer piece's lines in the older one. What counts is how many of them end the older
+// one. Where none do, the older may hold all of them further inside.
 DumpJoin::Match DumpJoin::match(const Piece& older, const Piece& newer) {
     const size_t count = std::min(newer.lines.size(), older.lines.size());
     const std::vector<size_t> border = borders(newer.lines, count);
@@ -107,14 +109,16 @@ std::optional<int64_t> DumpJoin::takenOf(const Piece& piece) const {
     return taken;
 }
 
-void DumpJoin::sortPieces() {
-    const bool areDated = std::all_of(mTaken.begin(), mTaken.end(),
-                                      [](const auto& taken) { return taken.has_value(); });
-    const auto isBefore = [&](const Piece& a, const Piece& b) {
-        if (areDated) return takenOf(a) < takenOf(b);
-        return a.dumps.front().dump < b.dumps.front().dump;
-    };
-    std::stable_sort(mPieces.begin(), mPieces.end(), isBefore);
+std::optional<std::pair<size_t, size_t>> DumpJoin::sortPieces() {
+    const auto undated = std::find_if(mPieces.begin(), mPieces.end(),
+                                      [&](const Piece& piece) { return !takenOf(piece); });
+    if (mPieces.size() > 1 && undated != mPieces.end()) {
+        const Piece& other = undated == mPieces.begin() ? mPieces[1] : mPieces[0];
+        return std::pair(other.dumps.front().dump, undated->dumps.front().dump);
+    }
+    std::stable_sort(mPieces.begin(), mPieces.end(),
+                     [&](const Piece& a, const Piece& b) { return takenOf(a) < takenOf(b); });
+    return std::nullopt;
 }
 
 }  // namespace capture

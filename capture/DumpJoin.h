@@ -3,9 +3,10 @@
 #include <cstddef>
 #include <cstdint>
 #include <optional>
+#include <utility>
 #include <vector>
 
-#include "capture/Registration.h"
+#include "capture/dump/Registration.h"
 
 namespace capture {
 
@@ -26,6 +27,9 @@ struct JoinedLines {
     std::vector<DumpLine> lines;
     std::vector<JoinedDump> dumps;  // in the order of what they hold
     std::vector<size_t> gaps;       // lines before which others are missing
+
+    /** Two dumps that do not meet, if there are such and no dates tell which is older. */
+    std::optional<std::pair<size_t, size_t>> unordered;
 };
 
 /**
@@ -38,7 +42,7 @@ public:
     /** `lines`: oldest first, at least one. `taken`: when, as far as it is known. */
     void add(std::vector<Registration> lines, std::optional<int64_t> taken);
 
-    /** All of them. Those that do not meet stand in the order in which they were taken or added. */
+    /** All of them. Those that do not meet stand in the order in which they were taken. */
     JoinedLines finish();
 
 private:
@@ -61,7 +65,9 @@ private:
 
     Match bestMatch(const Piece& piece) const;
     std::optional<int64_t> takenOf(const Piece& piece) const;
-    void sortPieces();
+
+    /** Returns two dumps that keep the pieces from being put in order. */
+    std::optional<std::pair<size_t, size_t>> sortPieces();
 
     std::vector<Piece> mPieces;
     std::vector<std::optional<int64_t>> mTaken;  // by dump

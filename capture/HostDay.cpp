@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "capture/WallTime.h"
-#include "trace/JsonText.h"
+#include "base/Json.h"
+#include "capture/dump/WallTime.h"
 
 namespace capture {
 
@@ -12,94 +12,121 @@ namespace {
 constexpr int64_t kResetDelay = 10 * kMsPerSecond;  // from an hour's reports to its resets
 constexpr int64_t kEndOfDay = 23 * kMsPerHour + 20 * kMsPerSecond;
 
-constexpr int kSystemUid = 1000;
+/** The list by which a host tells a state: its kind, zeros, and the value at the end. */
+struct Notification {
+    int kind;
+    int zeros;
+};
 
-/** The list by which the host tells a state; empty if it has a call of its own. */
-std::string_view notificationOf(State state) {
+Notification notificationOf(State state) {
     switch (state) {
         case State::kDisplay:
-            return "2, 0, ";
-        case State::kCharge:
-            return "";
+            return {2, 1};
         case State::kCamera:
-            return "10, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, ";
+            return {10, 10};
         case State::kCall:
-            return "7, 0, 0, 0, 0, 0, 0, ";
+            return {7, 6};
+        case State::kCharge:
+            break;  // has a call of its own
     }
-    return "";
+    return {};
 }
 
 }  // namespace
 
-void HostDay::start(int64_t at) {
-    call(at, "SDCImpl.getInstance");
-    call(at, "FlowingDataException.notifyBootCompleted");
-    call(at, "SDCImpl.sendBootShutdownRebootState", "1");
-    call(at, "SDCImpl.sendUsedTime", "1");
-    mNextHour = at / kMsPerHour + 1;
+HostDay::HostDay(int64_t start, std::string* trace)
+      : mStart(start),
+        mTrace(trace),
+        mNextHour(start / kMsPerHour + 1) {}
+
+void HostDay::writeStart() {
+    writeCall(mStart, "SDCImpl.getInstance");
+    writeCall(mStart, "FlowingDataException.notifyBootCompleted");
+    writeCall(mStart, "SDCImpl.sendBootShutdownRebootState", 1);
+    writeCall(mStart, "SDCImpl.sendUsedTime", 1);
 }
 
-void HostDay::state(int64_t at, State state, int value) {
-    ticksUpTo(at);
-    const std::string_view list = notificationOf(state);
-    if (list.empty()) {
-        call(at, "SDCImpl.sendChargeState", std::to_string(value));
-    } else {
-        call(at, "SDCImpl.setNotification",
-             std::string("[").append(list) + std::to_string(value) + "]");
-    }
-    mLastState = at;
+void HostDay::writeState(int64_t at, State state, int value) {
+    writeTicksUpTo(at);
+    if (state == State::kCharge) return writeCall(at, "SDCImpl.sendChargeState", value);
+    const Notification notification = notificationOf(state);
+    base::JsonWriter json(mTrace);
+    json.beginObject().member("at", at).member("call", "SDCImpl.setNotification");
+    json.key("args").beginArray().beginArray().value(notification.kind);
+    for (int i = 0; i < notification.zeros; ++i) json.value(0);
+    json.value(value).endArray().endArray().endObject();
+    *mTrace += '\n';
 }
 
-void HostDay::registration(int64_t at, const Registration& registration, int32_t type) {
-    ticksUpTo(at);
-    const std::string package = trace::toJson(registration.package);
-    const std::string opPackage = registration.uid == kSystemUid ? "\"android\"" : package;
-    const int64_t rate = registration.on ? registration.periodUs * 1000 : 0;
-    call(at, "SDCImpl.enableSuccess",
-         std::string(registration.on ? "true" : "false") + ", " + std::to_string(type) + ", " +
-                 package + ", " + opPackage + ", " + std::to_string(rate));
+void HostDay::writeEnable(int64_t at, const EnableCall& call, const trace::Note& note) {
+    writeTicksUpTo(at);
+    base::JsonWriter json(mTrace);
+    json.beginObject().member("at", at).member("call", "SDCImpl.enableSuccess");
+    json.key("args").beginArray().value(call.on).value(call.type);
+    json.value(call.package).value(call.opPackage);
+    json.value(call.on ? call.periodUs * 1000 : 0).endArray();
+    json.key("note");
+    writeNote(note, &json);
+    json.endObject();
+    *mTrace += '\n';
 }
 
-void HostDay::end(int64_t lastLine) {
-    const int64_t last = std::max(lastLine, mLastState);
+void HostDay::writeLine(int64_t at, const trace::Note& note) {
+    writeTicksUpTo(at);
+    base::JsonWriter json(mTrace);
+    json.beginObject().member("at", at).key("note");
+    writeNote(note, &json);
+    json.endObject();
+    *mTrace += '\n';
+}
+
+void HostDay::writeEnd(int64_t at) {
+    writeTicksUpTo(at);
+    base::JsonWriter(mTrace).beginObject().member("at", at).endObject();
+    *mTrace += '\n';
+}
+
+int64_t HostDay::endOf(int64_t last) {
     const int64_t days = (last - kEndOfDay + kMsPerDay - 1) / kMsPerDay;
-    const int64_t at = std::max<int64_t>(days, 0) * kMsPerDay + kEndOfDay;
-    ticksUpTo(at);
-    *mTrace += "{\"at\": " + std::to_string(at) + "}\n";
+    return std::max<int64_t>(days, 0) * kMsPerDay + kEndOfDay;
 }
 
-void HostDay::ticksUpTo(int64_t time) {
+void HostDay::writeTicksUpTo(int64_t time) {
     for (;; mReset = !mReset) {
         const int64_t at = mNextHour * kMsPerHour + (mReset ? kResetDelay : 0);
         if (at > time) return;
-        mReset ? resets(at) : reports(at);
+        mReset ? writeResets(at) : writeReports(at);
         if (mReset) ++mNextHour;
     }
 }
 
-void HostDay::reports(int64_t at) {
+void HostDay::writeReports(int64_t at) {
     if (mNextHour % 24 == 0) {
-        call(at, "SDCImpl.sendUsedTime", std::to_string(mNextHour / 24 + 1));  // days begun
+        writeCall(at, "SDCImpl.sendUsedTime", mNextHour / 24 + 1);  // days begun
     }
-    const std::string hour = std::to_string(mNextHour % 24);
-    call(at, "SDCImpl.notifySdcClock", hour);
-    call(at, "SDCImpl.putRgbShotTally", hour);
-    call(at, "SDCImpl.putPhoneOpenUltraTally", hour);
+    const int64_t hour = mNextHour % 24;
+    writeCall(at, "SDCImpl.notifySdcClock", hour);
+    writeCall(at, "SDCImpl.putRgbShotTally", hour);
+    writeCall(at, "SDCImpl.putPhoneOpenUltraTally", hour);
 }
 
-void HostDay::resets(int64_t at) {
-    const std::string hour = std::to_string(mNextHour % 24);
-    call(at, "SDCImpl.notifySdcReset", hour);
-    call(at, "SDCImpl.notifyRgbShotReset", hour);
-    call(at, "SDCImpl.notifyUltraReset", hour);
+void HostDay::writeResets(int64_t at) {
+    const int64_t hour = mNextHour % 24;
+    writeCall(at, "SDCImpl.notifySdcReset", hour);
+    writeCall(at, "SDCImpl.notifyRgbShotReset", hour);
+    writeCall(at, "SDCImpl.notifyUltraReset", hour);
 }
 
-void HostDay::call(int64_t at, std::string_view name, std::string_view arguments) {
-    *mTrace += "{\"at\": " + std::to_string(at) + ", \"call\": \"";
-    mTrace->append(name).append("\"");
-    if (!arguments.empty()) mTrace->append(", \"args\": [").append(arguments).append("]");
-    mTrace->append("}\n");
+void HostDay::writeCall(int64_t at, std::string_view name) {
+    base::JsonWriter(mTrace).beginObject().member("at", at).member("call", name).endObject();
+    *mTrace += '\n';
+}
+
+void HostDay::writeCall(int64_t at, std::string_view name, int64_t argument) {
+    base::JsonWriter json(mTrace);
+    json.beginObject().member("at", at).member("call", name);
+    json.key("args").beginArray().value(argument).endArray().endObject();
+    *mTrace += '\n';
 }
 
 }  // namespace capture

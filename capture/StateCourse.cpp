@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <utility>
 
-#include "capture/WallTime.h"
+#include "capture/dump/WallTime.h"
 
 namespace capture {
 
@@ -24,12 +24,12 @@ public:
     }
 
     /** Takes what the log says before `end`. */
-    void logBefore(int64_t end) {
-        if (mLogStart < end) logStarts(std::exchange(mLogStart, INT64_MAX));
-        for (; mNext != mEnd && mNext->at < end; ++mNext) log(*mNext);
+    void takeLogBefore(int64_t end) {
+        if (mLogStart < end) startLog(std::exchange(mLogStart, INT64_MAX));
+        for (; mNext != mEnd && mNext->at < end; ++mNext) takeLog(*mNext);
     }
 
-    void history(const HistoryStep& step) {
+    void takeHistory(const HistoryStep& step) {
         if (step.kind == Kind::kValue) {
             setByHistory(step.value);
         } else if (step.kind == Kind::kRecords) {
@@ -40,13 +40,14 @@ public:
     }
 
 private:
-    void logStarts(int64_t at) {
+    /** The log begins. Its first values tell what held before them, back to here. */
+    void startLog(int64_t at) {
         if (mRecords) return;
         mLooksBack[static_cast<size_t>(State::kDisplay)] = at;
         if (!mIsFull) mLooksBack[static_cast<size_t>(State::kCharge)] = at;
     }
 
-    void log(const StateValue& value) {
+    void takeLog(const StateValue& value) {
         ofLog(value.state) = value.value;
         const bool isKept = value.state == State::kCharge && mIsFull;
         if (!mRecords && !isKept) setByLog(value);
@@ -112,11 +113,11 @@ StateCourse mergeSources(const BatteryHistory* history, const EventLog* log) {
     if (history != nullptr) {
         for (const HistoryStep& step : history->steps()) {
             const bool isPause = step.kind != Kind::kValue && step.kind != Kind::kRecords;
-            merge.logBefore(isPause ? step.at + 1 : step.at);
-            merge.history(step);
+            merge.takeLogBefore(isPause ? step.at + 1 : step.at);
+            merge.takeHistory(step);
         }
     }
-    merge.logBefore(INT64_MAX);
+    merge.takeLogBefore(INT64_MAX);
     return merge.course;
 }
 

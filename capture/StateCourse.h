@@ -5,9 +5,9 @@
 #include <optional>
 #include <vector>
 
-#include "capture/BatteryHistory.h"
-#include "capture/EventLog.h"
-#include "capture/StateValue.h"
+#include "capture/dump/BatteryHistory.h"
+#include "capture/dump/EventLog.h"
+#include "capture/dump/StateValue.h"
 
 namespace capture {
 

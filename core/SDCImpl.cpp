@@ -103,8 +103,8 @@ void SDCImpl::handleDisable(int type, std::string pkg, std::string opPkg) {
 
 void SDCImpl::cleanupConnection(const String8& pkg, const String8& opPkg, int type) {
     // [sic] The test guards the first use only. A `String8` is never null, so both uses are safe.
-    if (pkg.string() != nullptr) handleCleanupConnection(type, pkg.string(), opPkg.string());
-    mWechatProxException->enableSuccess(false, type, pkg.string(), opPkg.string());
+    if (pkg.c_str() != nullptr) handleCleanupConnection(type, pkg.c_str(), opPkg.c_str());
+    mWechatProxException->enableSuccess(false, type, pkg.c_str(), opPkg.c_str());
 }
 
 void SDCImpl::handleCleanupConnection(int type, std::string pkg, std::string opPkg) {

@@ -6,14 +6,14 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include "trace/FileIo.h"
+#include "base/FileIo.h"
 
 namespace fuzz {
 
 /** A file with these bytes, open at its start; who takes it closes it. */
 inline int readable(const uint8_t* data, size_t size) {
     const int fd = memfd_create("input", MFD_CLOEXEC);
-    trace::writeAll(fd, data, size);
+    base::writeAll(fd, data, size);
     lseek(fd, 0, SEEK_SET);
     return fd;
 }

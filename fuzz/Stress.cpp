@@ -12,6 +12,7 @@
 #include <thread>
 
 #include <android/log.h>
+
 #include "core/SensorHandlerThread.h"
 #include "core/TallyCommon.h"
 #include "platform/PropertyService.h"

@@ -6,7 +6,7 @@ _sensor_replay() {
     [[ ${COMP_WORDS[COMP_CWORD - 1]} != --jobs ]] || return
     if [[ $word == -* ]]; then
         local options='--help --version --log --json --all --merge --print-trace --check --jobs
-            --properties --timeline --page --list-calls'
+            --properties --timeline --page --uses --since-charge --baseline --list-calls'
         mapfile -t COMPREPLY < <(compgen -W "$options" -- "$word")
     else
         compopt -o filenames

@@ -132,6 +132,12 @@ DisplayFault displayFault() {
     return display.state->fault;
 }
 
+DisplaySize displaySize() {
+    Display& display = Display::get();
+    const std::lock_guard lock(display.mutex);
+    return display.state->size;
+}
+
 uint32_t displayRowPadding() {
     Display& display = Display::get();
     const std::lock_guard lock(display.mutex);

@@ -22,10 +22,14 @@ namespace platform {
 /** What makes captures fail. */
 enum class DisplayFault {
     kNone,
-    kToken,    // the display has no token
-    kCapture,  // captures are refused
-    kResults,  // captures complete without success
-    kLock,     // captured buffers cannot be locked
+    kToken,      // the display has no token
+    kCapture,    // captures are refused
+    kResults,    // captures complete without success
+    kLock,       // captured buffers cannot be locked
+    kListener,   // captures are refused, as the listener is told; the call succeeds
+    kTwice,      // captures complete twice: first for lack of memory, then with a buffer
+    kNoDisplay,  // there is no display
+    kFence,      // the fence of a captured buffer signals an error
 };
 
 struct DisplaySize {
@@ -65,6 +69,7 @@ std::optional<std::string> shareDisplay();
 std::optional<std::string> changeDisplay(const DisplayChange& change);
 
 DisplayFault displayFault();
+DisplaySize displaySize();
 uint32_t displayRowPadding();
 
 /** Prepares `copyDisplay` for what the display shows now. Returns false if memory is lacking. */

@@ -28,12 +28,16 @@ using android::GraphicBuffer;
 using android::NAME_NOT_FOUND;
 using android::NO_MEMORY;
 using android::OK;
+using android::PERMISSION_DENIED;
+using android::PhysicalDisplayId;
 using android::Rect;
 using android::sp;
 using android::status_t;
 using android::UNKNOWN_ERROR;
 
 namespace {
+
+constexpr PhysicalDisplayId kDisplayId = {1};
 
 class DisplayToken : public android::IBinder {};
 
@@ -43,10 +47,14 @@ const sp<android::IBinder>& displayToken() {
     return *instance;
 }
 
+bool isDisplay(const sp<android::IBinder>& token) {
+    return token == displayToken() && displayFault() != DisplayFault::kNoDisplay;
+}
+
 /** Whether the display serves the request. It neither scales nor converts. */
 status_t judge(const DisplayCaptureArgs& args) {
     if (args.displayToken == nullptr) return BAD_VALUE;
-    if (args.displayToken != displayToken()) return NAME_NOT_FOUND;
+    if (!isDisplay(args.displayToken)) return NAME_NOT_FOUND;
     const int64_t width = int64_t{args.sourceCrop.right} - args.sourceCrop.left;
     const int64_t height = int64_t{args.sourceCrop.bottom} - args.sourceCrop.top;
     const bool isServed = width > 0 && width <= Picture::kMaxSide && height > 0 &&
@@ -54,7 +62,14 @@ status_t judge(const DisplayCaptureArgs& args) {
                           args.height == height && args.frameScaleX == 1 && args.frameScaleY == 1 &&
                           args.pixelFormat == android::ui::PixelFormat::RGBA_8888;
     if (!isServed) return BAD_VALUE;
-    return displayFault() == DisplayFault::kCapture ? UNKNOWN_ERROR : OK;
+    switch (displayFault()) {
+        case DisplayFault::kCapture:
+            return UNKNOWN_ERROR;
+        case DisplayFault::kListener:
+            return PERMISSION_DENIED;
+        default:
+            return OK;
+    }
 }
 
 }  // namespace
@@ -70,6 +85,7 @@ public:
         bool secure;
         uint32_t rowPadding;
         DisplayFault fault;
+        status_t refusal;  // OK: none
         sp<android::IScreenCaptureListener> listener;
     };
 
@@ -102,12 +118,20 @@ private:
 
     static void complete(Request request) {
         const auto signal = std::make_shared<Fence::Signal>();
+        if (request.fault == DisplayFault::kFence) signal->status = -EINVAL;
         sp<GraphicBuffer> buffer;
         {
             android::gui::ScreenCaptureResults results;
             results.fence = new Fence(signal);
             results.capturedSecureLayers = request.secure;
-            if (request.fault == DisplayFault::kResults) {
+            if (request.fault == DisplayFault::kTwice) {
+                results.result = NO_MEMORY;
+                request.listener->onScreenCaptureCompleted(results);
+                results.result = OK;
+            }
+            if (request.refusal != OK) {
+                results.result = request.refusal;
+            } else if (request.fault == DisplayFault::kResults) {
                 results.result = UNKNOWN_ERROR;
             } else if (buffer = makeBuffer(request); buffer == nullptr) {
                 results.result = NO_MEMORY;
@@ -194,9 +218,9 @@ const sp<Fence> Fence::NO_FENCE(new Fence);
 status_t Fence::wait(int timeoutMs) {
     if (!isValid()) return OK;
     std::unique_lock lock(mSignal->mutex);
-    if (timeoutMs == 0) return mSignal->isGiven ? OK : -ETIME;
+    if (timeoutMs == 0 && !mSignal->isGiven) return -ETIME;
     mSignal->given.wait(lock, [this] { return mSignal->isGiven; });
-    return OK;
+    return mSignal->status;
 }
 
 status_t Fence::waitForever(const char*) {
@@ -237,17 +261,37 @@ status_t GraphicBuffer::unlock() {
 }
 
 sp<IBinder> SurfaceComposerClient::getInternalDisplayToken() {
-    if (platform::displayFault() == DisplayFault::kToken) return nullptr;
+    const DisplayFault fault = platform::displayFault();
+    if (fault == DisplayFault::kToken || fault == DisplayFault::kNoDisplay) return nullptr;
     return platform::displayToken();
+}
+
+std::vector<PhysicalDisplayId> SurfaceComposerClient::getPhysicalDisplayIds() {
+    if (platform::displayFault() == DisplayFault::kNoDisplay) return {};
+    return {platform::kDisplayId};
+}
+
+sp<IBinder> SurfaceComposerClient::getPhysicalDisplayToken(PhysicalDisplayId displayId) {
+    return displayId.value == platform::kDisplayId.value ? getInternalDisplayToken() : nullptr;
+}
+
+status_t SurfaceComposerClient::getDisplayState(const sp<IBinder>& display,
+                                                ui::DisplayState* state) {
+    if (!platform::isDisplay(display)) return NAME_NOT_FOUND;
+    const platform::DisplaySize size = platform::displaySize();
+    *state = {ui::Rotation::Rotation0,
+              {static_cast<int32_t>(size.width), static_cast<int32_t>(size.height)}};
+    return OK;
 }
 
 status_t ScreenshotClient::captureDisplay(const DisplayCaptureArgs& captureArgs,
                                           const sp<IScreenCaptureListener>& captureListener) {
     if (captureListener == nullptr) return BAD_VALUE;
-    if (const status_t status = platform::judge(captureArgs)) return status;
+    const DisplayFault fault = platform::displayFault();
+    const status_t refusal = platform::judge(captureArgs);
+    if (refusal != OK && fault != DisplayFault::kListener) return refusal;
     CaptureThread::get().post({captureArgs.sourceCrop, captureArgs.captureSecureLayers,
-                               platform::displayRowPadding(), platform::displayFault(),
-                               captureListener});
+                               platform::displayRowPadding(), fault, refusal, captureListener});
     return OK;
 }
 

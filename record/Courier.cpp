@@ -13,20 +13,20 @@ constexpr int kMostYields = 100;
 }  // namespace
 
 void Courier::handleMessage(const android::Message& message) {
-    switch (mRecorder->beginMessage(&mRun, mYields < kMostYields)) {
-        case Timeline::Turn::kNever:
+    switch (mRecorder->beginMessage(&mStint, mYields < kMostYields)) {
+        case LineTimes::Turn::kNever:
             return;
-        case Timeline::Turn::kLater:
+        case LineTimes::Turn::kLater:
             ++mYields;
             return mThread->sendMessage(this, message.what);
-        case Timeline::Turn::kNow:
+        case LineTimes::Turn::kNow:
             break;
     }
     {
-        const Run::Scope scope(&mRun);
+        const Stint::Scope scope(&mStint);
         mHandler->handleMessage(message);
     }
-    mRecorder->end(&mRun);
+    mRecorder->endMessage(&mStint);
 }
 
 }  // namespace record

@@ -3,7 +3,7 @@
 #include <utils/Looper.h>
 #include <utils/StrongPointer.h>
 
-#include "record/Run.h"
+#include "record/Stint.h"
 
 namespace android {
 class SensorHandlerThread;
@@ -22,25 +22,25 @@ public:
           : mRecorder(recorder),
             mThread(thread),
             mHandler(std::move(handler)),
-            mRun(this) {}
+            mStint(this) {}
 
-    Run* run() { return &mRun; }
+    Stint* stint() { return &mStint; }
 
-    /** The one that carries the message of `run`. */
-    static Courier* of(Run* run) { return static_cast<MessageRun*>(run)->courier; }
+    /** The one that carries the message of `stint`. */
+    static Courier* of(Stint* stint) { return static_cast<MessageStint*>(stint)->courier; }
 
     void handleMessage(const android::Message& message) override;
 
 private:
-    struct MessageRun final : public Run {
-        explicit MessageRun(Courier* owner) : courier(owner) {}
+    struct MessageStint final : public Stint {
+        explicit MessageStint(Courier* owner) : courier(owner) {}
         Courier* const courier;
     };
 
     Recorder* const mRecorder;
     android::SensorHandlerThread* const mThread;
     const Handler mHandler;
-    MessageRun mRun;
+    MessageStint mStint;
     int mYields = 0;  // how often others have come first
 };
 

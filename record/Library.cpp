@@ -16,10 +16,14 @@ namespace {
     std::abort();
 }
 
-/** The library, which the host has loaded; a host that links its calls only may have left it out.
- */
+/** The library, which the host has loaded; one that links its calls only may have left it out. */
 void* library() {
-    static void* const handle = dlopen("libsensor-priv.so", RTLD_NOW | RTLD_LOCAL);
+    static std::atomic<void*> found{nullptr};
+    void* handle = found.load(std::memory_order_acquire);
+    if (handle == nullptr) {
+        handle = dlopen("libsensor-priv.so", RTLD_NOW | RTLD_LOCAL);
+        found.store(handle, std::memory_order_release);
+    }
     return handle;
 }
 

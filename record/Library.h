@@ -1,5 +1,7 @@
 #pragma once
 
+#include <atomic>
+#include <cstdint>
 #include <cstring>
 
 namespace record {
@@ -17,20 +19,60 @@ void* findReal(const void* address);
 /** The exported variable `name` as the library sees it; null if it has none. */
 const void* findVariable(const char* name);
 
-/** The library's own `operation`, as a function that takes the object first. */
-template <typename Result, typename Class, typename... Parameters>
-auto real(Result (Class::*operation)(Parameters...)) {
-    // The platform's ABI: a pointer to a member that is not virtual begins with the address, and
-    // the object is passed as a first parameter would be.
-    const void* address = nullptr;
-    std::memcpy(&address, &operation, sizeof(address));
-    return reinterpret_cast<Result (*)(Class*, Parameters...)>(findReal(address));
+/**
+ * A function that is looked for at its first call. Unlike a local static with an initialiser, it
+ * can be asked for again while it is looked for: by the log function of the host, or in a forked
+ * child.
+ */
+template <typename Function>
+class Found {
+public:
+    template <typename Find>
+    Function get(Find find) {
+        Function function = mFunction.load(std::memory_order_acquire);
+        if (function == nullptr) {
+            function = reinterpret_cast<Function>(find());
+            mFunction.store(function, std::memory_order_release);
+        }
+        return function;
+    }
+
+private:
+    std::atomic<Function> mFunction{nullptr};
+};
+
+/** The function `name` behind the recorder. */
+template <typename Function>
+Function next(Found<Function>* found, const char* name) {
+    return found->get([name] { return findNext(name); });
 }
 
+template <typename Operation>
+struct AsFunction;
+template <typename Result, typename Class, typename... Parameters>
+struct AsFunction<Result (Class::*)(Parameters...)> {
+    using Type = Result (*)(Class*, Parameters...);
+};
 template <typename Result, typename... Parameters>
-auto real(Result (*operation)(Parameters...)) {
-    return reinterpret_cast<Result (*)(Parameters...)>(
-            findReal(reinterpret_cast<const void*>(operation)));
+struct AsFunction<Result (*)(Parameters...)> {
+    using Type = Result (*)(Parameters...);
+};
+
+/** The library's own `Operation`, as a function that takes the object, if any, first. */
+template <auto Operation>
+auto real() {
+    static Found<typename AsFunction<decltype(Operation)>::Type> found;
+    return found.get([] {
+        // The platform's ABI: a pointer to a member that is not virtual begins with the address,
+        // and the object is passed as a first parameter would be.
+        const auto operation = Operation;
+        const void* address = nullptr;
+        std::memcpy(&address, &operation, sizeof(address));
+        return findReal(address);
+    });
 }
+
+/** Nanoseconds of the monotonic clock, which never stands still here. */
+int64_t realNow();
 
 }  // namespace record

@@ -1,66 +1,232 @@
 #include "record/Parts.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <csignal>
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 
 #include <fcntl.h>
+#include <pthread.h>
 #include <sys/file.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 namespace record {
 
-Parts::Error Parts::open(const std::string& folder, size_t bytes) {
+namespace {
+
+/** How a part begins; 0 stands for any digit. */
+constexpr std::string_view kBegin = "# 0000-00-00T00:00:00Z: process ";
+
+constexpr size_t kNoteRoom = 1024;
+constexpr size_t kRoom = size_t{64} << 10;  // taken in advance
+
+/** To delete a file of this size takes longer than to start a thread. */
+constexpr off_t kLargeFile = off_t{4} << 20;
+
+bool isPart(int fd) {
+    char bytes[kBegin.size()];
+    const ssize_t count = pread(fd, bytes, sizeof(bytes), 0);
+    for (ssize_t i = 0; i < count; ++i) {
+        const char expected = kBegin[static_cast<size_t>(i)];
+        const bool isDigit = bytes[i] >= '0' && bytes[i] <= '9';
+        if (expected == '0' ? !isDigit : bytes[i] != expected) return false;
+    }
+    return count >= 0;
+}
+
+/** How long a file may become: a longer write would be a signal that ends the process. */
+rlim_t fileLimit() {
+    rlimit limit{};
+    return getrlimit(RLIMIT_FSIZE, &limit) == 0 ? limit.rlim_cur : RLIM_INFINITY;
+}
+
+void* closeFile(void* fd) {
+    close(static_cast<int>(reinterpret_cast<intptr_t>(fd)));
+    return nullptr;
+}
+
+/** Closes the last descriptor of a file that has no name any more, which deletes it. */
+void closeLast(int fd) {
+    struct stat status {};
+    // NOLINTNEXTLINE(performance-no-int-to-ptr): a thread takes nothing else
+    void* const argument = reinterpret_cast<void*>(intptr_t{fd});
+    if (fstat(fd, &status) == 0 && status.st_size < kLargeFile) {
+        closeFile(argument);
+        return;
+    }
+    // The host's signals are not for this thread.
+    sigset_t all;
+    sigset_t before;
+    sigfillset(&all);
+    pthread_sigmask(SIG_SETMASK, &all, &before);
+    pthread_t thread{};
+    if (pthread_create(&thread, nullptr, closeFile, argument) == 0) {
+        pthread_detach(thread);
+    } else {
+        closeFile(argument);
+    }
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+}
+
+}  // namespace
+
+Error Parts::open(const std::string& folder, size_t bytes) {
     mPath = folder + "/sensor-priv.jsonl";
     mOldPath = folder + "/sensor-priv.old.jsonl";
     mMaxSize = bytes / 2;
-    if (Error error = openPart()) return error;
-    return cutTornLine();
-}
-
-void Parts::close() {
-    if (mFd >= 0) ::close(mFd);
-    mFd = -1;
-}
-
-Parts::Error Parts::startNext() {
-    close();
-    if (rename(mPath.c_str(), mOldPath.c_str()) != 0) return fail("cannot be renamed");
     return openPart();
 }
 
-Parts::Error Parts::write(std::string_view lines) {
-    const ssize_t written = ::write(mFd, lines.data(), lines.size());
-    if (written != static_cast<ssize_t>(lines.size())) {
-        const int reason = written < 0 ? errno : ENOSPC;
+Error Parts::resume(size_t bytes) {
+    if (findHarm()) return openPart();
+    if (Error error = reserve(bytes)) return error;
+    cutNote();
+    return {};
+}
+
+void Parts::abandon() {
+    if (mFd >= 0) ::close(mFd);
+    mFd = -1;
+    mNoteSize = 0;
+}
+
+void Parts::close() {
+    // Gives back the room that was taken in advance, too.
+    if (!findHarm()) cutNote();
+    abandon();
+}
+
+void Parts::cutNote() {
+    [[maybe_unused]] const int cut = ftruncate(mFd, static_cast<off_t>(mSize));
+    mNoteSize = 0;
+    mReserved = 0;
+}
+
+Error Parts::findHarm() {
+    struct stat status {};
+    if (mFd < 0) return complain(mPath, "is closed");
+    if (fstat(mFd, &status) != 0 || status.st_dev != mDevice || status.st_ino != mNumber) {
+        mFd = -1;  // somebody else's by now
+        return complain(mPath, "was closed by the host");
+    }
+    mIsGone = status.st_nlink == 0 || static_cast<size_t>(status.st_size) < mSize + mNoteSize;
+    if (status.st_nlink == 0) return fail("was removed");
+    if (mIsGone) return fail("was cut");
+    mSize = static_cast<size_t>(status.st_size) - mNoteSize;  // a child may have added to it
+    return {};
+}
+
+Error Parts::startNext() {
+    int old = -1;
+    if (Error error = openOwnFile(mOldPath, &old)) return error;
+    Error error;
+    struct stat named {};
+    // A part that was given another name keeps it.
+    const bool hasName =
+            lstat(mPath.c_str(), &named) == 0 && named.st_dev == mDevice && named.st_ino == mNumber;
+    if (!isPart(old)) {
+        error = complain(mOldPath, "is no part of a record");
+    } else if (hasName && rename(mPath.c_str(), mOldPath.c_str()) != 0) {
+        error = complain(mPath, "cannot be renamed", errno);
+    } else {
+        close();
+        error = openPart();
+    }
+    closeLast(old);
+    return error;
+}
+
+Error Parts::write(std::string_view lines) {
+    if (Error error = findHarm()) return error;
+    if (Error error = reserve(lines.size())) return error;
+    if (!append(lines)) {
+        const int reason = errno;
         [[maybe_unused]] const int cut = ftruncate(mFd, static_cast<off_t>(mSize));  // or by `open`
-        errno = reason;
-        return fail("cannot be written");
+        return complain(mPath, "cannot be written", reason);
     }
     mSize += lines.size();
     return {};
 }
 
-Parts::Error Parts::openPart() {
-    mFd = ::open(mPath.c_str(), O_RDWR | O_CREAT | O_APPEND | O_CLOEXEC, 0640);
-    if (mFd < 0) return fail("cannot be opened");
-    // Two processes would write two clocks into one trace.
-    if (flock(mFd, LOCK_EX | LOCK_NB) != 0) return fail("is written by another process");
-    struct stat status {};
-    if (fstat(mFd, &status) != 0) return fail("cannot be read");
-    mSize = static_cast<size_t>(status.st_size);
-    return {};
+void Parts::writeNote(std::string_view line) {
+    if (findHarm() || line.size() > kNoteRoom || fileLimit() < mSize + line.size()) return;
+    if (append(line)) {
+        mNoteSize = line.size();
+    } else {
+        [[maybe_unused]] const int cut = ftruncate(mFd, static_cast<off_t>(mSize));
+    }
 }
 
-Parts::Error Parts::cutTornLine() {
+void Parts::writeBeside(std::string_view line) const {
+    int fd = -1;
+    if (openOwnFile(mPath, &fd)) return;
+    struct stat status {};
+    if (isPart(fd) && fstat(fd, &status) == 0 &&
+        fileLimit() >= static_cast<size_t>(status.st_size) + line.size()) {
+        [[maybe_unused]] const ssize_t written = ::write(fd, line.data(), line.size());
+    }
+    ::close(fd);
+}
+
+bool Parts::append(std::string_view text) const {
+    const ssize_t written = ::write(mFd, text.data(), text.size());
+    if (written >= 0 && written < static_cast<ssize_t>(text.size())) errno = ENOSPC;
+    return written == static_cast<ssize_t>(text.size());
+}
+
+/** Makes sure that `bytes` and a note can be written, and that nobody dies of trying. */
+Error Parts::reserve(size_t bytes) {
+    const size_t needed = mSize + bytes + kNoteRoom;
+    const rlim_t limit = fileLimit();
+    if (limit < needed) return complain(mPath, "cannot be written", EFBIG);
+    if (needed <= mReserved) return {};
+    for (const size_t more : {needed + kRoom, needed}) {
+        const auto end = static_cast<size_t>(std::min<rlim_t>(more, limit));
+        const int status = fallocate(mFd, FALLOC_FL_KEEP_SIZE, static_cast<off_t>(mSize),
+                                     static_cast<off_t>(end - mSize));
+        // A file system that cannot do this says so in one of many ways.
+        if (status == 0 || (errno != ENOSPC && errno != EDQUOT)) {
+            mReserved = end;
+            return {};
+        }
+    }
+    return complain(mPath, "cannot be written", errno);
+}
+
+Error Parts::openPart() {
+    mReserved = 0;
+    mIsGone = false;
+    if (Error error = openOwnFile(mPath, &mFd)) {
+        mFd = -1;
+        return error;
+    }
+    // Two processes would write two clocks into one trace.
+    if (flock(mFd, LOCK_EX | LOCK_NB) != 0) return fail("is written by another process");
+    if (!isPart(mFd)) return fail("is no part of a record");
+    if (Error error = hideFromOthers(mPath, mFd)) {
+        abandon();
+        return error;
+    }
+    struct stat status {};
+    if (fstat(mFd, &status) != 0) return fail("cannot be read", errno);
+    mDevice = status.st_dev;
+    mNumber = status.st_ino;
+    mSize = static_cast<size_t>(status.st_size);
+    return cutTornLine();
+}
+
+Error Parts::cutTornLine() {
     const size_t whole = mSize;
     char block[4096];
     while (mSize > 0) {
         const size_t count = mSize < sizeof(block) ? mSize : sizeof(block);
         const auto from = static_cast<off_t>(mSize - count);
         if (pread(mFd, block, count, from) != static_cast<ssize_t>(count)) {
-            return fail("cannot be read");
+            return fail("cannot be read", errno);
         }
         const void* const end = memrchr(block, '\n', count);
         mSize -= count;
@@ -69,13 +235,12 @@ Parts::Error Parts::cutTornLine() {
         break;
     }
     if (mSize == whole || ftruncate(mFd, static_cast<off_t>(mSize)) == 0) return {};
-    return fail("cannot be written");
+    return fail("cannot be written", errno);
 }
 
-Parts::Error Parts::fail(const char* what) {
-    std::string error = mPath + ' ' + what + ": " + std::strerror(errno);
-    close();
-    return error;
+Error Parts::fail(const char* what, int reason) {
+    abandon();
+    return complain(mPath, what, reason);
 }
 
 }  // namespace record

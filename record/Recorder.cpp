@@ -1,15 +1,21 @@
 #include "record/Recorder.h"
 
 #include <ctime>
+#include <limits>
+#include <new>
+#include <utility>
 
 #include <android/log.h>
-#include <cutils/properties.h>
 #include <pthread.h>
+#include <sys/mman.h>
 #include <unistd.h>
 
-#include "record/Arguments.h"
-#include "record/JsonText.h"
+#include "base/Calendar.h"
+#include "base/Json.h"
+#include "record/CallText.h"
+#include "record/Library.h"
 #include "record/Log.h"
+#include "trace/TraceWriter.h"
 
 namespace record {
 
@@ -18,11 +24,16 @@ namespace {
 /** What a part keeps free for what the library does after a call has found room. */
 constexpr size_t kReserve = size_t{64} << 10;
 
-int64_t monotonicNow() {
-    timespec now{};
-    clock_gettime(CLOCK_MONOTONIC, &now);
-    return int64_t{now.tv_sec} * 1'000'000'000 + now.tv_nsec;
-}
+/** While lines are lost, the record is tried to go on this often. */
+constexpr int64_t kRetryNs = 1'000'000'000;
+
+// Lines are not held back for longer than this for a stint that hangs in somebody else's code, nor
+// are more of them than that.
+constexpr int64_t kHangNs = 2'000'000'000;
+constexpr size_t kMostHeld = size_t{256} << 10;
+
+/** The note of a forked child lies this far ahead of all that its parent has dated. */
+constexpr int64_t kChildAheadNs = 2'000'000;
 
 /** For a person who looks for something that happened at a time of the day. */
 std::string date() {
@@ -44,188 +55,349 @@ constexpr int kQuietUs = 200;
 constexpr int kQuietTurns = 20;
 constexpr int kMostTurns = 250;
 
+// Whole milliseconds: `from` and `to` lie around what they name.
+std::string lostNote(int64_t from, int64_t to, const std::string& why) {
+    std::string body;
+    base::JsonWriter json(&body);
+    json.key("note").beginObject().key("lost").beginObject();
+    json.member("from", from / base::kNsPerMs);
+    json.member("to", (to + base::kNsPerMs - 1) / base::kNsPerMs);
+    json.member("why", why).endObject().endObject();
+    return body;
+}
+
+std::string hangNote(int64_t from) {
+    std::string body;
+    base::JsonWriter json(&body);
+    json.key("note").beginObject().key("hang").beginObject();
+    json.member("from", from / base::kNsPerMs).endObject().endObject();
+    return body;
+}
+
+std::string lineOf(int64_t at, std::string_view body) {
+    std::string line;
+    base::JsonWriter json(&line);
+    json.beginObject().member("at", base::Ms{at});
+    if (!body.empty()) json.raw(body);
+    json.endObject();
+    return line += '\n';
+}
+
+void log(int level, const std::string& text) {
+    __android_log_print(level, kLogTag, "%s", text.c_str());
+}
+
+// How the first call settles whether there is a record. A plain lock: it must be there before any
+// initialiser has run.
+pthread_mutex_t gStartLock = PTHREAD_MUTEX_INITIALIZER;
+std::atomic<bool> gIsSettled{false};
+thread_local bool tIsSettling = false;
+
+// Of a forked child.
+std::atomic<bool> gIsChild{false};
+int64_t gForked = 0;  // when
+
 }  // namespace
+
+/** What a forked child shares with its parent, which alone may write lines in order. */
+struct Recorder::Shared {
+    std::atomic<int64_t> floor;   // no later line of the parent has a time before this
+    std::atomic<bool> isWriting;  // the parent may be about to write lines
+};
 
 std::atomic<Recorder*> Recorder::sWriting{nullptr};
 std::atomic<Recorder*> Recorder::sStarted{nullptr};
 std::atomic<bool> Recorder::sWantsEvents{false};
+Recorder::Shared* Recorder::sParents = nullptr;
+
+/** Holds the lock. What there is to be said is logged after it: the log may be the host's code. */
+class SCOPED_CAPABILITY Recorder::Section {
+public:
+    explicit Section(Recorder* recorder) ACQUIRE(recorder->mLock) : mRecorder(*recorder) {
+        mRecorder.lock();
+    }
+    ~Section() RELEASE() {
+        const std::string said = std::exchange(mRecorder.mSaid, {});
+        mRecorder.unlock();
+        if (!said.empty()) log(ANDROID_LOG_ERROR, said);
+    }
+    Section(const Section&) = delete;
+    Section& operator=(const Section&) = delete;
+
+private:
+    Recorder& mRecorder;
+};
+
+void Recorder::lock() {
+    mLock.lock();
+    if (mShared == nullptr) return;
+    mShared->isWriting = true;
+    mTimes.raise(mShared->floor);
+}
+
+void Recorder::unlock() {
+    if (mShared != nullptr) mShared->isWriting = false;
+    mLock.unlock();
+}
 
 Recorder* Recorder::get() {
-    static const bool started = (start(), true);
-    return started ? sWriting.load(std::memory_order_acquire) : nullptr;
+    if (!gIsSettled.load(std::memory_order_acquire)) settle();
+    return sWriting.load(std::memory_order_acquire);
+}
+
+Recorder* Recorder::getForCall() {
+    Recorder* const recorder = get();
+    if (recorder == nullptr && gIsChild && gIsChild.exchange(false)) sStarted.load()->noteChild();
+    return recorder;
 }
 
 Recorder* Recorder::getOnceStarted() {
     return sStarted.load(std::memory_order_acquire);
 }
 
-void Recorder::start() {
+/** What is called meanwhile, such as the log function of the host, may call the library. */
+void Recorder::settle() {
+    if (tIsSettling) return;
+    std::string said;
+    pthread_mutex_lock(&gStartLock);
+    if (!gIsSettled) {
+        tIsSettling = true;
+        said = start();
+        tIsSettling = false;
+        gIsSettled.store(true, std::memory_order_release);
+    }
+    pthread_mutex_unlock(&gStartLock);
+    if (!said.empty()) log(sWriting != nullptr ? ANDROID_LOG_INFO : ANDROID_LOG_ERROR, said);
+}
+
+/** Returns what is to be logged. */
+std::string Recorder::start() {
     const Settings settings = Settings::read();
-    if (settings.folder.empty()) return;
+    if (settings.folder.empty()) return {};
     auto* const recorder = new Recorder;  // never destroyed: the worker uses it
     if (const auto error = recorder->begin(settings)) {
-        __android_log_print(ANDROID_LOG_ERROR, kLogTag, "nothing is recorded: %s", error->c_str());
         delete recorder;
-        return;
+        return "nothing is recorded: " + *error;
     }
     sStarted = recorder;
     sWriting = recorder;
-    pthread_atfork(nullptr, nullptr, leaveToParent);
+    const android::Mutex::Autolock lock(recorder->mLock);
+    return "recording to " + recorder->mParts.path();
 }
 
-/** In a forked child, which has no worker, and may have got the lock locked. */
-void Recorder::leaveToParent() {
-    Recorder* const recorder = sStarted.exchange(nullptr);
-    if (recorder == nullptr) return;
-    sWriting = nullptr;
-    sWantsEvents = false;
-    recorder->mParts.close();  // the parent's next process could not write the file otherwise
+const int Recorder::sForkWatch = pthread_atfork(beforeFork, afterFork, beginChild);
+
+/** A child must not get a lock that another thread holds: that thread is not in the child. */
+void Recorder::beforeFork() {
+    if (!tIsSettling) pthread_mutex_lock(&gStartLock);
+    if (Recorder* const recorder = sStarted) recorder->mLock.lock();
 }
 
-Parts::Error Recorder::begin(const Settings& settings) {
-    const android::Mutex::Autolock lock(mLock);
-    if (settings.hidesNames) {
-        const auto key = Names::loadKey(settings.folder);
-        if (!key) return settings.folder + " keeps no key for names";
-        mNames = std::make_unique<Names>(*key);
+void Recorder::afterFork() {
+    if (Recorder* const recorder = sStarted) recorder->mLock.unlock();
+    if (!tIsSettling) pthread_mutex_unlock(&gStartLock);
+}
+
+/** The child has no worker, and its parent goes on with the record. */
+void Recorder::beginChild() {
+    if (Recorder* const recorder = sWriting.exchange(nullptr)) {
+        recorder->mParts.abandon();  // the parent's next process could not write the file otherwise
+        recorder->mLoss = Loss{0, {}, true, std::numeric_limits<int64_t>::max()};  // for ever
+        recorder->mOrder.clear();
+        sWantsEvents = false;
+        sParents = std::exchange(recorder->mShared, nullptr);
+        gForked = realNow();
+        gIsChild = true;
     }
+    afterFork();
+}
+
+/** The first call in a forked child: the trace says that the child's calls are missing. */
+void Recorder::noteChild() {
+    if (sParents == nullptr) return;
+    const int64_t at = realNow() + kChildAheadNs;
+    sParents->floor = at;
+    constexpr int kMostWaits = 100;  // the parent may have been killed while it wrote
+    for (int i = 0; i < kMostWaits && sParents->isWriting; ++i) usleep(1000);
+    const android::Mutex::Autolock lock(mLock);
+    const std::string why = "process " + std::to_string(getpid()) +
+                            " was forked, and what it calls is not recorded";
+    mParts.writeBeside(lineOf(at, lostNote(gForked, at, why)));
+}
+
+Error Recorder::begin(const Settings& settings) {
+    const android::Mutex::Autolock lock(mLock);
     if (auto error = mParts.open(settings.folder, settings.bytes)) return error;
+    if (settings.hidesNames) {
+        HashKey key{};
+        if (auto error = Pseudonyms::loadKey(settings.folder, &key)) return error;
+        mPseudonyms = std::make_unique<Pseudonyms>(key);
+    }
     if (mParts.isFullFor(kReserve)) {
         if (auto error = mParts.startNext()) return error;
     }
-    mText = "# " + date() + ": process " + std::to_string(getpid()) + " begins\n";
-    appendStart(mTimeline.next(monotonicNow()));
-    if (auto error = mParts.write(mText)) return error;
-    mText.clear();
-    __android_log_print(ANDROID_LOG_INFO, kLogTag, "recording to %s", mParts.path().c_str());
+    void* const memory = mmap(nullptr, sizeof(Shared), PROT_READ | PROT_WRITE,
+                              MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+    if (memory != MAP_FAILED) mShared = new (memory) Shared{};
+    mWrittenTo = mPartBegan = mTimes.next(realNow());
+    appendStart(mWrittenTo, "begins", {});
+    write();
     return {};
 }
 
-void Recorder::beginCall(Run* run, const Call& call) {
-    const android::Mutex::Autolock lock(mLock);
-    if (!mParts.isOpen()) return;
-    const int64_t at = mTimeline.next(monotonicNow());
+void Recorder::beginCall(Stint* stint, const CallLine& call) {
+    const Section section(this);
+    const int64_t real = realNow();
+    stint->now = real;
+    if (!isReady(real)) return;
+    const int64_t at = mTimes.next(real);
     if (mParts.isFullFor(call.body.size() + kReserve)) startPart(at);
-    if (call.readsProperties) appendAny(at, mSurroundings.takeProperties());
+    if (call.reads == Reads::kAll) appendAny(at, mSurroundings.takeProperties());
+    if (call.reads == Reads::kTestMode) {
+        appendAny(at, mSurroundings.takeProperties("persist.sys.skip_restrict"));
+    }
     appendAny(at, mSurroundings.takeVariables());
     if (call.isSample) appendAny(at, mScreen.take(call.rgb, call.rect));
     append(at, call.body);
-    write();
-    run->clockStands = true;
-    mTimeline.beginCall(run);
-    mRuns.begin(run);
+    if (!write()) return;
+    stint->clockStands = true;
+    stint->generation = mGeneration;
+    mTimes.beginCall(stint, real);
+    mOrder.begin(stint);
+    leaveHanging(real);
 }
 
-Timeline::Turn Recorder::beginMessage(Run* message, bool canYield) {
-    const android::Mutex::Autolock lock(mLock);
+LineTimes::Turn Recorder::beginMessage(Stint* message, bool canYield) {
+    const Section section(this);
     waitForQuiet(*message);
-    const Timeline::Turn turn = mTimeline.turnOf(*message);
-    if (turn == Timeline::Turn::kNever || (turn == Timeline::Turn::kLater && canYield)) return turn;
-    for (Run* run : mTimeline.start(message)) mRuns.begin(run);
-    message->clockStands = mParts.isOpen();
+    const LineTimes::Turn turn = mTimes.turnOf(*message);
+    if (turn == LineTimes::Turn::kNever) return turn;
+    if (turn == LineTimes::Turn::kLater && canYield) return turn;
+    for (Stint* stint : mTimes.start(message, realNow())) {
+        if (!mLoss) mOrder.begin(stint);
+    }
+    message->clockStands = !mLoss;
+    message->generation = mGeneration;
     message->tellsMoment = true;
-    return Timeline::Turn::kNow;
+    return LineTimes::Turn::kNow;
 }
 
-void Recorder::waitForQuiet(const Run& message) {
-    for (int turn = 0; turn < kMostTurns && mParts.isOpen(); ++turn) {
-        if (mTimeline.hasBegun(message) ||
-            mTimeline.isQuiet(monotonicNow(), int64_t{kQuietUs} * 1000)) {
-            return;
-        }
-        if (turn >= kQuietTurns && !mTimeline.hasOpenCalls()) return;
-        mLock.unlock();
+void Recorder::waitForQuiet(const Stint& message) {
+    for (int turn = 0; turn < kMostTurns && !mLoss; ++turn) {
+        const int64_t real = realNow();
+        if (mTimes.hasBegun(message) || mTimes.isQuiet(real, int64_t{kQuietUs} * 1000)) return;
+        if (turn >= kQuietTurns && !mTimes.hasOpenCalls(real)) return;
+        unlock();
         usleep(kQuietUs);
-        mLock.lock();
+        lock();
     }
 }
 
-void Recorder::end(Run* run) {
-    const android::Mutex::Autolock lock(mLock);
-    if (run->isOrdered && !run->isMessage) mTimeline.endCall(*run, monotonicNow());
-    endRun(run);
+void Recorder::end(Stint* stint) {
+    const Section section(this);
+    mTimes.endCall(*stint, realNow());
+    endStint(stint);
 }
 
-void Recorder::endRun(Run* run) {
-    appendAll(mRuns.end(run), run->now);
+void Recorder::endMessage(Stint* message) {
+    const Section section(this);
+    mTimes.endMessage();
+    endStint(message);
+}
+
+void Recorder::endStint(Stint* stint) {
+    appendAll(mOrder.end(stint), stint->now);
     write();
 }
 
-void Recorder::expectEvent(Run* run, const char* module, const char* id, const char* payload) {
-    const std::string text = mNames != nullptr ? mNames->replaceAll(payload) : payload;
-    std::string body = R"("expect": {"event": {"module": )";
-    appendText(&body, module);
-    body += R"(, "id": )";
-    appendText(&body, id);
-    body += R"(, "payload": )";
-    appendText(&body, text);
-    expect(run, body + "}}");
+void Recorder::expectEvent(Stint* stint, const char* module, const char* id, const char* payload) {
+    std::string event;
+    base::JsonWriter json(&event);
+    if (mPseudonyms != nullptr) {
+        trace::writeEvent(&json, module, id, mPseudonyms->replaceIn(payload));
+    } else {
+        trace::writeEvent(&json, module, id, payload);
+    }
+    const Section section(this);
+    expect(stint, event);
 }
 
-void Recorder::expectProperty(Run* run, const char* name, const char* value) {
-    std::string body = R"("expect": {"property": {"name": )";
-    appendText(&body, name);
-    body += R"(, "value": )";
-    appendText(&body, value);
-    expect(run, body + "}}");
-    const android::Mutex::Autolock lock(mLock);
-    mSurroundings.noteProperty(name, value);
+void Recorder::expectProperty(Stint* stint, const char* name, const char* value) {
+    std::string property;
+    base::JsonWriter json(&property);
+    trace::writeProperty(&json, name, value);
+    const Section section(this);
+    mSurroundings.beginWrite(name, value);
+    expect(stint, property);
 }
 
-void Recorder::expect(Run* run, std::string_view body) {
-    const android::Mutex::Autolock lock(mLock);
-    if (!mParts.isOpen()) return;
+void Recorder::endProperty(const char* name) {
+    const Section section(this);
+    mSurroundings.endWrite(name);
+}
+
+void Recorder::expect(Stint* stint, std::string_view body) {
+    // What began before a loss is not in the trace, and what it does is not either.
+    if (mLoss || stint->generation != mGeneration) return;
     std::string lines;
     // A line without an action lets a replay come to the message's moment, also at a trace's end.
-    if (run->tellsMoment) lines += '\n';
-    run->tellsMoment = false;
-    lines.append(body).append("\n");
-    if (!mRuns.mayWrite(run, lines)) return;
-    appendAll(lines, run->now);
+    if (stint->tellsMoment) lines += '\n';
+    stint->tellsMoment = false;
+    base::JsonWriter(&lines).key("expect").raw('{' + std::string(body) + '}');
+    lines += '\n';
+    if (!mOrder.mayWrite(stint, lines)) return leaveHanging(realNow());
+    appendAll(lines, stint->now);
     write();
 }
 
-android::sp<Courier> Recorder::post(const Run& run, android::SensorHandlerThread* thread,
+/** Writes what is held back for too long, or too much of it. */
+void Recorder::leaveHanging(int64_t real) {
+    while (Stint* const oldest = mOrder.heldBytes() > 0 ? mOrder.oldest() : nullptr) {
+        if (!oldest->isOutside(real, kHangNs) && mOrder.heldBytes() <= kMostHeld) break;
+        append(mTimes.tell(mTimes.last()), hangNote(oldest->now));
+        appendAll(mOrder.end(oldest), oldest->now);
+    }
+    write();
+}
+
+android::sp<Courier> Recorder::post(const Stint& stint, android::SensorHandlerThread* thread,
                                     const Courier::Handler& handler, int what, int delayMs) {
     android::sp<Courier> courier = new Courier(this, thread, handler);
-    const android::Mutex::Autolock lock(mLock);
-    if (mTimeline.post(courier->run(), handler.get(), what, delayMs, run)) {
-        mRuns.begin(courier->run());
-    }
+    const Section section(this);
+    const bool isOfThisMoment = mTimes.post(courier->stint(), handler.get(), what, delayMs, stint);
+    if (isOfThisMoment && !mLoss) mOrder.begin(courier->stint());
     return courier;
 }
 
-std::vector<android::sp<Courier>> Recorder::remove(const Run* run, const Courier::Handler& handler,
+std::vector<android::sp<Courier>> Recorder::remove(const Stint* stint,
+                                                   const Courier::Handler& handler,
                                                    std::optional<int> what) {
-    const android::Mutex::Autolock lock(mLock);
+    const Section section(this);
     std::vector<android::sp<Courier>> couriers;
-    for (Run* message : mTimeline.remove(handler.get(), what, run)) {
+    for (Stint* message : mTimes.remove(handler.get(), what, stint)) {
         couriers.emplace_back(Courier::of(message));
-        endRun(message);
+        endStint(message);
     }
     return couriers;
 }
 
 void Recorder::noteSingleton(const char* name) {
-    const android::Mutex::Autolock lock(mLock);
+    const Section section(this);
     mSingletons.push_back(name);
 }
 
 void Recorder::noteProximity(bool enabled, const std::string& client) {
-    const android::Mutex::Autolock lock(mLock);
+    const Section section(this);
     if (enabled) {
         mProximityClients.insert(client);
     } else {
         mProximityClients.erase(client);
     }
-    sWantsEvents = !mProximityClients.empty();
+    if (sWriting != nullptr) sWantsEvents = !mProximityClients.empty();
 }
 
 void Recorder::append(int64_t at, std::string_view body) {
-    mText += R"({"at": )";
-    appendMs(&mText, at);
-    if (!body.empty()) mText.append(", ").append(body);
-    mText += "}\n";
+    mText += lineOf(at, body);
 }
 
 void Recorder::appendAny(int64_t at, std::string_view body) {
@@ -235,39 +407,88 @@ void Recorder::appendAny(int64_t at, std::string_view body) {
 void Recorder::appendAll(std::string_view bodies, int64_t now) {
     while (!bodies.empty()) {
         const size_t end = bodies.find('\n');
-        append(mTimeline.tell(now), bodies.substr(0, end));
+        append(mTimes.tell(now), bodies.substr(0, end));
         bodies.remove_prefix(end + 1);
     }
 }
 
-void Recorder::appendStart(int64_t at) {
-    append(at, R"("boot": "device")");
+/** The start of a process, with `note` in its first line if that is not "". */
+void Recorder::appendStart(int64_t at, const char* how, const std::string& note) {
+    mSurroundings.forget();
+    mScreen.forget();
+    mText += "# " + date() + ": process " + std::to_string(getpid()) + ' ' + how + '\n';
+    std::string boot;
+    base::JsonWriter json(&boot);
+    json.member("boot", "device");
+    if (!note.empty()) json.raw(note);
+    append(at, boot);
     append(at, mSurroundings.takeProperties());
     appendAny(at, mSurroundings.takeVariables());
+    for (const char* singleton : mSingletons) append(at, callBody(singleton));
 }
 
 void Recorder::startPart(int64_t at) {
-    if (const auto error = mParts.startNext()) return stop(*error);
-    mSurroundings.forget();
-    mScreen.forget();
-    mText += "# " + date() + ": process " + std::to_string(getpid()) + " goes on in a new part\n";
-    appendStart(at);
-    for (const char* singleton : mSingletons) append(at, callBody(singleton));
+    if (const auto error = mParts.startNext()) return lose(*error);
+    mPartBegan = at;
+    appendStart(at, "goes on in a new part", {});
     mText += "# end of its start\n";
 }
 
-void Recorder::write() {
-    if (mParts.isOpen() && !mText.empty()) {
-        if (const auto error = mParts.write(mText)) stop(*error);
+/** Whether there is a record to write to. If lines are being lost, tries to go on with it. */
+bool Recorder::isReady(int64_t real) {
+    if (!mLoss) {
+        if (const auto harm = mParts.findHarm()) lose(*harm);
     }
-    mText.clear();
+    return !mLoss || goOn(real);
 }
 
-void Recorder::stop(const std::string& error) {
-    __android_log_print(ANDROID_LOG_ERROR, kLogTag, "the record has ended: %s", error.c_str());
-    mParts.close();
-    sWriting = nullptr;
-    sWantsEvents = false;
+/** Writes what was gathered; false if it is lost. */
+bool Recorder::write() {
+    if (!mLoss && !mText.empty()) {
+        if (const auto error = mParts.write(mText)) {
+            lose(*error);
+        } else {
+            mWrittenTo = mTimes.last();
+        }
+    }
+    mText.clear();
+    return !mLoss;
+}
+
+/** From now on lines are lost. The trace says so as well as it can, should it never go on. */
+void Recorder::lose(const std::string& why) {
+    mText.clear();
+    const bool namesFile = why.compare(0, mParts.path().size(), mParts.path()) == 0;
+    mLoss = Loss{mParts.isGone() ? mPartBegan : mWrittenTo,
+                 "the record " + (namesFile ? why.substr(mParts.path().size() + 1) : why)};
+    mOrder.clear();
+    noteLoss(mTimes.last());
+    mSaid += "lines are lost: " + why + ". ";
+}
+
+/** Goes on after a loss if that can be done. Tries at once, then from time to time. */
+bool Recorder::goOn(int64_t real) {
+    if (mLoss->hasTried && real - mLoss->tried < kRetryNs) return false;
+    mLoss->hasTried = true;
+    mLoss->tried = real;
+    const int64_t at = mTimes.next(real);
+    appendStart(at, "goes on after a loss", lostNote(mLoss->from, at, mLoss->why));
+    const std::string text = std::exchange(mText, {});
+    if (mParts.resume(text.size())) return false;
+    if (mParts.write(text)) {
+        noteLoss(at);
+        return false;
+    }
+    mWrittenTo = mPartBegan = at;
+    mLoss.reset();
+    ++mGeneration;
+    mSaid += "The record goes on.";
+    return true;
+}
+
+/** Writes a note that `goOn` takes back: it stays if the process ends before. */
+void Recorder::noteLoss(int64_t to) {
+    mParts.writeNote(lineOf(mWrittenTo, lostNote(mLoss->from, to, mLoss->why)));
 }
 
 }  // namespace record

@@ -2,22 +2,18 @@
 
 #include <algorithm>
 #include <cstdint>
-#include <string_view>
 
-#include "record/JsonText.h"
+#include "base/Json.h"
 
 namespace record {
 
 namespace {
 
 template <size_t Size>
-void appendList(std::string* out, const char* key, const std::array<int, Size>& values) {
-    appendText(out, key);
-    for (size_t i = 0; i < Size; ++i) {
-        *out += i == 0 ? ": [" : ", ";
-        appendInteger(out, values[i]);
-    }
-    *out += "], ";
+void writeList(base::JsonWriter* json, const char* key, const std::array<int, Size>& values) {
+    json->key(key).beginArray();
+    for (const int value : values) json->value(value);
+    json->endArray();
 }
 
 /**
@@ -38,22 +34,21 @@ int colorFor(int value, const int* rect) {
 }  // namespace
 
 std::string Screen::take(const int* rgb, const int* rect) {
-    std::string body;
+    std::string changes;
+    base::JsonWriter json(&changes);
     if (rgb != nullptr) {
         const Size old = mSize.value_or(Size{1080, 2400});
         const Size size{std::max(old[0], rect[2]), std::max(old[1], rect[3])};
         const Color color{colorFor(rgb[0], rect), colorFor(rgb[1], rect), colorFor(rgb[2], rect)};
-        if (mSize != size) appendList(&body, "size", size);
-        if (mColor != color) appendList(&body, "color", color);
+        if (mSize != size) writeList(&json, "size", size);
+        if (mColor != color) writeList(&json, "color", color);
         mSize = size;
         mColor = color;
     }
     const bool fails = rgb == nullptr;
-    if (mFails != fails) body += fails ? R"("fault": "capture", )" : R"("fault": null, )";
+    if (mFails != fails) json.key("fault").raw(fails ? R"("capture")" : "null");
     mFails = fails;
-    if (body.empty()) return body;
-    body.resize(body.size() - std::string_view(", ").size());
-    return R"("display": {)" + body + '}';
+    return changes.empty() ? changes : R"("display": {)" + changes + '}';
 }
 
 }  // namespace record

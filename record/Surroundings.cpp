@@ -1,10 +1,11 @@
 #include "record/Surroundings.h"
 
+#include <cstring>
 #include <type_traits>
 
 #include <cutils/properties.h>
 
-#include "record/JsonText.h"
+#include "base/Json.h"
 #include "record/Library.h"
 #include "trace/CallTable.h"
 
@@ -34,28 +35,18 @@ constexpr const char* kProperties[] = {
         "service.bootanim.exit",
 };
 
-/** The host writes them without a lock, on purpose. */
+/** The host writes them without a lock, as the library reads them. */
 __attribute__((no_sanitize("thread"))) int32_t read(const void* address, bool isBool) {
     return isBool ? *static_cast<const volatile bool*>(address)
                   : *static_cast<const volatile int32_t*>(address);
 }
 
-void appendKey(std::string* body, const char* action, const char* name) {
-    if (body->empty()) {
-        body->append("\"").append(action).append("\": {");
-    } else {
-        *body += ", ";
-    }
-    appendText(body, name);
-    *body += ": ";
-}
-
-void appendFlagOrNumber(std::string* body, bool isBool, int32_t value) {
-    if (isBool) {
-        *body += value != 0 ? "true" : "false";
-    } else {
-        appendInteger(body, value);
-    }
+/** The line's body that gives `action` the object of `members`; "" if there are none. */
+std::string bodyOf(const char* action, const std::string& members) {
+    if (members.empty()) return {};
+    std::string body;
+    base::JsonWriter(&body).key(action).raw('{' + members + '}');
+    return body;
 }
 
 }  // namespace
@@ -72,39 +63,53 @@ Surroundings::Surroundings()
 }
 
 std::string Surroundings::takeVariables() {
-    std::string body;
+    std::string members;
+    base::JsonWriter json(&members);
     for (Variable& variable : mVariables) {
         if (variable.address == nullptr) continue;
         const int32_t value = read(variable.address, variable.isBool);
         if (variable.known == value) continue;
         variable.known = value;
-        appendKey(&body, "set", variable.name);
-        appendFlagOrNumber(&body, variable.isBool, value);
+        json.key(variable.name);
+        if (variable.isBool) {
+            json.value(value != 0);
+        } else {
+            json.value(value);
+        }
     }
-    return body.empty() ? body : body + '}';
+    return bodyOf("set", members);
 }
 
-std::string Surroundings::takeProperties() {
-    std::string body;
+std::string Surroundings::takeProperties(const char* only) {
+    std::string members;
+    base::JsonWriter json(&members);
     for (const char* name : kProperties) {
+        if (only != nullptr && std::strcmp(name, only) != 0) continue;
+        if (!mBeingWritten.empty() && mBeingWritten.count(name) != 0) continue;
         char value[PROPERTY_VALUE_MAX] = {};
         property_get(name, value, "");
         const auto [known, isNew] = mKnownProperties.try_emplace(name, value);
         if (!isNew && known->second == value) continue;
         known->second = value;
-        appendKey(&body, "property", name);
+        json.key(name);
         if (value[0] == '\0') {
-            body += "null";
+            json.raw("null");
         } else {
-            appendText(&body, value);
+            json.value(value);
         }
     }
-    return body.empty() ? body : body + '}';
+    return bodyOf("property", members);
 }
 
-void Surroundings::noteProperty(const std::string& name, const std::string& value) {
+void Surroundings::beginWrite(const std::string& name, const std::string& value) {
     const auto known = mKnownProperties.find(name);
     if (known != mKnownProperties.end()) known->second = value;
+    mBeingWritten.insert(name);
+}
+
+void Surroundings::endWrite(const std::string& name) {
+    const auto written = mBeingWritten.find(name);
+    if (written != mBeingWritten.end()) mBeingWritten.erase(written);
 }
 
 void Surroundings::forget() {

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -19,11 +20,16 @@ public:
     /** Looks at the variables. Returns a "set" line's body for those that have changed, or "". */
     std::string takeVariables();
 
-    /** Looks at the properties. Returns a "property" line's body likewise. */
-    std::string takeProperties();
+    /**
+     * Looks at the properties, or at the one that is called `only`. Returns a "property" line's
+     * body likewise.
+     */
+    std::string takeProperties(const char* only = nullptr);
 
-    /** The library sets a property. A replay lets it succeed, whatever the device says. */
-    void noteProperty(const std::string& name, const std::string& value);
+    // The library begins, or ends, to set a property. A replay lets it succeed, whatever the device
+    // says. In between nobody knows which value a look at it would find, so none is taken.
+    void beginWrite(const std::string& name, const std::string& value);
+    void endWrite(const std::string& name);
 
     /** A replay that begins now knows nothing. */
     void forget();
@@ -38,6 +44,7 @@ private:
 
     std::vector<Variable> mVariables;
     std::map<std::string, std::string> mKnownProperties;  // unset: ""
+    std::multiset<std::string> mBeingWritten;
 };
 
 }  // namespace record

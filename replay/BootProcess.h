@@ -3,11 +3,10 @@
 #include <functional>
 #include <optional>
 #include <string>
-#include <vector>
 
+#include "base/Result.h"
 #include "replay/Player.h"
-#include "report/Record.h"
-#include "trace/Failure.h"
+#include "trace/Record.h"
 
 namespace replay {
 
@@ -17,13 +16,20 @@ struct Device {
     std::string properties;                   // these, as bytes
 };
 
+/** Who follows boots while they run. */
+struct Listener {
+    std::function<void(const trace::Record&)> take;
+
+    /** There are no records for now; called again and again while none come. */
+    std::function<void()> idle;
+};
+
 /**
- * Runs one boot of the library in a process of its own, forked from this one, and hands its records
- * to `take`; `idle` is called whenever there are none left for now, and again and again while none
- * come. The process dies with this one.
+ * Runs one boot of the library in a process of its own, forked from this one. The process dies with
+ * this one.
  */
-NextBoot runBoot(const Boot& boot, const trace::TraceLine* first, bool recordsCalls, Device* device,
-                 trace::TraceReader* reader, const std::function<void(const report::Record&)>& take,
-                 const std::function<void()>& idle, std::optional<trace::Failure>* failure);
+base::Result<NextBoot> runBoot(const Boot& boot, const trace::TraceLine* first,
+                               trace::WantedRecords wanted, Device* device,
+                               trace::TraceReader* reader, const Listener& listener);
 
 }  // namespace replay

@@ -1,9 +1,9 @@
-#include "rgb/RgbShot.h"
-#include "trace/CallTable.h"
-
 #include <algorithm>
 #include <type_traits>
 #include <utility>
+
+#include "rgb/RgbShot.h"
+#include "trace/CallTable.h"
 
 namespace replay {
 

@@ -8,7 +8,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "capture/TextSource.h"
+#include "base/Result.h"
+#include "capture/text/TextSource.h"
 #include "trace/TraceLine.h"
 
 namespace replay {
@@ -17,21 +18,25 @@ bool InputFile::isCapture() const {
     return first && first->find_first_not_of(" \t") != first->find('{');
 }
 
-std::optional<trace::Failure> open(const std::string& name, InputFile* file) {
+std::optional<base::Failure> open(const std::string& name, size_t inputs, InputFile* file) {
     const int fd = name == "-" ? dup(STDIN_FILENO) : ::open(name.c_str(), O_RDONLY | O_CLOEXEC);
-    if (fd < 0) return trace::Failure{name + ": cannot open: " + std::strerror(errno)};
-    capture::OpenedText opened = capture::openText(fd);
-    if (!opened.error.empty()) return trace::Failure{name + ": " + opened.error};
+    if (fd < 0) return base::Failure{name + ": cannot open: " + std::strerror(errno)};
+    auto opened = capture::openText(fd);
+    if (!opened) return base::Failure{name + ": " + opened.error().text, opened.error().status};
     file->name = name;
-    file->lines = std::make_unique<trace::LineReader>(std::move(opened.text));
-    do {
-        file->first = file->lines->next();
-    } while (file->first && trace::isSkipped(*file->first));
-    if (file->lines->error()) {
-        return trace::Failure{trace::at(name, file->lines->lineNumber()) + *file->lines->error()};
+    file->lines = std::make_unique<base::LineReader>(std::move(opened->text));
+    bool isEmpty = name != "/dev/null" || inputs == 1;
+    while ((file->first = file->lines->next()) && trace::isSkipped(*file->first)) {
+        isEmpty &= file->first->find('#') == std::string_view::npos;
     }
-    if (file->first && !opened.isPlain && !file->isCapture()) {
-        return trace::Failure{name + ": a trace must be plain UTF-8, not packed or UTF-16"};
+    if (file->lines->error()) {
+        return base::Failure{base::at(name, file->lines->lineNumber()) + *file->lines->error()};
+    }
+    if (!file->first && isEmpty) {
+        return base::Failure{name + ": empty: adb leaves such a file when it finds no device"};
+    }
+    if (file->first && !opened->isPlain && !file->isCapture()) {
+        return base::Failure{name + ": a trace must be plain UTF-8, not packed or UTF-16"};
     }
     return std::nullopt;
 }

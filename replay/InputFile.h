@@ -1,27 +1,34 @@
 #pragma once
 
+#include <cstddef>
 #include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
 
-#include "trace/Failure.h"
-#include "trace/LineReader.h"
+#include "base/LineReader.h"
+#include "base/Result.h"
 
 namespace replay {
 
 /** An input, opened, of which the first line that says something has been read. */
 struct InputFile {
     std::string name;  // as it was given; "-" is standard input
-    std::unique_ptr<trace::LineReader> lines;
+    std::unique_ptr<base::LineReader> lines;
     std::optional<std::string_view> first;  // valid until the next line is read; nothing if empty
 
     /** Whether it holds a device capture; a trace's first line is a JSON object. */
     bool isCapture() const;
 };
 
-/** Opens `name` into `*file`. Returns nothing, or why it cannot be read. */
-std::optional<trace::Failure> open(const std::string& name, InputFile* file);
+/**
+ * Opens `name`, one of so many `inputs`, into `*file`. Returns nothing, or why it cannot be read.
+ *
+ * An input without anything but blank lines is refused: nobody means to play one, but a command
+ * that failed leaves one. `/dev/null` beside others is meant: it has the others' lines name their
+ * file. A trace may consist of comments.
+ */
+std::optional<base::Failure> open(const std::string& name, size_t inputs, InputFile* file);
 
 /**
  * Whether the file `name` is a capture for sure, as its first bytes tell. Only a regular file is

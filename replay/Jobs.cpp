@@ -15,8 +15,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include "trace/Failure.h"
-#include "trace/FileIo.h"
+#include "base/FileIo.h"
+#include "base/Result.h"
 
 namespace replay {
 
@@ -25,8 +25,7 @@ namespace {
 /** What stands in front of a file's output in a worker's pipe. */
 struct Header {
     uint64_t file;
-    uint64_t outSize;
-    uint64_t errorSize;
+    uint64_t size;  // of the texts, each behind its own size
     int32_t status;
 };
 
@@ -44,16 +43,17 @@ bool gather(int fd) {
 
 std::vector<unsigned char> takeOutput(int fd) {
     lseek(fd, 0, SEEK_SET);
-    std::vector<unsigned char> bytes = trace::readAll(fd);
+    std::vector<unsigned char> bytes = base::readAll(fd);
     lseek(fd, 0, SEEK_SET);
-    if (ftruncate(fd, 0) != 0) _exit(trace::kStatusFailed);
+    if (ftruncate(fd, 0) != 0) _exit(base::kStatusFailed);
     return bytes;
 }
 
 }  // namespace
 
-Jobs::Jobs(int count, Work work, std::function<void(size_t)> tell)
+Jobs::Jobs(int count, std::vector<int> outputs, Work work, std::function<void(size_t)> tell)
       : mCount(count),
+        mOutputs(std::move(outputs)),
         mWork(std::move(work)),
         mTell(std::move(tell)),
         mNext(sharedCounter()) {}
@@ -71,7 +71,7 @@ int Jobs::run(const std::vector<std::string>& names) {
     for (size_t i = 0; i < count; ++i) {
         if (mNext != nullptr && startWorker(names)) continue;
         std::fprintf(stderr, "cannot start a process: %s\n", std::strerror(errno));
-        return trace::kStatusFailed;
+        return base::kStatusFailed;
     }
     int status = 0;
     while (!mWorkers.empty() && status == 0) {
@@ -89,7 +89,7 @@ int Jobs::run(const std::vector<std::string>& names) {
     endWorkers();
     if (status != 0 || mPrinted == names.size()) return status;
     std::fprintf(stderr, "%s: the process died\n", names[mPrinted].c_str());
-    return trace::kStatusFailed;
+    return base::kStatusFailed;
 }
 
 bool Jobs::startWorker(const std::vector<std::string>& names) {
@@ -99,7 +99,7 @@ bool Jobs::startWorker(const std::vector<std::string>& names) {
     const pid_t process = fork();
     if (process == 0) {
         prctl(PR_SET_PDEATHSIG, SIGKILL);
-        if (getppid() != tool) _exit(trace::kStatusFailed);
+        if (getppid() != tool) _exit(base::kStatusFailed);
         close(ends[0]);
         work(names, ends[1]);
     }
@@ -113,20 +113,37 @@ bool Jobs::startWorker(const std::vector<std::string>& names) {
 }
 
 void Jobs::work(const std::vector<std::string>& names, int results) {
-    if (!gather(STDOUT_FILENO) || !gather(STDERR_FILENO)) _exit(trace::kStatusFailed);
+    for (const int output : mOutputs) {
+        if (!gather(output)) _exit(base::kStatusFailed);
+    }
     int status = 0;
     // Nothing behind a file that fails is printed, so this process need not go on.
     for (size_t file; status == 0 && (file = mNext->fetch_add(1)) < names.size();) {
         status = mWork(names[file]);
-        const auto out = takeOutput(STDOUT_FILENO);
-        const auto error = takeOutput(STDERR_FILENO);
-        const Header header{file, out.size(), error.size(), status};
-        const bool told = trace::writeAll(results, &header, sizeof(header)) &&
-                          trace::writeAll(results, out.data(), out.size()) &&
-                          trace::writeAll(results, error.data(), error.size());
-        if (!told) _exit(trace::kStatusFailed);
+        std::string texts;
+        for (const int output : mOutputs) {
+            const auto bytes = takeOutput(output);
+            const uint64_t size = bytes.size();
+            texts.append(reinterpret_cast<const char*>(&size), sizeof(size));
+            texts.append(bytes.begin(), bytes.end());
+        }
+        const Header header{file, texts.size(), status};
+        const bool told = base::writeAll(results, &header, sizeof(header)) &&
+                          base::writeAll(results, texts.data(), texts.size());
+        if (!told) _exit(base::kStatusFailed);
     }
     _exit(0);
+}
+
+std::vector<std::string> Jobs::takeApart(const char* texts) const {
+    std::vector<std::string> parts;
+    for (size_t i = 0; i < mOutputs.size(); ++i) {
+        uint64_t size = 0;
+        std::memcpy(&size, texts, sizeof(size));
+        parts.emplace_back(texts + sizeof(size), size);
+        texts += sizeof(size) + size;
+    }
+    return parts;
 }
 
 bool Jobs::receive(Worker* worker) {
@@ -138,11 +155,9 @@ bool Jobs::receive(Worker* worker) {
     received.append(block, static_cast<size_t>(count));
     for (Header header; received.size() >= sizeof(header);) {
         std::memcpy(&header, received.data(), sizeof(header));
-        if (received.size() < sizeof(header) + header.outSize + header.errorSize) break;
-        mResults[header.file] = {
-                header.status, received.substr(sizeof(header), header.outSize),
-                received.substr(sizeof(header) + header.outSize, header.errorSize)};
-        received.erase(0, sizeof(header) + header.outSize + header.errorSize);
+        if (received.size() < sizeof(header) + header.size) break;
+        mResults[header.file] = {header.status, takeApart(received.data() + sizeof(header))};
+        received.erase(0, sizeof(header) + header.size);
         mTell(mPrinted + mResults.size());
     }
     return true;
@@ -151,12 +166,14 @@ bool Jobs::receive(Worker* worker) {
 int Jobs::printDone() {
     for (auto done = mResults.begin(); done != mResults.end() && done->first == mPrinted;
          done = mResults.erase(done), ++mPrinted) {
-        const auto& [status, out, error] = done->second;
-        if (!trace::writeAll(STDOUT_FILENO, out.data(), out.size())) {
-            std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
-            return trace::kStatusFailed;
+        const auto& [status, texts] = done->second;
+        for (size_t i = 0; i < texts.size(); ++i) {
+            if (base::writeAll(mOutputs[i], texts[i].data(), texts[i].size())) continue;
+            std::fprintf(stderr, "cannot write %s: %s\n",
+                         mOutputs[i] == STDOUT_FILENO ? "standard output" : "an output",
+                         std::strerror(errno));
+            return base::kStatusFailed;
         }
-        trace::writeAll(STDERR_FILENO, error.data(), error.size());
         if (status != 0) return status;
     }
     return 0;

@@ -21,8 +21,11 @@ public:
     /** What is done with a file; the result is an exit status. */
     using Work = std::function<int(const std::string& name)>;
 
-    /** `count` processes; `tell` hears how many files are done, each time one is. */
-    Jobs(int count, Work work, std::function<void(size_t)> tell);
+    /**
+     * `count` processes; `tell` hears how many files are done, each time one is. What the work
+     * writes to `outputs`, which are descriptors, is brought there in the order of the files.
+     */
+    Jobs(int count, std::vector<int> outputs, Work work, std::function<void(size_t)> tell);
 
     /** Ends what still runs. */
     ~Jobs();
@@ -37,8 +40,7 @@ private:
     /** What came of a file. */
     struct Result {
         int status;
-        std::string out;
-        std::string error;
+        std::vector<std::string> texts;  // for each output
     };
 
     /** A process that takes one file after another. */
@@ -51,12 +53,16 @@ private:
     bool startWorker(const std::vector<std::string>& names);
     [[noreturn]] void work(const std::vector<std::string>& names, int results);
 
+    /** The texts for the outputs, each behind its size. */
+    std::vector<std::string> takeApart(const char* texts) const;
+
     /** Takes what a worker tells; false when it has ended. */
     bool receive(Worker* worker);
     int printDone();
     void endWorkers();
 
     const int mCount;
+    const std::vector<int> mOutputs;
     const Work mWork;
     const std::function<void(size_t)> mTell;
     std::atomic<size_t>* const mNext;  // file that nobody has taken; shared by the processes

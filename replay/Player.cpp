@@ -7,25 +7,27 @@
 #include <android/log.h>
 #include <dlfcn.h>
 
+#include "base/Json.h"
+#include "base/Result.h"
+#include "clock/VirtualClock.h"
 #include "platform/Display.h"
 #include "platform/PropertyService.h"
 #include "platform/Telemetry.h"
-#include "replay/VirtualClock.h"
-#include "trace/TraceTime.h"
+#include "replay/CallRecorder.h"
 
 namespace replay {
 
-using report::Record;
+using base::Failure;
 using trace::BootKind;
-using trace::Failure;
+using trace::Record;
 
 namespace {
 
 /** For the observers of the platform, which are plain functions or know no context. */
-report::RecordWriter* gRecords = nullptr;
+trace::RecordWriter* gRecords = nullptr;
 
 void record(Record::Kind kind, std::array<std::string_view, 3> texts, int64_t number = 0) {
-    gRecords->add({kind, virtual_clock::now(), number, texts});
+    gRecords->add({kind, virtual_clock::now(), texts, number});
 }
 
 /** The platform's own libraries log too; only the library's lines are shown. */
@@ -37,7 +39,7 @@ void takeLogLine(const __android_logger_data* data, const char* message) {
     }
 }
 
-void observePlatform(report::RecordWriter* records) {
+void observePlatform(trace::RecordWriter* records) {
     gRecords = records;
     __android_log_set_logger(takeLogLine);
     __android_log_set_minimum_priority(ANDROID_LOG_VERBOSE);
@@ -61,48 +63,63 @@ const trace::CallModule* loadCallModule() {
 /** One process's part of a replay. */
 class Player {
 public:
-    Player(const Channels& channels, std::optional<Failure>* failure)
-          : mChannels(channels),
-            mReader(channels.reader),
-            mFailure(failure) {}
+    explicit Player(const Channels& channels)
+          : mReader(channels.reader),
+            mRecords(channels.records),
+            mCalls(channels.records),
+            mWanted(channels.wanted) {}
 
-    NextBoot play(const Boot& boot, const trace::TraceLine* first) {
-        observePlatform(mChannels.records);
+    base::Result<NextBoot> play(const Boot& boot, const trace::TraceLine* first) {
+        start(boot);
+        if (first != nullptr) mLine = *first;
+        for (bool isThere = first != nullptr || readNext(); isThere; isThere = readNext()) {
+            if (const auto* kind = std::get_if<BootKind>(&mLine.action)) return endByBoot(*kind);
+            if (!carryOut() || storeFailed()) break;
+        }
+        if (mFailure) return tl::unexpected(*mFailure);
+        virtual_clock::settle();
+        recordCounters();
+        if (storeFailed()) return tl::unexpected(*mFailure);
+        return NextBoot();
+    }
+
+    /** Whether the last line but for one that boots did something: more of it may have followed. */
+    bool endedInAction() const { return mEndedInAction; }
+
+private:
+    void start(const Boot& boot) {
+        observePlatform(mRecords);
         virtual_clock::set(boot.at);
         mLastAt = boot.at;
         if (boot.kind == BootKind::kDevice) platform::dropVolatileProperties();
-        record(Record::Kind::kBoot, {bootName(boot.kind)});
-        if (first != nullptr) mLine = *first;
-        if (first != nullptr || readNext()) {
-            do {
-                if (const auto* kind = std::get_if<BootKind>(&mLine.action)) {
-                    return endByBoot(*kind);
-                }
-                if (!carryOut() || storeFailed()) return {};
-            } while (readNext());
-        }
-        if (*mFailure) return {};
-        virtual_clock::settle();
-        recordCounters();
-        storeFailed();
-        return {};
+        mRecords->add({Record::Kind::kBoot, boot.at, {}, 0, static_cast<int32_t>(boot.kind)});
+        takeNote(boot.note);
     }
 
-private:
+    /** The first note switches the records of calls on: what it tells is told of them. */
+    void takeNote(const std::string& note) {
+        if (note.empty()) return;
+        mWanted.calls = true;
+        record(Record::Kind::kNote, {note}, mReader->lineNumber());
+    }
+
     bool readNext() {
-        if (!mReader->hasLine()) mChannels.records->flush();
-        if (!mReader->next(&mLine, mFailure)) return false;
+        if (!mReader->hasLine()) mRecords->flush();
+        const auto isThere = mReader->next(&mLine);
+        if (!isThere) mFailure = isThere.error();
+        if (mReader->isTorn()) record(Record::Kind::kTorn, {}, mReader->lineNumber());
+        if (!isThere || !*isThere) return false;
         const auto* boot = std::get_if<BootKind>(&mLine.action);
         const bool newClock = boot != nullptr && *boot == BootKind::kDevice;
         if (mLine.at < mLastAt && !newClock) {
-            return fail(R"("at" goes back, from )" + trace::formatMs(mLastAt) + " to " +
-                        trace::formatMs(mLine.at));
+            return fail(R"("at" goes back, from )" + base::formatMs(mLastAt) + " to " +
+                        base::formatMs(mLine.at));
         }
         mLastAt = mLine.at;
         return true;
     }
 
-    NextBoot endByBoot(BootKind kind) {
+    base::Result<NextBoot> endByBoot(BootKind kind) {
         // The new clock's times say nothing about the old one: only its present moment runs out.
         // A process boot comes in the middle of a moment; what that has posted is lost.
         if (kind == BootKind::kDevice) {
@@ -111,8 +128,8 @@ private:
         } else {
             passTime();
         }
-        if (storeFailed()) return {};
-        return Boot{kind, mLine.at};
+        if (storeFailed()) return tl::unexpected(*mFailure);
+        return Boot{kind, mLine.at, mLine.note};
     }
 
     /** Fails if the store did: without it, the library is on a device that cannot exist. */
@@ -122,14 +139,14 @@ private:
     }
 
     /** Makes `what` the failure, at the present line. Returns false. */
-    bool fail(const std::string& what, int status = trace::kStatusBadInput) {
-        *mFailure = Failure{trace::at(mReader->name(), mReader->lineNumber()) + what, status};
+    bool fail(const std::string& what, int status = base::kStatusBadInput) {
+        mFailure = Failure{base::at(mReader->name(), mReader->lineNumber()) + what, status};
         return false;
     }
 
     void passTime() {
         if (mLine.at <= virtual_clock::now()) return;
-        if (mChannels.recordsCalls) {
+        if (mWanted.counters) {
             virtual_clock::advanceTo(mLine.at, [this] { recordCounters(); });
         } else {
             virtual_clock::advanceTo(mLine.at);
@@ -137,15 +154,18 @@ private:
     }
 
     bool carryOut() {
+        mEndedInAction = !std::holds_alternative<std::monostate>(mLine.action);
         if (const auto* expectation = std::get_if<trace::Expectation>(&mLine.action)) {
             // Time does not pass: the line tells of a device whose worker may have been late.
-            mChannels.records->add(
-                    {Record::Kind::kExpect, mLine.at, mReader->lineNumber(), {expectation->entry}});
+            takeNote(mLine.note);
+            mRecords->add(
+                    {Record::Kind::kExpect, mLine.at, {expectation->entry}, mReader->lineNumber()});
             return true;
         }
         passTime();
         if (storeFailed()) return false;
         if (const auto* call = std::get_if<trace::Call>(&mLine.action)) return make(*call);
+        takeNote(mLine.note);
         if (const auto* variables = std::get_if<trace::VariableWrites>(&mLine.action)) {
             return write(*variables);
         }
@@ -155,7 +175,7 @@ private:
             }
         } else if (const auto* display = std::get_if<platform::DisplayChange>(&mLine.action)) {
             if (const auto error = platform::changeDisplay(*display)) {
-                return fail(*error, trace::kStatusFailed);
+                return fail(*error, base::kStatusFailed);
             }
         }
         return true;
@@ -163,14 +183,21 @@ private:
 
     bool make(const trace::Call& call) {
         if (!load()) return false;
-        const std::string_view name = trace::callName(call.index);
-        if (mChannels.recordsCalls)
-            record(Record::Kind::kCall, {mReader->text()}, mReader->lineNumber());
+        recordCall(call);
         if (const auto result = mModule->call(call.index, call.arguments)) {
-            record(Record::Kind::kResult, {name, *result});
+            record(Record::Kind::kResult, {trace::callName(call.index), *result});
         }
         recordCounters();
         return true;
+    }
+
+    void recordCall(const trace::Call& call) {
+        if (isRegistration(call)) {
+            if (!mLine.note.empty()) mWanted.calls = true;
+        } else {
+            takeNote(mLine.note);
+        }
+        if (mWanted.calls) mCalls.record(call, virtual_clock::now(), mLine.note);
     }
 
     bool write(const trace::VariableWrites& variables) {
@@ -179,9 +206,9 @@ private:
         return true;
     }
 
-    /** Makes a record of the library's counters, if they have changed and calls are recorded. */
+    /** Makes a record of the library's counters, if they have changed and are wanted. */
     void recordCounters() {
-        if (mModule == nullptr || !mChannels.recordsCalls) return;
+        if (mModule == nullptr || !mWanted.counters) return;
         const trace::Counters counters = mModule->counters();
         if (counters == mCounters) return;
         mCounters = counters;
@@ -194,17 +221,20 @@ private:
     bool load() {
         if (mModule == nullptr) mModule = loadCallModule();
         if (mModule == nullptr) {
-            *mFailure = Failure{std::string("cannot load the library: ") + dlerror(),
-                                trace::kStatusFailed};
+            mFailure = Failure{std::string("cannot load the library: ") + dlerror(),
+                               base::kStatusFailed};
         }
         return mModule != nullptr;
     }
 
-    const Channels& mChannels;
     trace::TraceReader* const mReader;
-    std::optional<Failure>* const mFailure;
+    trace::RecordWriter* const mRecords;
+    CallRecorder mCalls;
+    trace::WantedRecords mWanted;
 
+    std::optional<Failure> mFailure;
     trace::TraceLine mLine;
+    bool mEndedInAction = false;
     int64_t mLastAt = 0;  // of the line before; expectations do not move the clock
     const trace::CallModule* mModule = nullptr;
     trace::Counters mCounters{};  // as last recorded
@@ -212,14 +242,11 @@ private:
 
 }  // namespace
 
-const char* bootName(BootKind kind) {
-    return kind == BootKind::kDevice ? "device" : "process";
-}
-
-NextBoot play(const Boot& boot, const trace::TraceLine* first, const Channels& channels,
-              std::optional<Failure>* failure) {
-    const NextBoot next = Player(channels, failure).play(boot, first);
-    record(Record::Kind::kOver, {});
+base::Result<NextBoot> play(const Boot& boot, const trace::TraceLine* first,
+                            const Channels& channels) {
+    Player player(channels);
+    auto next = player.play(boot, first);
+    record(Record::Kind::kOver, {}, player.endedInAction() ? 1 : 0);
     return next;
 }
 

@@ -2,9 +2,10 @@
 
 #include <cstdint>
 #include <optional>
+#include <string>
 
-#include "report/Record.h"
-#include "trace/Failure.h"
+#include "base/Result.h"
+#include "trace/Record.h"
 #include "trace/TraceLine.h"
 #include "trace/TraceReader.h"
 
@@ -13,28 +14,26 @@ namespace replay {
 /** How a process starts. */
 struct Boot {
     trace::BootKind kind = trace::BootKind::kDevice;
-    int64_t at = 0;  // nanoseconds of the clock, new or old
+    int64_t at = 0;    // nanoseconds of the clock, new or old
+    std::string note;  // of the boot line, as JSON; may be empty
 };
 
 /** Why a process ended: by a boot line, or because the input was over. */
 using NextBoot = std::optional<Boot>;
 
-/** "device" or "process". */
-const char* bootName(trace::BootKind kind);
-
 /** Where a player reads and writes. */
 struct Channels {
     trace::TraceReader* reader;
-    report::RecordWriter* records;
-    bool recordsCalls;  // make a record of each call as well
+    trace::RecordWriter* records;
+    trace::WantedRecords wanted;
 };
 
 /**
  * Plays one boot of the library in this process, which must be a fresh one: starts the clock as
  * `boot` says, carries out `first`, if there is one, and then the lines up to the next boot line.
- * On a failure, `*failure` is set and nothing more has run.
+ * After a failure nothing more has run.
  */
-NextBoot play(const Boot& boot, const trace::TraceLine* first, const Channels& channels,
-              std::optional<trace::Failure>* failure);
+base::Result<NextBoot> play(const Boot& boot, const trace::TraceLine* first,
+                            const Channels& channels);
 
 }  // namespace replay

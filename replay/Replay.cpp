@@ -11,6 +11,7 @@
 
 #include <unistd.h>
 
+#include "base/Result.h"
 #include "platform/Display.h"
 #include "replay/FilePlayer.h"
 #include "replay/InputFile.h"
@@ -19,7 +20,7 @@
 
 namespace replay {
 
-using trace::Failure;
+using base::Failure;
 
 namespace {
 
@@ -43,23 +44,36 @@ public:
     explicit Replay(const Options& options)
           : mOptions(options),
             mProgress(options.inputs(), !showsItself(options)),
-            mPlayer(options, &mProgress),
-            mJobs(
-                    options.jobs, [this](const std::string& name) { return playInMemory(name); },
-                    [this](size_t done) { mProgress.show(done, "", 0); }) {
+            mPlayer(options, &mProgress) {
         mDevice.propertyFile = options.properties;
     }
 
     int run() {
+        if (const auto failure = mPlayer.openOutputs()) return say(failure);
+        const int status = playAll();
+        // Of a run that failed nothing is made: what was there before stays.
+        if (status != 0 && status != base::kStatusDiffers) return status;
+        const int finished = say(mPlayer.finish());
+        return status != 0 ? status : finished;
+    }
+
+private:
+    int playAll() {
+        for (const std::string& name : mOptions.baseline) {
+            if (const int status = playInMemory(name); status != 0) return status;
+        }
         const std::vector<std::string>& files = mOptions.files;
         if (mOptions.merge) return inMemory(files.front(), [&] { return runMerged(); });
-        const bool mayUseJobs = mOptions.jobs > 1 && !mOptions.properties && !mOptions.printTrace;
+        Jobs jobs(
+                mOptions.jobs, mPlayer.outputs(),
+                [this](const std::string& name) { return playInMemory(name); },
+                [this](size_t done) { mProgress.show(done, "", 0); });
         for (auto next = files.begin(); next != files.end();) {
             const auto end =
-                    mayUseJobs ? std::find_if_not(next, files.end(), isSurelyCapture) : next;
+                    mayUseJobs() ? std::find_if_not(next, files.end(), isSurelyCapture) : next;
             int status = 0;
             if (end - next > 1) {
-                status = mJobs.run({next, end});
+                status = jobs.run({next, end});
                 next = end;
             } else {
                 status = playInMemory(*next++);
@@ -69,14 +83,19 @@ public:
         return 0;
     }
 
-private:
+    /** What is made of all inputs together needs their days in this process. */
+    bool mayUseJobs() const {
+        return mOptions.jobs > 1 && !mOptions.properties && !mOptions.printTrace &&
+               !mOptions.page && !mOptions.timeline && mOptions.baseline.empty();
+    }
+
     /** What `work` with a file returns, or says, if there is not enough memory for it. */
     template <typename Work>
     static int inMemory(const std::string& name, Work work) {
         try {
             return work();
         } catch (const std::bad_alloc&) {
-            return say(Failure{name + ": not enough memory", trace::kStatusFailed});
+            return say(Failure{name + ": not enough memory", base::kStatusFailed});
         }
     }
 
@@ -90,7 +109,7 @@ private:
 
     int play(const std::string& name) {
         InputFile file;
-        if (const auto failure = open(name, &file)) return say(failure);
+        if (const auto failure = open(name, mOptions.inputs(), &file)) return say(failure);
         if (mOptions.printTrace) return say(mPlayer.printTrace(std::move(file)));
         return say(mPlayer.play(std::move(file), &mDevice));
     }
@@ -98,7 +117,6 @@ private:
     const Options& mOptions;
     Progress mProgress;
     FilePlayer mPlayer;
-    Jobs mJobs;
     Device mDevice;
 };
 
@@ -108,7 +126,7 @@ int replayFiles(const Options& options) {
     // A write beyond the limit of a file's size is an error, and not the end of the tool.
     std::signal(SIGXFSZ, SIG_IGN);
     if (const auto error = platform::shareDisplay()) {
-        return say(Failure{*error, trace::kStatusFailed});
+        return say(Failure{*error, base::kStatusFailed});
     }
     return Replay(options).run();
 }

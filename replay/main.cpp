@@ -1,14 +1,21 @@
 #include <algorithm>
 #include <cstdlib>
 #include <iostream>
+#include <optional>
+#include <string>
 #include <thread>
+#include <vector>
 
-#include <unistd.h>
 #include <CLI/CLI.hpp>
+#include <fcntl.h>
+#include <sys/ioctl.h>
+#include <unistd.h>
 
+#include "base/Nearest.h"
+#include "base/OutputFile.h"
+#include "base/Result.h"
 #include "replay/Replay.h"
 #include "trace/CallTable.h"
-#include "trace/Failure.h"
 
 namespace {
 
@@ -35,9 +42,82 @@ constexpr char kStatuses[] = R"(Exit status:
   2  an argument, a line, a capture or the property file is wrong; what came before it is done
   3  --check: the replay differs from what the trace expects)";
 
+/** The columns of the terminal on standard output; what is narrower breaks the lines itself. */
+size_t terminalColumns() {
+    constexpr size_t kLeast = 80;
+    winsize size{};
+    if (ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) != 0) return kLeast;
+    return std::max<size_t>(size.ws_col, kLeast);
+}
+
+/** Names the option that a misspelt one probably stands for. */
+int refuseOption(const CLI::App& app, const CLI::ExtrasError& error) {
+    std::vector<std::string> names;
+    for (const CLI::Option* option : app.get_options()) {
+        for (const std::string& name : option->get_lnames()) names.push_back("--" + name);
+    }
+    for (const std::string& given : app.remaining()) {
+        if (given.substr(0, 1) != "-") continue;
+        const std::string name = given.substr(0, given.find('='));
+        std::cerr << "there is no option " << name << "; the nearest is "
+                  << base::nearest(name, {names.begin(), names.end()}) << '\n';
+        return base::kStatusBadInput;
+    }
+    std::cerr << error.what() << '\n';
+    return base::kStatusBadInput;
+}
+
+/** The files of the command line, for which is written to which must be another one. */
+std::vector<base::NamedFile> filesOf(const replay::Options& options) {
+    std::vector<base::NamedFile> files;
+    for (const std::string& name : options.files) files.push_back({"the input", name});
+    for (const std::string& name : options.baseline) files.push_back({"--baseline", name});
+    const auto add = [&](const char* option, const std::optional<std::string>& path) {
+        if (path) files.push_back({option, *path, true});
+    };
+    add("--properties", options.properties);
+    add("--timeline", options.timeline);
+    add("--page", options.page);
+    add("--uses", options.uses);
+    add("--since-charge", options.sinceCharge);
+    return files;
+}
+
+/** What is missing where no input is named. */
+std::string missingInput(const replay::Options& options) {
+    std::string text = "FILE is missing: a trace or a capture to play";
+    for (const base::NamedFile& file : filesOf(options)) {
+        text += "; " + file.path + " is the file of " + file.use;
+    }
+    return text;
+}
+
+/** A file may be called like an option, but then "./" can stand before its name. */
+std::string refuseOptionAsFile(const std::string& text) {
+    return text.substr(0, 2) == "--" ? "takes a FILE, not " + text : std::string();
+}
+
+/**
+ * Gives what is closed of the standard streams a file that holds nothing, so that no file which is
+ * opened later becomes one of them. Returns whether standard output was open.
+ */
+bool openStandardStreams() {
+    const bool hasOutput = fcntl(STDOUT_FILENO, F_GETFD) >= 0;
+    for (int fd = open("/dev/null", O_RDWR); fd >= 0; fd = open("/dev/null", O_RDWR)) {
+        if (fd <= STDERR_FILENO) continue;
+        close(fd);
+        break;
+    }
+    return hasOutput;
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
+    if (!openStandardStreams()) {
+        std::cerr << "cannot write standard output: it is closed\n";
+        return base::kStatusFailed;
+    }
     replay::Options options;
     options.jobs = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     CLI::App app(kExamples, "sensor-replay");
@@ -59,35 +139,65 @@ int main(int argc, char** argv) {
                  "make one day of several captures of one device, taken one after another");
     app.add_option("--jobs", options.jobs, "captures that are played at once (default: all cores)")
             ->type_name("N")
-            ->check(CLI::PositiveNumber);
+            ->check([](const std::string& text) {
+                int number = 0;
+                return CLI::detail::lexical_cast(text, number) && number > 0
+                               ? std::string()
+                               : "takes a number of at least 1, not " + text;
+            });
     app.add_option("--properties", options.properties,
                    "keep the system properties in FILE (made if missing)")
-            ->type_name("FILE");
+            ->type_name("FILE")
+            ->check(refuseOptionAsFile);
     app.add_option("--timeline", options.timeline,
-                   "write the day of one input as trace events to FILE, for a timeline viewer")
+                   "write the days as trace events to FILE, for a timeline viewer")
             ->type_name("FILE")
+            ->check(refuseOptionAsFile)
             ->excludes(printTrace);
-    app.add_option("--page", options.page, "write the summary of one input as an HTML page to FILE")
+    app.add_option("--page", options.page, "write the summary as an HTML page to FILE")
             ->type_name("FILE")
+            ->check(refuseOptionAsFile)
             ->excludes(printTrace);
+    app.add_option("--uses", options.uses, "write a row for each use of a sensor to FILE, as CSV")
+            ->type_name("FILE")
+            ->check(refuseOptionAsFile)
+            ->excludes(printTrace);
+    app.add_option("--since-charge", options.sinceCharge,
+                   "write the battery statistics of bug reports to FILE, as CSV")
+            ->type_name("FILE")
+            ->check(refuseOptionAsFile)
+            ->excludes(printTrace);
+    auto* baseline = app.add_option("--baseline", options.baseline,
+                                    "say how the inputs differ from FILE; may be repeated")
+                             ->type_name("FILE")
+                             ->check(refuseOptionAsFile)
+                             ->allow_extra_args(false);
+    for (const char* other : {"--log", "--check", "--print-trace", "--properties", "--timeline"}) {
+        baseline->excludes(app.get_option(other));
+    }
     bool listCalls = false;
     app.add_flag("--list-calls", listCalls, "list the calls that a trace can make, and exit");
     app.add_option("FILE", options.files, "traces and captures; - is standard input");
     try {
         app.parse(argc, argv);
-        if (options.files.empty() && !listCalls) throw CLI::RequiredError("FILE");
-        if (options.inputs() > 1 && (options.timeline || options.page)) {
-            throw CLI::ValidationError(options.timeline ? "--timeline" : "--page",
-                                       "takes one input");
+        if (options.files.empty() && !listCalls) {
+            throw CLI::ValidationError(missingInput(options));
         }
+    } catch (const CLI::ExtrasError& error) {
+        return refuseOption(app, error);
     } catch (const CLI::ParseError& error) {
-        const int status = app.exit(error) == 0 ? 0 : trace::kStatusBadInput;
-        return std::cout.flush() ? status : trace::kStatusFailed;
+        const int status = app.exit(error) == 0 ? 0 : base::kStatusBadInput;
+        return std::cout.flush() ? status : base::kStatusFailed;
+    }
+    if (const auto clash = base::findClash(filesOf(options))) {
+        std::cerr << clash->text << '\n';
+        return clash->status;
     }
     if (listCalls) {
-        return std::cout << trace::listCalls() << std::flush ? 0 : trace::kStatusFailed;
+        return std::cout << trace::listCalls() << std::flush ? 0 : base::kStatusFailed;
     }
     const char* noColour = std::getenv("NO_COLOR");
     options.colours = isatty(STDOUT_FILENO) != 0 && (noColour == nullptr || *noColour == '\0');
+    if (isatty(STDOUT_FILENO) != 0) options.columns = terminalColumns();
     return replay::replayFiles(options);
 }

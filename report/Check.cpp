@@ -1,15 +1,26 @@
 #include "report/Check.h"
 
-#include "trace/TraceLine.h"
-#include "trace/TraceTime.h"
+#include <utility>
+
+#include "base/Calendar.h"
+#include "base/Json.h"
+#include "base/Result.h"
+#include "report/Text.h"
+#include "trace/TraceWriter.h"
 
 namespace report {
 
-void Check::begin(const Input& input) {
-    mName = input.name;
+using trace::Record;
+
+void Check::begin(const std::string& name) {
+    mName = name;
     mExpected.clear();
     mGiven.clear();
+    mLost.reset();
+    mLosses.clear();
+    mDoubts.clear();
     mMet = 0;
+    mHasMetAny = false;
 }
 
 void Check::take(const Record& record) {
@@ -21,19 +32,41 @@ void Check::take(const Record& record) {
         mGiven.push_back({trace::eventEntry(first, second, third), record.at, 0});
     } else if (record.kind == Record::Kind::kProperty) {
         mGiven.push_back({trace::propertyEntry(first, second), record.at, 0});
+    } else if (record.kind == Record::Kind::kNote) {
+        takeNote(trace::parseNote(first), record.number);
+        // A boot line that tells of a loss begins what comes after it.
+        if (mBoots && mLost) endStretch();
+    } else if (record.kind == Record::Kind::kTorn) {
+        mLosses +=
+                base::at(mName, record.number) + "the last line is torn; those before it count\n";
+    } else if (record.kind == Record::Kind::kOver && record.number != 0) {
+        endProcess(record.at);
+    } else if (record.kind == Record::Kind::kBoot && mLost) {
+        endStretch();
     }
+    mBoots = record.kind == Record::Kind::kBoot;
     compare();
+}
+
+void Check::takeNote(const trace::Note& note, int64_t line) {
+    if (note.lost) {
+        mLost = note.lost;
+        const std::string text = "lines are lost from " + std::to_string(note.lost->from) + " to " +
+                                 std::to_string(note.lost->to) + " ms: " + safe(note.lost->why);
+        mLosses += base::at(mName, line) + text + '\n';
+        mDoubts += "\n  " + base::at(mName, line) + text;
+    }
+    if (note.hang) {
+        mDoubts += "\n  " + base::at(mName, line) + "what began at " +
+                   std::to_string(note.hang->from) + " ms hung, and did the rest later";
+    }
 }
 
 void Check::end(bool isWhole) {
     if (mFailure || !isWhole) return;
-    if (!mExpected.empty() || !mGiven.empty()) {
-        differ(mExpected.empty() ? nullptr : &mExpected.front(),
-               mGiven.empty() ? nullptr : &mGiven.front());
-    } else if (mMet == 0) {
-        mFailure = {mName + R"(: nothing to check: no "expect" lines)", trace::kStatusBadInput};
-    } else {
-        mOut->write(mName + ": " + std::to_string(mMet) + " expectations met\n");
+    endStretch();
+    if (!mFailure && !mHasMetAny) {
+        mFailure = {mName + R"(: nothing to check: no "expect" lines)", base::kStatusBadInput};
     }
 }
 
@@ -48,15 +81,39 @@ void Check::compare() {
     }
 }
 
+/** A process that was killed after its last line has not told what that line did. */
+void Check::endProcess(int64_t at) {
+    if (!mExpected.empty() || mGiven.empty() || mGiven.front().at != at) return;
+    mLosses += mName + ": the process ends at " + base::formatMs(at) + " ms; the replay does " +
+               std::to_string(mGiven.size()) + " more of that moment\n";
+    mGiven.clear();
+}
+
+void Check::endStretch() {
+    if (mFailure) return;
+    while (mLost && !mGiven.empty() && mGiven.front().at >= mLost->from * base::kNsPerMs) {
+        mGiven.pop_front();
+    }
+    mLost.reset();
+    if (!mExpected.empty() || !mGiven.empty()) {
+        return differ(mExpected.empty() ? nullptr : &mExpected.front(),
+                      mGiven.empty() ? nullptr : &mGiven.front());
+    }
+    if (mMet > 0) mOut->write(mName + ": " + std::to_string(mMet) + " expectations met\n");
+    mOut->write(std::exchange(mLosses, {}));
+    mHasMetAny |= mMet > 0;
+    mMet = 0;
+}
+
 void Check::differ(const Entry* expected, const Entry* given) {
     const auto show = [](const Entry* entry) {
         if (entry == nullptr) return std::string("nothing more");
-        return R"({"at": )" + trace::formatMs(entry->at) + ", " + entry->text + '}';
+        return R"({"at": )" + base::formatMs(entry->at) + ", " + entry->text + '}';
     };
-    const std::string place = expected == nullptr ? mName + ": " : trace::at(mName, expected->line);
+    const std::string place = expected == nullptr ? mName + ": " : base::at(mName, expected->line);
     mFailure = {place + "the replay differs\n  expected: " + show(expected) +
-                        "\n  replayed: " + show(given),
-                trace::kStatusDiffers};
+                        "\n  replayed: " + show(given) + mDoubts,
+                base::kStatusDiffers};
 }
 
 }  // namespace report

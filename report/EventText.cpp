@@ -5,13 +5,17 @@
 #include <optional>
 #include <string_view>
 
+#include "base/Calendar.h"
 #include "report/Text.h"
 
 namespace report {
 
-namespace {
+using day::Entry;
+using day::Field;
+using trace::EventKind;
+using trace::Property;
 
-constexpr int64_t kNsPerSecond = 1'000'000'000;
+namespace {
 
 enum class Kind { kText, kCount, kSeconds, kPeriod };
 
@@ -41,30 +45,76 @@ constexpr std::pair<std::string_view, std::string_view> kUltraCodes[] = {
         {"103", "the day's calls"},
 };
 
-constexpr std::pair<std::string_view, std::string_view> kProperties[] = {
-        {"persist.sys.ds_oriut", "orientation: days counted"},
-        {"persist.sys.fc_oriut", "orientation: seconds, fast charging"},
-        {"persist.sys.oc_oriut", "orientation: seconds, other charging"},
-        {"persist.sys.sc_oriut", "orientation: seconds, shock and charge"},
-        {"persist.sys.total_oriut", "orientation: seconds in all"},
-        {"persist.sys.uc_oriut", "orientation: seconds, USB charging"},
-        {"persist.zuno.device.invalid.count", "ultrasonic: invalid devices"},
-        {"persist.zuno.flow.detect.count", "exceptions of each sensor family"},
-        {"persist.zuno.rgb.shot.count", "screen samples"},
-        {"persist.zuno.route.invalid.count", "ultrasonic: invalid routes"},
-        {"persist.zuno.rx.close.count", "ultrasonic: receiver closures"},
-        {"persist.zuno.ultra.enable.count", "ultrasonic: enables"},
-        {"persist.zuno.ultra.invalid.count", "ultrasonic: calls that failed"},
-        {"persist.zuno.ultra.phone.enable.count", "ultrasonic: calls"},
-        {"persist.zuno.wechat.count.info", "chat calls: sessions_locked up_locks_near"},
+constexpr std::pair<EventKind, std::string_view> kEvents[] = {
+        {EventKind::kAccelerometerApps, "accelerometer: who used it"},
+        {EventKind::kGyroscopeApps, "gyroscope: who used it"},
+        {EventKind::kAccelerometerExceptions, "accelerometer: exceptions"},
+        {EventKind::kGyroscopeExceptions, "gyroscope: exceptions"},
+        {EventKind::kMagneticFieldExceptions, "magnetic field: exceptions"},
+        {EventKind::kLightExceptions, "light: exceptions"},
+        {EventKind::kOrientationExceptions, "orientation: exceptions"},
+        {EventKind::kRotationVectorExceptions, "rotation vector: exceptions"},
+        {EventKind::kScreenSamples, "screen samples of the day"},
+        {EventKind::kLongProximity, "long use of the proximity sensor"},
+        {EventKind::kUltrasonic, "ultrasonic proximity"},
+        {EventKind::kOrientationApps, "orientation: who used it"},
+        {EventKind::kOrientationTotals, "orientation: totals since ever"},
+        {EventKind::kChatCallLocked, "chat call: proximity locked up"},
+        {EventKind::kChatCalls, "chat calls of the day"},
 };
 
-template <size_t Size>
-std::string_view lookUp(const std::pair<std::string_view, std::string_view> (&table)[Size],
-                        std::string_view name) {
+/** The keys of known payloads, where they do not speak for themselves. */
+constexpr std::pair<std::string_view, std::string_view> kKeys[] = {
+        {"TempInvalidRate", "failures/uses"},
+        {"app_list", "apps"},
+        {"count", "samples"},
+        {"fastChargeTime", "fast charging"},
+        {"info", "apps"},
+        {"invalid", "locked up"},
+        {"otherChargeTime", "other charging"},
+        {"pkg", "app"},
+        {"reason", "exceptions"},
+        {"shockAndChargeTime", "shock and charge"},
+        {"status", "counts"},
+        {"time", "held"},
+        {"total", "sessions"},
+        {"totalTime", "in all"},
+        {"ultraEnergy", "background/fluctuant energy"},
+        {"ultraExpired", "code"},
+        {"usbChargeTime", "USB charging"},
+        {"variance", "spread of x/y/z"},
+};
+
+constexpr std::pair<Property, std::string_view> kProperties[] = {
+        {Property::kOrientationDays, "orientation: days counted"},
+        {Property::kOrientationFastCharging, "orientation: seconds, fast charging"},
+        {Property::kOrientationOtherCharging, "orientation: seconds, other charging"},
+        {Property::kOrientationShockAndCharge, "orientation: seconds, shock and charge"},
+        {Property::kOrientationTotal, "orientation: seconds in all"},
+        {Property::kOrientationUsbCharging, "orientation: seconds, USB charging"},
+        {Property::kInvalidDevices, "ultrasonic: invalid devices"},
+        {Property::kDetectCounts, "exceptions of each sensor family"},
+        {Property::kScreenSamples, "screen samples"},
+        {Property::kInvalidRoutes, "ultrasonic: invalid routes"},
+        {Property::kReceiverClosures, "ultrasonic: receiver closures"},
+        {Property::kUltrasonicEnables, "ultrasonic: enables"},
+        {Property::kInvalidCalls, "ultrasonic: calls that failed"},
+        {Property::kUltrasonicCalls, "ultrasonic: calls"},
+        {Property::kChatCalls, "chat calls: sessions_locked up_locks_near"},
+};
+
+template <typename Name, size_t Size>
+std::string_view lookUp(const std::pair<Name, std::string_view> (&table)[Size], const Name& name) {
     const auto* found = std::find_if(std::begin(table), std::end(table),
                                      [&](const auto& each) { return each.first == name; });
     return found == std::end(table) ? std::string_view() : found->second;
+}
+
+std::string_view describeKey(EventKind kind, std::string_view key) {
+    if (kind == EventKind::kUnknown) return key;
+    if (kind == EventKind::kOrientationTotals && key == "pkg") return "last app";
+    const std::string_view meaning = lookUp(kKeys, key);
+    return meaning.empty() ? key : meaning;
 }
 
 /** `text` as its kind is shown; as it is, if it is no number. */
@@ -73,7 +123,8 @@ std::string show(Kind kind, const std::string& text) {
     const char* const end = text.data() + text.size();
     const bool isNumber = std::from_chars(text.data(), end, number).ptr == end && !text.empty();
     if (!isNumber || number < 0 || kind == Kind::kText || kind == Kind::kCount) return text;
-    return kind == Kind::kSeconds ? formatDuration(number * kNsPerSecond) : formatRate(number);
+    return kind == Kind::kSeconds ? base::formatDuration(std::chrono::seconds(number))
+                                  : formatRate(number);
 }
 
 Kind kindOf(std::string_view key) {
@@ -87,9 +138,10 @@ Table layOutList(const Field& field, size_t limit) {
     std::vector<Table::Column> columns;
     std::vector<std::string_view> keys;
     for (const auto& [key, title, kind] : kValues) {
-        const bool isThere = std::any_of(
-                field.entries.begin(), field.entries.end(),
-                [wanted = key](const Entry& entry) { return !valueOf(entry, wanted).empty(); });
+        const bool isThere = std::any_of(field.entries.begin(), field.entries.end(),
+                                         [wanted = key](const Entry& entry) {
+                                             return !day::valueOf(entry, wanted).empty();
+                                         });
         if (!isThere) continue;
         keys.push_back(key);
         columns.push_back({std::string(title),
@@ -99,7 +151,7 @@ Table layOutList(const Field& field, size_t limit) {
     for (const Entry& entry : field.entries) {
         std::vector<std::string> cells;
         for (const std::string_view key : keys) {
-            const std::string text(valueOf(entry, key));
+            const std::string text(day::valueOf(entry, key));
             cells.push_back(key == "pkg" ? shortenApp(text) : show(kindOf(key), text));
         }
         table.add(cells);
@@ -109,8 +161,9 @@ Table layOutList(const Field& field, size_t limit) {
 
 /** What a value says that is no list. */
 std::string showPlain(const Field& field) {
-    const std::string_view code =
-            field.key == "ultraExpired" ? lookUp(kUltraCodes, field.text) : std::string_view();
+    const std::string_view code = field.key == "ultraExpired"
+                                          ? lookUp(kUltraCodes, std::string_view(field.text))
+                                          : std::string_view();
     if (!code.empty()) return field.text + ", " + std::string(code);
     if (field.key == "pkg") return safe(shortenApp(field.text));
     if (field.entries.empty()) return safe(show(kindOf(field.key), field.text));
@@ -130,30 +183,57 @@ std::string shortenApp(const std::string& app) {
     return isTwice ? app.substr(0, half) : app;
 }
 
-EventText layOut(const Event& event, size_t limit) {
+EventText layOutEvent(const day::Event& event, size_t limit) {
     EventText text;
-    text.title = formatTimeOfDay(event.at) + "  " + safe(event.id);
-    const std::string_view meaning = describeEvent(event.id, event.fields);
+    text.title = base::formatTimeOfDay(std::chrono::nanoseconds(event.at)) + "  " + safe(event.id);
+    const std::string_view meaning = describe(event.payload.kind);
     if (!meaning.empty()) text.title.append("  ").append(meaning);
-    for (const Field& field : event.fields) {
+    for (const Field& field : event.payload.fields) {
         if (field.isList) {
             text.lists.push_back(layOutList(field, limit));
         } else {
-            text.values.emplace_back(safe(describeKey(event.id, field.key)), showPlain(field));
+            text.values.emplace_back(safe(describeKey(event.payload.kind, field.key)),
+                                     showPlain(field));
         }
     }
     return text;
 }
 
-Table layOut(const std::map<std::string, std::string>& properties) {
+std::string_view describe(EventKind kind) {
+    return lookUp(kEvents, kind);
+}
+
+Table propertyTable(const std::map<std::string, std::string>& properties) {
     Table table({{"Property", Table::Column::kCut},
                  {"Value", Table::Column::kCut},
                  {"Meaning", Table::Column::kCut}},
                 properties.size());
     for (const auto& [name, value] : properties) {
-        table.add({name, value, std::string(lookUp(kProperties, name))});
+        table.add({name, value, std::string(lookUp(kProperties, trace::propertyOf(name)))});
     }
     return table;
+}
+
+void writeFields(const std::vector<Field>& fields, base::JsonWriter* json) {
+    const auto write = [json](const Entry& entry) {
+        json->beginObject();
+        for (const auto& [key, value] : entry) json->member(key, value);
+        json->endObject();
+    };
+    json->beginObject();
+    for (const Field& field : fields) {
+        json->key(field.key);
+        if (field.isList) {
+            json->beginArray();
+            for (const Entry& entry : field.entries) write(entry);
+            json->endArray();
+        } else if (field.entries.empty()) {
+            json->value(field.text);
+        } else {
+            write(field.entries[0]);
+        }
+    }
+    json->endObject();
 }
 
 }  // namespace report

@@ -1,23 +1,18 @@
 #pragma once
 
 #include <cstddef>
-#include <cstdint>
 #include <map>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
-#include "report/Payload.h"
+#include "base/Json.h"
+#include "day/Journal.h"
+#include "day/Payload.h"
 #include "report/Table.h"
 
 namespace report {
-
-/** An event that the device reports. */
-struct Event {
-    int64_t at;  // nanoseconds
-    std::string id;
-    Fields fields;
-};
 
 /** An event laid out for a person. Rates are in Hz, times h:mm:ss. */
 struct EventText {
@@ -27,12 +22,18 @@ struct EventText {
 };
 
 /** Lays `event` out; its lists show at most `limit` rows. */
-EventText layOut(const Event& event, size_t limit);
+EventText layOutEvent(const day::Event& event, size_t limit);
 
-/** A key "pkg/opPkg" of a list, as `nameApp` names the app. */
+/** The event in words, as "screen samples of the day"; empty for an unknown one. */
+std::string_view describe(trace::EventKind kind);
+
+/** A key "pkg/opPkg" of a list, as `day::appOf` names the app. */
 std::string shortenApp(const std::string& app);
 
 /** Properties with their values and their meaning. */
-Table layOut(const std::map<std::string, std::string>& properties);
+Table propertyTable(const std::map<std::string, std::string>& properties);
+
+/** Writes a JSON object. Lists are arrays of objects; all other values are texts. */
+void writeFields(const std::vector<day::Field>& fields, base::JsonWriter* json);
 
 }  // namespace report

@@ -3,23 +3,24 @@
 #include <cstddef>
 #include <cstdio>
 
-#include "trace/TraceTime.h"
+#include "base/Calendar.h"
 
 namespace report {
 
 std::string formatClock(int64_t ns) {
-    const auto ms = static_cast<long long>(ns / trace::kNsPerMs);
-    char text[64];
-    int length = std::snprintf(text, sizeof(text), "day %lld %02lld:%02lld:%02lld.%03lld",
-                               ms / 86'400'000 + 1, ms / 3'600'000 % 24, ms / 60'000 % 60,
-                               ms / 1000 % 60, ms % 1000);
-    if (const auto rest = static_cast<int>(ns % trace::kNsPerMs)) {
-        length += std::snprintf(text + length, sizeof(text) - length, "%06d", rest);
+    const std::string day = "day " + std::to_string(ns / base::kNsPerDay + 1) + ' ';
+    char decimals[16];
+    if (ns % base::kNsPerMs == 0) {
+        std::snprintf(decimals, sizeof(decimals), ".%03d",
+                      static_cast<int>(ns % base::kNsPerSecond / base::kNsPerMs));
+    } else {
+        std::snprintf(decimals, sizeof(decimals), ".%09d",
+                      static_cast<int>(ns % base::kNsPerSecond));
     }
-    return std::string(text, length);
+    return day + base::formatTimeOfDay(std::chrono::nanoseconds(ns)) + decimals;
 }
 
-std::string printable(std::string_view text) {
+std::string onOneLine(std::string_view text) {
     std::string result;
     for (const char c : text) {
         const bool blank = c == ' ' || c == '\t';

@@ -13,7 +13,7 @@ std::string formatClock(int64_t ns);
  * `text` on one line: a run of blanks and tabs becomes one blank, any other control character,
  * which might move the terminal's cursor, a "?".
  */
-std::string printable(std::string_view text);
+std::string onOneLine(std::string_view text);
 
 /** The letter by which logs show a level; "?" for an unknown one. */
 char levelLetter(int64_t level);

@@ -1,44 +1,200 @@
 #include "report/Lines.h"
 
+#include <algorithm>
+#include <limits>
+#include <string_view>
+
+#include "day/Payload.h"
+#include "report/EventText.h"
 #include "report/Format.h"
-#include "report/Payload.h"
-#include "trace/JsonText.h"
-#include "trace/TraceLine.h"
-#include "trace/TraceTime.h"
+#include "trace/TraceWriter.h"
 
 namespace report {
 
-void JsonLines::begin(const Input& input) {
-    if (mWithFile) mEnd = R"(, "file": )" + trace::toJson(input.name) + "}\n";
+using base::JsonWriter;
+using base::Ms;
+using trace::Record;
+
+namespace {
+
+constexpr int64_t kNsPerUs = 1000;
+constexpr int64_t kAll = std::numeric_limits<int64_t>::max();  // the end of time
+
+/** Writes a member whose value is known. */
+template <typename T>
+void optionalMember(JsonWriter* json, std::string_view key, const std::optional<T>& value) {
+    if (value) json->member(key, *value);
+}
+
+void packagesMember(JsonWriter* json, const std::vector<std::string>& packages) {
+    if (packages.empty()) return;
+    json->key("packages").beginArray();
+    for (const std::string& package : packages) json->value(package);
+    json->endArray();
+}
+
+/** Whether `record` has a line of its own. */
+bool isShown(Record::Kind kind) {
+    return kind <= Record::Kind::kResult;
+}
+
+}  // namespace
+
+JsonLines::JsonLines(Stdout* out, bool withFile)
+      : mOut(out),
+        mWithFile(withFile),
+        mTracker([this](const day::Use& use) { mEnded.push_back(use); }) {}
+
+void JsonLines::begin(const std::string& name) {
+    mName = name;
+    mTracker.begin();
+    mHasNotes = false;
 }
 
 void JsonLines::take(const Record& record) {
-    const auto& [first, second, third] = record.texts;
-    std::string entry;
-    switch (record.kind) {
-        case Record::Kind::kBoot:
-            entry = R"("boot": )" + trace::toJson(first);
-            break;
-        case Record::Kind::kEvent:
-            entry = trace::eventEntry(first, second, third);
-            entry.back() = ',';
-            entry += R"( "fields": )" + report::toJson(takeApart(second, third)) + '}';
-            break;
-        case Record::Kind::kProperty:
-            entry = trace::propertyEntry(first, second);
-            break;
-        case Record::Kind::kLog:
-            entry = R"("log": {"level": )" + std::to_string(record.number) + R"(, "tag": )" +
-                    trace::toJson(first) + R"(, "text": )" + trace::toJson(second) + '}';
-            break;
-        case Record::Kind::kResult:
-            entry = R"("result": {"call": )" + trace::toJson(first) + R"(, "value": )" +
-                    std::string(second) + '}';
-            break;
-        default:
-            return;
+    if (record.kind == Record::Kind::kExpect) return;  // its time is the recorded device's
+    mTracker.take(record);
+    const bool isBoot = record.kind == Record::Kind::kBoot;
+    if (isBoot) writeEnded(kAll);
+    if (record.at > mAt) writeEnded(record.at);
+    mAt = record.at;
+    if (isBoot && record.value == static_cast<int32_t>(trace::BootKind::kDevice)) {
+        mHasTold = false;
+        mIsClosed = false;
     }
-    mOut->write(R"({"at": )" + trace::formatMs(record.at) + ", " + entry + mEnd);
+    if (isShown(record.kind)) {
+        writeRecord(record);
+    } else if (record.kind == Record::Kind::kOver) {
+        writeEnded(kAll);
+    } else if (record.kind >= Record::Kind::kNote) {
+        mHasNotes = true;
+        writeCapture(record.at);
+    }
+}
+
+void JsonLines::end(bool) {
+    mTracker.end();
+    writeEnded(kAll);
+}
+
+template <typename Write>
+void JsonLines::writeLine(int64_t at, const Write& write) {
+    mLine.clear();
+    JsonWriter json(&mLine);
+    json.beginObject().member("at", Ms{at});
+    write(&json);
+    if (mWithFile) json.member("file", mName);
+    json.endObject();
+    mLine += '\n';
+    mOut->write(mLine);
+}
+
+void JsonLines::writeRecord(const Record& record) {
+    const auto& [first, second, third] = record.texts;
+    const auto aheadMember = [&](JsonWriter* json) {
+        if (mTracker.notes().isAhead(record.at)) json->member("ahead", true);
+    };
+    writeLine(record.at, [&, &one = first, &two = second, &three = third](JsonWriter* json) {
+        switch (record.kind) {
+            case Record::Kind::kBoot:
+                json->member("boot", nameOf(static_cast<trace::BootKind>(record.value)));
+                return;
+            case Record::Kind::kEvent:
+                json->key("event").beginObject().member("module", one).member("id", two);
+                json->member("payload", three).key("fields");
+                writeFields(day::takeApart(two, three).fields, json);
+                json->endObject();
+                return aheadMember(json);
+            case Record::Kind::kProperty:
+                json->key("property").beginObject().member("name", one).member("value", two);
+                json->endObject();
+                return aheadMember(json);
+            case Record::Kind::kLog:
+                json->key("log").beginObject().member("level", record.number);
+                json->member("tag", one).member("text", two).endObject();
+                return;
+            default:
+                json->key("result").beginObject().member("call", one).key("value").raw(two);
+                json->endObject();
+        }
+    });
+}
+
+void JsonLines::writeCapture(int64_t at) {
+    const auto& capture = mTracker.notes().capture();
+    if (!capture || mHasTold) return;
+    mHasTold = true;
+    writeLine(at, [&](JsonWriter* json) {
+        json->key("capture").beginObject();
+        optionalMember(json, "taken", capture->taken);
+        optionalMember(json, "midnight", capture->midnight);
+        json->member("registrations", capture->registrations);
+        json->member("knownTo", capture->knownTo).endObject();
+    });
+}
+
+void JsonLines::writeEnded(int64_t before) {
+    std::sort(mEnded.begin(), mEnded.end(), day::isToldBefore);
+    auto use = mEnded.begin();
+    for (; use != mEnded.end() && use->to < before; ++use) {
+        if (mTracker.notes().namesSensors()) writeUse(*use);
+    }
+    mEnded.erase(mEnded.begin(), use);
+    const auto& taken = mTracker.notes().taken();
+    if (!taken || !mTracker.isClosed() || mIsClosed) return;
+    mIsClosed = true;
+    writeTaken(*taken, *mTracker.notes().knownTo());
+}
+
+void JsonLines::writeUse(const day::Use& use) {
+    writeLine(use.to, [&](JsonWriter* json) {
+        json->key("use").beginObject().member("pkg", use.pkg).member("opPkg", use.opPkg);
+        optionalMember(json, "uid", use.uid);
+        packagesMember(json, use.packages);
+        if (!use.sensor.empty()) json->member("sensor", use.sensor);
+        optionalMember(json, "handle", use.handle);
+        json->member("type", use.type);
+        if (const auto mode = nameOf(use.mode); !mode.empty()) json->member("mode", mode);
+        optionalMember(json, "wakeUp", use.wakeUp);
+        json->member("from", Ms{use.from}).member("to", Ms{use.to}).member("before", use.before);
+        json->member("end", nameOf(use.end));
+        json->member("enables", static_cast<int64_t>(use.enables.size()));
+        if (use.periodNs) json->member("periodUs", *use.periodNs / kNsPerUs);
+        optionalMember(json, "batchUs", use.batchUs);
+        json->member("displayKnown", Ms{use.display.known});
+        if (use.display.known > 0) json->member("displayOn", Ms{use.display.on});
+        json->endObject();
+    });
+}
+
+void JsonLines::writeTaken(const trace::TakenNote& taken, int64_t at) {
+    for (const trace::RefusedNote& refused : taken.refused) {
+        writeLine(at, [&](JsonWriter* json) {
+            json->key("refused").beginObject().member("pkg", refused.client.pkg);
+            optionalMember(json, "uid", refused.client.uid);
+            json->member("handle", refused.client.handle).member("count", refused.count);
+            json->member("result", refused.result).endObject();
+        });
+    }
+    if (!taken.sinceCharge) return;
+    const day::Notes& notes = mTracker.notes();
+    for (const trace::ChargeRow& row : taken.sinceCharge->rows) {
+        const auto* packages = notes.packagesOf(row.uid);
+        const auto* sensor =
+                row.handle < 0 ? nullptr : notes.sensorOf(static_cast<uint32_t>(row.handle));
+        writeLine(at, [&](JsonWriter* json) {
+            json->key("sinceCharge").beginObject().member("uid", row.uid);
+            if (packages != nullptr) packagesMember(json, *packages);
+            json->member("handle", row.handle);
+            if (row.handle == trace::kGpsHandle) json->member("sensor", "GPS");
+            if (sensor != nullptr) json->member("sensor", sensor->name);
+            json->member("ms", row.ms).member("count", row.count);
+            optionalMember(json, "backgroundMs", row.background);
+            json->member("shared", row.shared);
+            optionalMember(json, "onBatteryMs", taken.sinceCharge->onBatteryMs);
+            json->endObject();
+        });
+    }
 }
 
 void LogLines::take(const Record& record) {
@@ -48,7 +204,7 @@ void LogLines::take(const Record& record) {
     switch (record.kind) {
         case Record::Kind::kBoot:
             kind = "boot";
-            text = first;
+            text = nameOf(static_cast<trace::BootKind>(record.value));
             break;
         case Record::Kind::kEvent:
             kind = "event";
@@ -70,7 +226,7 @@ void LogLines::take(const Record& record) {
             return;
     }
     kind.resize(10, ' ');
-    mOut->write(formatClock(record.at) + "  " + kind + printable(text) + '\n');
+    mOut->write(formatClock(record.at) + "  " + kind + onOneLine(text) + '\n');
 }
 
 }  // namespace report

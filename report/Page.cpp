@@ -1,121 +1,142 @@
 #include "report/Page.h"
 
-#include <cerrno>
-#include <cstdio>
-#include <cstring>
-#include <limits>
+#include <vector>
 
-#include "report/DayPicture.h"
-#include "report/OriginText.h"
+#include "base/Calendar.h"
+#include "report/CaptureFacts.h"
+#include "report/CauseText.h"
+#include "report/ChargeText.h"
+#include "report/EventText.h"
+#include "report/FindingText.h"
+#include "report/OnNowText.h"
+#include "report/PageDay.h"
 #include "report/Text.h"
+#include "report/page/TableOf.h"
 
 namespace report {
 
 namespace {
 
-constexpr size_t kAllRows = std::numeric_limits<size_t>::max();
-
-constexpr char kHead[] = R"(<meta charset="utf-8">
-<meta name="viewport" content="width=device-width, initial-scale=1">
-<meta http-equiv="Content-Security-Policy" content="default-src 'none'; style-src 'unsafe-inline'">
-<style>
-:root { color-scheme: light dark; --text: #222; --back: #fff; --faint: #777; --line: #ddd;
-  --slice: #2a6fbb; --display: #f3e7b3; --charge: #6bb36b; --report: #c23b3b; }
-@media (prefers-color-scheme: dark) { :root { --text: #ddd; --back: #1b1b1d; --faint: #999;
-  --line: #3a3a3d; --slice: #6aa9ee; --display: #4a4423; --charge: #4c8f4c; --report: #ee7a7a; } }
-body { font: 15px/1.45 sans-serif; color: var(--text); background: var(--back); margin: 1em auto;
-  max-width: 70em; padding: 0 1em; overflow-wrap: anywhere; }
-h1 { font-size: 1.3em; } h2 { font-size: 1.15em; margin-top: 2em; } h3 { font-size: 1em; }
-.wide { overflow-x: auto; }
-table { border-collapse: collapse; font-size: 0.9em; margin: 0.5em 0; }
-th, td { text-align: left; padding: 0.2em 0.9em 0.2em 0; border-bottom: 1px solid var(--line);
-  vertical-align: top; unicode-bidi: isolate; }
-.number { text-align: right; font-variant-numeric: tabular-nums; white-space: nowrap; }
-svg { display: block; border: 1px solid var(--line); margin: 0.5em 0; }
-svg text { font: 11px sans-serif; fill: var(--text); unicode-bidi: isolate; }
-svg text.hour { fill: var(--faint); } line.hour { stroke: var(--line); }
-.slice { fill: var(--slice); stroke: var(--slice); stroke-width: 1; }
-.display { fill: var(--display); } .charge { fill: var(--charge); }
-line.report { stroke: var(--report); stroke-width: 2; stroke-dasharray: 3 2; }
-.legend { color: var(--faint); font-size: 0.85em; }
-@media print { body { max-width: none; } svg, table { break-inside: avoid; } }
-</style>
-)";
-
-constexpr char kLegend[] =
-        "<p class=\"legend\">Bars: sensors held. Shaded: display on. Green above: charging. "
-        "Dashed: "
-        "reports. A pointer over any of them tells more.</p>\n";
-
-std::string element(const char* tag, const std::string& text) {
-    return std::string("<") + tag + '>' + escape(text) + "</" + tag + ">\n";
+page::Section sectionOf(const day::Event& event) {
+    const EventText text = layOutEvent(event, Table::kAllRows);
+    page::Section section;
+    section.heading = text.title;
+    page::Section::List values;
+    for (const auto& [what, value] : text.values) values.items.push_back(what + ": " + value);
+    if (!values.items.empty()) section.lists.push_back(values);
+    for (const Table& list : text.lists) {
+        section.tables.push_back(page::tableOf(list, "report", "What it lists"));
+    }
+    return section;
 }
 
-std::string inRoom(const Table& table) {
-    return "<div class=\"wide\">" + table.html() + "</div>\n";
+page::Section onNow(const day::Journal& journal, size_t capture) {
+    const OnNowText text = describeOnNow(journal, capture, Table::kAllRows);
+    page::Section section;
+    section.heading = kOnNowHeading;
+    section.lines = text.before;
+    section.lines.insert(section.lines.end(), text.after.begin(), text.after.end());
+    if (!text.rows.isEmpty())
+        section.tables.push_back(page::tableOf(text.rows, "on", "What is on"));
+    return section;
+}
+
+page::Section sinceCharge(const day::Journal& journal, size_t capture) {
+    const ChargeText text = describeSinceCharge(journal, capture, Table::kAllRows);
+    page::Section section;
+    section.heading = kChargeHeading;
+    section.lines.push_back(text.line);
+    if (!text.rows.isEmpty()) {
+        section.tables.push_back(page::tableOf(text.rows, "charge", "Held on battery"));
+    }
+    return section;
+}
+
+/** The events, day by day, that lie ahead of the capture, or those that do not. */
+page::Section reports(const day::Journal& journal, bool isAhead) {
+    page::Section section;
+    section.heading = isAhead ? "Would report, if nothing changed" : "The device reports";
+    if (isAhead) section.lines = describeBounds(journal);
+    for (const day::Day& day : journal.days()) {
+        page::Section part;
+        part.heading = nameDay(journal, day);
+        for (const day::Event* event : journal.eventsOf(day)) {
+            if (event->isAhead == isAhead) part.parts.push_back(sectionOf(*event));
+        }
+        if (!part.parts.empty()) section.parts.push_back(part);
+    }
+    if (section.parts.empty()) section.lines.emplace_back("Nothing.");
+    return section;
+}
+
+page::Section comparisonSection(const ComparisonText& text) {
+    page::Section section;
+    section.heading = "Old against new";
+    for (const std::string& line : text.coverage) section.lines.push_back(safe(line));
+    for (const ComparedPart& part : text.parts) {
+        if (!part.sentence.empty()) section.lines.push_back(part.sentence);
+        if (part.table.isEmpty()) continue;
+        page::Section& shown = section.parts.emplace_back();
+        shown.heading = part.heading;
+        shown.tables.push_back(page::tableOf(part.table, "compared", part.heading));
+    }
+    return section;
+}
+
+page::Section causes(const std::vector<CauseText>& texts) {
+    page::Section section;
+    section.heading = "Why times held and times reported differ";
+    for (const auto& [text, names] : texts) {
+        page::Section::List list{text + ":", {}};
+        for (const std::string& name : names) list.items.push_back(safe(name));
+        section.lists.push_back(list);
+    }
+    return section;
 }
 
 }  // namespace
 
 void Page::end(bool isWhole) {
     mJournal.end();
-    const std::string text = html(isWhole);
-    std::FILE* const file = std::fopen(mPath.c_str(), "we");
-    bool isGood = file != nullptr && std::fwrite(text.data(), 1, text.size(), file) == text.size();
-    if (file != nullptr) isGood = std::fclose(file) == 0 && isGood;
-    if (!isGood) mFailure = trace::Failure{mPath + ": cannot write: " + std::strerror(errno)};
+    mSides.add(mJournal);
+    mWriter.add(model(isWhole));
 }
 
-std::string Page::html(bool isWhole) const {
-    const std::string name = safe(mJournal.input().name);
-    std::string html = std::string("<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n") + kHead +
-                       element("title", name) + "</head>\n<body>\n" + element("h1", name);
-    for (const std::string& line : describe(mJournal.input())) html += element("p", line);
-    if (!isWhole) html += element("p", "The replay has stopped before the end.");
-    for (const Day& day : mJournal.days()) html += dayHtml(day);
-    html += reasonsHtml();
+void Page::finish() {
+    std::optional<page::Section> first;
+    if (const auto text = mSides.layOut(Table::kAllRows)) first = comparisonSection(*text);
+    if (!mWriter.finish(mFile->file(), first)) mFailure = mFile->failure();
+}
+
+page::Input Page::model(bool isWhole) const {
+    page::Input input;
+    input.name = safe(mJournal.name());
+    input.lines = describeCaptures(mJournal);
+    if (!isWhole) input.lines.emplace_back("The replay has stopped before the end.");
+    if (hasFindings(mJournal)) input.findings = describeFindings(mJournal);
+    const auto& captures = mJournal.captures();
+    for (size_t i = 0; i < captures.size(); ++i) input.before.push_back(onNow(mJournal, i));
+    for (const day::Day& day : mJournal.days()) input.days.push_back(pageDay(mJournal, day));
+    for (size_t i = 0; i < captures.size(); ++i) {
+        const auto& taken = captures[i].taken();
+        if (taken && taken->sinceCharge) input.after.push_back(sinceCharge(mJournal, i));
+    }
+    input.after.push_back(reports(mJournal, false));
+    page::Section ahead = reports(mJournal, true);
+    if (!ahead.parts.empty()) input.after.push_back(std::move(ahead));
+    const auto texts = describeCauses(mJournal.causes());
+    if (!texts.empty()) input.after.push_back(causes(texts));
     if (!mJournal.properties().empty()) {
-        html += element("h2", "Stored at the end") + inRoom(layOut(mJournal.properties()));
+        page::Section stored;
+        stored.heading = "Stored at the end";
+        stored.tables.push_back(
+                page::tableOf(propertyTable(mJournal.properties()), "stored", "Properties"));
+        input.after.push_back(stored);
     }
-    html += element("p", "Played " + count(mJournal.boots(), "boot") + ", " +
-                                 formatDuration(mJournal.played()) + " of the device's time.");
-    return html + "</body>\n</html>\n";
-}
-
-std::string Page::dayHtml(const Day& day) const {
-    std::string html = element("h2", mJournal.nameDay(day));
-    const std::string picture = drawDay(mJournal, day);
-    if (!picture.empty()) html += picture + kLegend;
-    const auto uses = mJournal.uses().usesOf(day);
-    if (!uses.empty()) html += inRoom(layOut(uses, mJournal.input().origin, kAllRows));
-    std::string events;
-    for (const auto& [boot, event] : mJournal.events()) {
-        if (boot == day.boot && event.at / kNsPerDay == day.number) events += eventHtml(event);
-    }
-    if (events.empty()) return html + element("p", "The device reports nothing.");
-    return html + element("h3", "The device reports") + events;
-}
-
-std::string Page::eventHtml(const Event& event) const {
-    const EventText text = layOut(event, kAllRows);
-    std::string html = element("p", text.title);
-    std::string values;
-    for (const auto& [what, value] : text.values) values += element("li", what + ": " + value);
-    if (!values.empty()) html += "<ul>\n" + values + "</ul>\n";
-    for (const Table& list : text.lists) html += inRoom(list);
-    return html;
-}
-
-std::string Page::reasonsHtml() const {
-    const auto reasons = mJournal.reasons();
-    if (reasons.empty()) return {};
-    std::string html = element("h2", "Why times held and times reported differ");
-    for (const auto& [text, names] : reasons) {
-        html += element("p", text + ":") + "<ul>\n";
-        for (const std::string& name : names) html += element("li", safe(name));
-        html += "</ul>\n";
-    }
-    return html;
+    input.end = "Played " + count(mJournal.boots().size(), "boot") + ", " +
+                base::formatDuration(std::chrono::nanoseconds(mJournal.played())) +
+                " of the device's time.";
+    return input;
 }
 
 }  // namespace report

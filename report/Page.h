@@ -2,37 +2,45 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 
-#include "report/Journal.h"
+#include "base/OutputFile.h"
+#include "base/Result.h"
+#include "day/Journal.h"
+#include "report/Compare.h"
 #include "report/Report.h"
-#include "trace/Failure.h"
+#include "report/page/PageModel.h"
+#include "report/page/PageWriter.h"
 
 namespace report {
 
 /**
- * The summary as one HTML file with a picture of each day. It needs no network and runs no script;
- * what comes from outside is text in it and never markup.
+ * The summary as one HTML file with a picture of each day, of one input or of several. It needs no
+ * network; what comes from outside is text in it and never markup.
  */
 class Page : public Report {
 public:
-    /** Writes the file `path`, which is made anew; of one input only. */
-    explicit Page(std::string path) : mPath(std::move(path)) {}
+    /**
+     * Writes `file`, which must outlive this, when the last input has ended. Of the inputs the
+     * first `baselines` are a baseline: if there are any, how the others differ comes first.
+     */
+    Page(base::OutputFile* file, size_t baselines) : mFile(file), mSides(baselines) {}
 
-    bool wantsCalls() const override { return true; }
-    void begin(const Input& input) override { mJournal.begin(input); }
-    void take(const Record& record) override { mJournal.take(record); }
+    trace::WantedRecords wanted() const override { return {true, false}; }
+    void begin(const std::string& name) override { mJournal.begin(name); }
+    void take(const trace::Record& record) override { mJournal.take(record); }
     void end(bool isWhole) override;
-    const std::optional<trace::Failure>& failure() const override { return mFailure; }
+    void finish() override;
+    const std::optional<base::Failure>& failure() const override { return mFailure; }
 
 private:
-    std::string html(bool isWhole) const;
-    std::string dayHtml(const Day& day) const;
-    std::string eventHtml(const Event& event) const;
-    std::string reasonsHtml() const;
+    page::Input model(bool isWhole) const;
 
-    const std::string mPath;
-    Journal mJournal;
-    std::optional<trace::Failure> mFailure;
+    base::OutputFile* const mFile;
+    day::Journal mJournal;
+    ComparedSides mSides;
+    page::PageWriter mWriter;
+    std::optional<base::Failure> mFailure;
 };
 
 }  // namespace report

@@ -2,20 +2,11 @@
 
 #include <optional>
 #include <string>
-#include <vector>
 
-#include "report/Record.h"
-#include "trace/Failure.h"
-#include "trace/Origin.h"
+#include "base/Result.h"
+#include "trace/Record.h"
 
 namespace report {
-
-/** What is about to be played. */
-struct Input {
-    std::string name;                        // of the file, as it was given
-    const trace::Origin* origin = nullptr;   // of a capture's trace
-    std::vector<std::string> warnings = {};  // of its import, a line each
-};
 
 /**
  * Something that is made of a replay: lines, a summary, a picture. For each input it hears of the
@@ -25,18 +16,22 @@ class Report {
 public:
     virtual ~Report() = default;
 
-    /** Whether it reads records of calls (`kCall`), which are only made if somebody does. */
-    virtual bool wantsCalls() const { return false; }
+    /** The records that it reads, of those that are only made if somebody does. */
+    virtual trace::WantedRecords wanted() const { return {}; }
 
-    virtual void begin(const Input&) {}
-    virtual void take(const Record& record) = 0;
+    /** An input is about to be played; `name` is the file's, as it was given. */
+    virtual void begin([[maybe_unused]] const std::string& name) {}
+    virtual void take(const trace::Record& record) = 0;
 
     /** After the last record; `isWhole` tells whether the input was played to its end. */
     virtual void end([[maybe_unused]] bool isWhole) {}
 
+    /** After the last input. */
+    virtual void finish() {}
+
     /** What the report has found wrong, or why it could not be made, if anything. */
-    virtual const std::optional<trace::Failure>& failure() const {
-        static const std::optional<trace::Failure> kNone;
+    virtual const std::optional<base::Failure>& failure() const {
+        static const std::optional<base::Failure> kNone;
         return kNone;
     }
 };

@@ -56,26 +56,21 @@ constexpr std::array<std::string_view, 43> kTypes{
         "heading",
 };
 
+bool isPlatforms(int32_t type) {
+    return type > 0 && static_cast<size_t>(type) < kTypes.size();
+}
+
 }  // namespace
 
 std::string nameType(int32_t type) {
-    if (type > 0 && static_cast<size_t>(type) < kTypes.size()) return std::string(kTypes[type]);
-    return "type " + std::to_string(type);
+    return isPlatforms(type) ? std::string(kTypes[type]) : "type " + std::to_string(type);
 }
 
-std::string nameSensor(int32_t type, const trace::Origin* origin) {
+std::string nameSensor(int32_t type, const std::string& name) {
     std::string word = nameType(type);
-    std::string names;
-    if (origin != nullptr) {
-        const auto found = origin->namesOfType.find(type);
-        if (found != origin->namesOfType.end()) {
-            for (const std::string& name : found->second) {
-                names += (names.empty() ? "" : " / ") + name;
-            }
-        }
-    }
-    if (names.empty()) return word;
-    return strcasestr(names.c_str(), word.c_str()) != nullptr ? names : word + ": " + names;
+    if (name.empty()) return word;
+    if (!isPlatforms(type)) return name;
+    return strcasestr(name.c_str(), word.c_str()) != nullptr ? name : word + ": " + name;
 }
 
 }  // namespace report

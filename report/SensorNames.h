@@ -3,17 +3,15 @@
 #include <cstdint>
 #include <string>
 
-#include "trace/Origin.h"
-
 namespace report {
-
-/**
- * A sensor type by the names that `origin`'s sensors of the type have, behind the platform's word
- * for it where they do not say it; without names, that word alone. `origin` may be null.
- */
-std::string nameSensor(int32_t type, const trace::Origin* origin);
 
 /** The platform's word for a type, as "accelerometer", or "type N". */
 std::string nameType(int32_t type);
+
+/**
+ * A sensor by its name, behind the word for its type where that is not in it, or by the word. Types
+ * of makers have none.
+ */
+std::string nameSensor(int32_t type, const std::string& name);
 
 }  // namespace report

@@ -7,26 +7,26 @@
 
 #include <unistd.h>
 
-#include "trace/Failure.h"
-#include "trace/FileIo.h"
+#include "base/FileIo.h"
+#include "base/Result.h"
 
 namespace report {
 
 namespace {
 
-constexpr size_t kFlushSize = size_t{64} << 10;
+constexpr size_t kFlushBytes = size_t{64} << 10;
 
 }  // namespace
 
 void Stdout::write(std::string_view text) {
     mGathered += text;
-    if (mGathered.size() >= kFlushSize) flush();
+    if (mGathered.size() >= kFlushBytes) flush();
 }
 
 void Stdout::flush() {
-    if (!trace::writeAll(STDOUT_FILENO, mGathered.data(), mGathered.size())) {
+    if (!base::writeAll(STDOUT_FILENO, mGathered.data(), mGathered.size())) {
         std::fprintf(stderr, "cannot write standard output: %s\n", std::strerror(errno));
-        _exit(trace::kStatusFailed);
+        _exit(base::kStatusFailed);
     }
     mGathered.clear();
 }

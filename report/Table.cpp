@@ -8,8 +8,10 @@ namespace report {
 
 namespace {
 
-constexpr size_t kGap = 2;      // between columns
-constexpr size_t kMinCut = 10;  // what a column that is cut keeps at least
+constexpr size_t kGap = 2;          // between columns
+constexpr size_t kNarrowGap = 1;    // where room is short
+constexpr size_t kMinCut = 20;      // what a column that is cut keeps beside others
+constexpr size_t kMaxBlanks = 120;  // no column is made wider for one long cell
 
 }  // namespace
 
@@ -22,62 +24,105 @@ void Table::add(const std::vector<std::string>& cells) {
     for (const std::string& cell : cells) row.push_back(safe(cell));
 }
 
-std::vector<size_t> Table::widths(size_t indent) const {
-    std::vector<size_t> widths;
-    size_t all = indent + kGap * (mColumns.size() - 1);
-    for (size_t i = 0; i < mColumns.size(); ++i) {
-        size_t widest = width(mColumns[i].title);
-        for (const auto& row : mRows) widest = std::max(widest, width(row[i]));
-        widths.push_back(widest);
-        all += widest;
-    }
-    // The widest of those that may be cut gives way first.
-    for (; all > kWidth; --all) {
-        size_t* widest = nullptr;
-        for (size_t i = 0; i < mColumns.size(); ++i) {
-            const bool isFirst = widest == nullptr || widths[i] > *widest;
-            if (mColumns[i].layout == Column::kCut && isFirst) widest = &widths[i];
-        }
-        if (widest == nullptr || *widest <= kMinCut) break;
-        --*widest;
-    }
-    return widths;
+size_t Table::widest(size_t column) const {
+    size_t widest = 0;
+    for (const auto& row : mRows) widest = std::max(widest, width(row[column]));
+    return widest;
 }
 
-std::string Table::text(size_t indent) const {
-    const std::vector<size_t> columns = widths(indent);
+Table::Part Table::partOf(size_t indent, const std::vector<size_t>& columns) const {
+    Part part{indent, columns, {}, kGap};
+    for (const size_t i : columns) {
+        part.widths.push_back(std::max(widest(i), width(mColumns[i].title)));
+    }
+    return part;
+}
+
+/** Makes `part` at most `room` wide: narrow gaps first, then the widest that may be cut. */
+bool Table::fit(Part* part, size_t room, size_t leastCut) const {
+    const auto wide = [part] {
+        size_t all = part->indent + part->gap * (part->widths.size() - 1);
+        for (const size_t each : part->widths) all += each;
+        return all;
+    };
+    const auto cutTo = [&](size_t least) {
+        for (size_t all = wide(); all > room; --all) {
+            size_t* widest = nullptr;
+            for (size_t i = 0; i < part->widths.size(); ++i) {
+                const bool isWider = widest == nullptr || part->widths[i] > *widest;
+                if (mColumns[part->columns[i]].layout == Column::kCut && isWider) {
+                    widest = &part->widths[i];
+                }
+            }
+            if (widest == nullptr || *widest <= least) return false;
+            --*widest;
+        }
+        return true;
+    };
+    const std::vector<size_t> natural = part->widths;
+    if (cutTo(2 * leastCut)) return true;
+    part->widths = natural;
+    part->gap = kNarrowGap;
+    return cutTo(leastCut);
+}
+
+std::vector<Table::Part> Table::layOut(size_t indent, std::optional<size_t> room) const {
+    std::vector<size_t> all;
+    std::vector<size_t> cut;
+    std::vector<size_t> others;
+    for (size_t i = 0; i < mColumns.size(); ++i) {
+        if (!mRows.empty() && widest(i) == 0) continue;
+        all.push_back(i);
+        (mColumns[i].layout == Column::kCut ? cut : others).push_back(i);
+    }
+    Part whole = partOf(indent, all);
+    if (!room || cut.empty() || fit(&whole, *room, kMinCut)) return {whole};
+    if (others.empty()) {
+        fit(&whole, *room, 1);
+        return {whole};
+    }
+    std::vector<Part> parts{partOf(indent, cut)};
+    fit(&parts[0], *room, 1);
+    std::vector<size_t> fitting;
+    for (const size_t i : others) {
+        fitting.push_back(i);
+        Part part = partOf(indent + kGap, fitting);
+        const bool fits = fit(&part, *room, 1);
+        if (fits && fitting.size() > 1) {
+            parts.back() = part;
+            continue;
+        }
+        fitting = {i};
+        parts.push_back(partOf(indent + kGap, fitting));
+    }
+    return parts;
+}
+
+std::string Table::text(size_t indent, std::optional<size_t> columns) const {
+    const std::vector<Part> parts = layOut(indent, columns);
     std::string text;
-    const auto addLine = [&](const auto& cellOf) {
-        std::string line(indent, ' ');
-        for (size_t i = 0; i < columns.size(); ++i) {
-            const std::string cell = cut(cellOf(i), columns[i]);
-            const std::string blanks(columns[i] - width(cell), ' ');
-            if (i > 0) line.append(kGap, ' ');
-            line += mColumns[i].layout == Column::kRight ? blanks + cell : cell + blanks;
+    const auto addLine = [&](const Part& part, const auto& cellOf) {
+        std::string line(part.indent, ' ');
+        for (size_t i = 0; i < part.columns.size(); ++i) {
+            const size_t column = part.columns[i];
+            const std::string cell = columns ? cut(cellOf(column), part.widths[i]) : cellOf(column);
+            const size_t blanks = std::min(part.widths[i], kMaxBlanks);
+            const std::string gap(blanks - std::min(width(cell), blanks), ' ');
+            if (i > 0) line.append(part.gap, ' ');
+            line += mColumns[column].layout == Column::kRight ? gap + cell : cell + gap;
         }
         text += line.erase(line.find_last_not_of(' ') + 1) + '\n';
     };
-    addLine([&](size_t i) { return mColumns[i].title; });
-    for (const auto& row : mRows) addLine([&](size_t i) { return row[i]; });
+    for (const Part& part : parts) {
+        addLine(part, [&](size_t i) { return mColumns[i].title; });
+    }
+    for (const auto& row : mRows) {
+        for (const Part& part : parts) {
+            addLine(part, [&](size_t i) { return row[i]; });
+        }
+    }
     if (mLeftOut > 0) text += std::string(indent, ' ') + more() + " (--all shows them)\n";
     return text;
-}
-
-std::string Table::html() const {
-    const auto cell = [this](const char* tag, size_t i, const std::string& text) {
-        const bool isRight = mColumns[i].layout == Column::kRight;
-        return std::string("<") + tag + (isRight ? " class=\"number\">" : ">") + escape(text) +
-               "</" + tag + '>';
-    };
-    std::string html = "<table>\n<tr>";
-    for (size_t i = 0; i < mColumns.size(); ++i) html += cell("th", i, mColumns[i].title);
-    html += "</tr>\n";
-    for (const auto& row : mRows) {
-        html += "<tr>";
-        for (size_t i = 0; i < row.size(); ++i) html += cell("td", i, row[i]);
-        html += "</tr>\n";
-    }
-    return html + "</table>\n" + (mLeftOut > 0 ? "<p>" + more() + "</p>\n" : "");
 }
 
 std::string Table::more() const {

@@ -1,19 +1,24 @@
 #pragma once
 
 #include <cstddef>
+#include <limits>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
 
 namespace report {
 
-/** A table for a person: text at most 100 columns wide, or HTML. */
+/** A table for a person. */
 class Table {
 public:
     struct Column {
         std::string title;
         enum { kLeft, kRight, kCut } layout = kLeft;  // kCut: left, and cut where room is short
     };
+
+    static constexpr size_t kShownRows = 20;  // of a summary, unless all are asked for
+    static constexpr size_t kAllRows = std::numeric_limits<size_t>::max();
 
     /** Shows at most `limit` rows, and how many there are besides. */
     Table(std::vector<Column> columns, size_t limit)
@@ -25,14 +30,32 @@ public:
 
     bool isEmpty() const { return mRows.empty(); }
 
-    /** The lines, each with `indent` blanks in front: the titles, then the rows. */
-    std::string text(size_t indent) const;
+    /**
+     * The lines, each with `indent` blanks in front: the titles, then the rows. Columns in which
+     * nothing stands are left out. A line is at most `columns` wide, if that is given: what may be
+     * cut is, and where that would leave too little of it, it stands on a line above the rest,
+     * which takes as many lines as it needs.
+     */
+    std::string text(size_t indent, std::optional<size_t> columns = {}) const;
 
-    /** The element "table". */
-    std::string html() const;
+    const std::vector<Column>& columns() const { return mColumns; }
+
+    /** The cells of the rows that are shown, made by `safe`. */
+    const std::vector<std::vector<std::string>>& rows() const { return mRows; }
 
 private:
-    std::vector<size_t> widths(size_t indent) const;
+    /** Columns that stand side by side, and how wide they are. */
+    struct Part {
+        size_t indent;
+        std::vector<size_t> columns;
+        std::vector<size_t> widths;
+        size_t gap;  // between two
+    };
+
+    std::vector<Part> layOut(size_t indent, std::optional<size_t> room) const;
+    Part partOf(size_t indent, const std::vector<size_t>& columns) const;
+    bool fit(Part* part, size_t room, size_t leastCut) const;
+    size_t widest(size_t column) const;
     std::string more() const;
 
     const std::vector<Column> mColumns;

@@ -1,7 +1,7 @@
 #include "report/Text.h"
 
+#include <algorithm>
 #include <cstdio>
-#include <ctime>
 
 #include <unictype.h>
 #include <unistr.h>
@@ -11,7 +11,6 @@ namespace report {
 
 namespace {
 
-constexpr int64_t kNsPerSecond = 1'000'000'000;
 constexpr std::string_view kEllipsis = "\u2026";
 
 /** The first character of `text`, which is taken off it; U+FFFD for what is none. */
@@ -80,6 +79,27 @@ std::string cut(const std::string& text, size_t columns) {
     return result.append(rest);
 }
 
+std::vector<std::string> wrap(const std::string& text, size_t columns) {
+    std::vector<std::string> lines;
+    std::string_view rest = text;
+    while (width(rest) > columns) {
+        std::string_view next = rest;
+        size_t end = 0;    // of what fits
+        size_t blank = 0;  // the last one in it
+        for (size_t passed = 0;; end = rest.size() - next.size()) {
+            if (end > 0 && rest[end] == ' ') blank = end;
+            passed += columnsOf(takeCharacter(&next));
+            if (passed > columns) break;
+        }
+        if (blank > 0) end = blank;
+        lines.emplace_back(rest.substr(0, std::max<size_t>(end, 1)));
+        rest.remove_prefix(std::max<size_t>(end, 1));
+        if (blank > 0) rest.remove_prefix(1);
+    }
+    lines.emplace_back(rest);
+    return lines;
+}
+
 std::string escape(std::string_view text) {
     std::string html;
     for (const char c : text) {
@@ -106,37 +126,14 @@ std::string escape(std::string_view text) {
     return html;
 }
 
-std::string formatDuration(int64_t ns) {
-    const auto seconds = static_cast<long long>(ns / kNsPerSecond);
-    char text[48];
-    std::snprintf(text, sizeof(text), "%lld:%02lld:%02lld", seconds / 3600, seconds / 60 % 60,
-                  seconds % 60);
-    return text;
-}
-
-std::string formatRate(int64_t periodNs) {
-    if (periodNs <= 0) return "fastest";
-    const double rate = 1e9 / static_cast<double>(periodNs);
+std::string formatHertz(double rate) {
     char text[48];
     std::snprintf(text, sizeof(text), rate < 1 ? "%.3g" : rate < 1e6 ? "%.1f" : "%.3g", rate);
     return text;
 }
 
-std::string formatDate(int64_t day) {
-    const auto time = static_cast<time_t>(day * 86'400);
-    tm date{};
-    gmtime_r(&time, &date);
-    char text[48];
-    std::strftime(text, sizeof(text), "%Y-%m-%d", &date);
-    return text;
-}
-
-std::string formatTimeOfDay(int64_t ns) {
-    const int64_t seconds = ns / kNsPerSecond % 86'400;
-    char text[48];
-    std::snprintf(text, sizeof(text), "%02d:%02d:%02d", static_cast<int>(seconds / 3600),
-                  static_cast<int>(seconds / 60 % 60), static_cast<int>(seconds % 60));
-    return text;
+std::string formatRate(int64_t periodNs) {
+    return periodNs <= 0 ? "fastest" : formatHertz(1e9 / static_cast<double>(periodNs));
 }
 
 }  // namespace report

@@ -2,11 +2,9 @@
 
 #include <utility>
 
-#include "trace/JsonText.h"
-
 namespace report {
 
-using trace::toJson;
+using base::JsonWriter;
 
 namespace {
 
@@ -18,12 +16,8 @@ std::string microseconds(int64_t ns) {
     return text;
 }
 
-std::string object(const EventArguments& arguments) {
-    std::string json;
-    for (const auto& [name, value] : arguments) {
-        json += (json.empty() ? "" : ", ") + toJson(name) + ": " + value;
-    }
-    return '{' + json + '}';
+EventArguments atTime(int64_t at) {
+    return [at](JsonWriter* json) { json->key("ts").raw(microseconds(at)); };
 }
 
 }  // namespace
@@ -32,39 +26,43 @@ TraceEvents::TraceEvents(std::FILE* file) : mFile(file) {
     std::fputs(R"({"displayTimeUnit": "ms", "traceEvents": [)", mFile);
 }
 
-TraceEvents::~TraceEvents() {
-    if (mFile != nullptr) std::fclose(mFile);
-}
-
-bool TraceEvents::close() {
+void TraceEvents::close() {
     std::fputs("\n]}\n", mFile);
-    const bool isGood = std::ferror(mFile) == 0;
-    return std::fclose(std::exchange(mFile, nullptr)) == 0 && isGood;
 }
 
 void TraceEvents::slice(const Process& process, std::string_view track, std::string_view name,
                         int64_t from, int64_t to, const EventArguments& arguments) {
-    event("X", name, trackOf(process, track), from, R"(, "dur": )" + microseconds(to - from),
-          arguments);
+    const auto times = [&](JsonWriter* json) {
+        json->key("ts").raw(microseconds(from)).key("dur").raw(microseconds(to - from));
+    };
+    event("X", name, trackOf(process, track), times, arguments);
 }
 
 void TraceEvents::instant(const Process& process, std::string_view track, std::string_view name,
                           int64_t at, const EventArguments& arguments) {
-    event("i", name, trackOf(process, track), at, R"(, "s": "t")", arguments);
+    const auto timeAndScope = [&](JsonWriter* json) {
+        atTime(at)(json);
+        json->member("s", "t");
+    };
+    event("i", name, trackOf(process, track), timeAndScope, arguments);
 }
 
 void TraceEvents::counter(const Process& process, std::string_view name, int64_t at,
                           const EventArguments& values) {
-    event("C", name, {processOf(process), 0}, at, "", values);
+    event("C", name, {processOf(process), 0}, atTime(at), values);
 }
 
 size_t TraceEvents::processOf(const Process& process) {
     const auto [it, isNew] = mProcesses.try_emplace(process, mProcesses.size() + 1);
+    const size_t number = it->second;
     if (isNew) {
-        nameEvent("process_name", {it->second, 0}, process.name);
-        sortEvent(it->second);
+        tell("process_name", {number, 0},
+             [&](JsonWriter* json) { json->member("name", process.name); });
+        // The viewers show processes by this; without it by what goes on in them.
+        tell("process_sort_index", {number, 0},
+             [&](JsonWriter* json) { json->member("sort_index", static_cast<int64_t>(number)); });
     }
-    return it->second;
+    return number;
 }
 
 TraceEvents::Track TraceEvents::trackOf(const Process& process, std::string_view name) {
@@ -72,34 +70,30 @@ TraceEvents::Track TraceEvents::trackOf(const Process& process, std::string_view
     const auto [it, isNew] = mThreads.try_emplace({number, std::string(name)}, 0);
     if (isNew) {
         it->second = ++mThreadCounts[number];
-        nameEvent("thread_name", {number, it->second}, name);
+        tell("thread_name", {number, it->second},
+             [&](JsonWriter* json) { json->member("name", name); });
     }
     return {number, it->second};
 }
 
-void TraceEvents::event(const char* phase, std::string_view name, Track track, int64_t at,
-                        const std::string& more, const EventArguments& arguments) {
-    write(R"({"ph": ")" + std::string(phase) + R"(", "name": )" + toJson(name) + R"(, "pid": )" +
-          std::to_string(track.process) + R"(, "tid": )" + std::to_string(track.thread) +
-          R"(, "ts": )" + microseconds(at) + more + R"(, "args": )" + object(arguments) + '}');
+void TraceEvents::tell(std::string_view what, Track track, const EventArguments& arguments) {
+    event(
+            "M", what, track, [](JsonWriter*) {}, arguments);
 }
 
-void TraceEvents::nameEvent(const char* what, Track track, std::string_view name) {
-    write(R"({"ph": "M", "name": ")" + std::string(what) + R"(", "pid": )" +
-          std::to_string(track.process) + R"(, "tid": )" + std::to_string(track.thread) +
-          R"(, "args": {"name": )" + toJson(name) + "}}");
-}
-
-/** The viewers show processes by this; without it by what goes on in them. */
-void TraceEvents::sortEvent(size_t process) {
-    const std::string number = std::to_string(process);
-    write(R"({"ph": "M", "name": "process_sort_index", "pid": )" + number +
-          R"(, "tid": 0, "args": {"sort_index": )" + number + "}}");
-}
-
-void TraceEvents::write(const std::string& json) {
+void TraceEvents::event(std::string_view phase, std::string_view name, Track track,
+                        const EventArguments& more, const EventArguments& arguments) {
+    std::string line;
+    JsonWriter json(&line);
+    json.beginObject().member("ph", phase).member("name", name);
+    json.member("pid", static_cast<int64_t>(track.process));
+    json.member("tid", static_cast<int64_t>(track.thread));
+    more(&json);
+    json.key("args").beginObject();
+    arguments(&json);
+    json.endObject().endObject();
     std::fputs(mIsFirst ? "\n" : ",\n", mFile);
-    std::fwrite(json.data(), 1, json.size(), mFile);
+    std::fwrite(line.data(), 1, line.size(), mFile);
     mIsFirst = false;
 }
 

@@ -3,24 +3,28 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
+#include <functional>
 #include <map>
 #include <string>
 #include <string_view>
+#include <tuple>
 #include <utility>
-#include <vector>
+
+#include "base/Json.h"
 
 namespace report {
 
-/** Arguments of an event: a name and a JSON value each. */
-using EventArguments = std::vector<std::pair<std::string_view, std::string>>;
+/** Writes the arguments of an event as members of a JSON object. */
+using EventArguments = std::function<void(base::JsonWriter*)>;
 
 /** A row of tracks: an app's, or one of the tool's own, whatever an app is called. */
 struct Process {
     std::string name;
     bool isApp = false;
+    int64_t input = 0;  // processes of different inputs are different
 
     bool operator<(const Process& other) const {
-        return isApp != other.isApp ? other.isApp : name < other.name;
+        return std::tie(input, isApp, name) < std::tie(other.input, other.isApp, other.name);
     }
 };
 
@@ -30,11 +34,8 @@ struct Process {
  */
 class TraceEvents {
 public:
-    /** Takes the file over, which is open for writing. */
+    /** Writes to `file`, which must outlive this; errors show in its state. */
     explicit TraceEvents(std::FILE* file);
-
-    /** Closes the file, if `close` has not. */
-    ~TraceEvents();
 
     TraceEvents(const TraceEvents&) = delete;
     TraceEvents& operator=(const TraceEvents&) = delete;
@@ -51,8 +52,8 @@ public:
     void counter(const Process& process, std::string_view name, int64_t at,
                  const EventArguments& values);
 
-    /** Ends the file; false, with `errno`, if not all could be written. Nothing may follow. */
-    bool close();
+    /** Ends the text. Nothing may follow. */
+    void close();
 
 private:
     struct Track {
@@ -62,13 +63,14 @@ private:
 
     size_t processOf(const Process& process);
     Track trackOf(const Process& process, std::string_view name);
-    void event(const char* phase, std::string_view name, Track track, int64_t at,
-               const std::string& more, const EventArguments& arguments);
-    void nameEvent(const char* what, Track track, std::string_view name);
-    void sortEvent(size_t process);
-    void write(const std::string& json);
+    /** Writes an event; `more` writes what its phase adds to the members that all have. */
+    void event(std::string_view phase, std::string_view name, Track track,
+               const EventArguments& more, const EventArguments& arguments);
 
-    std::FILE* mFile;
+    /** Tells a viewer something of a track. */
+    void tell(std::string_view what, Track track, const EventArguments& arguments);
+
+    std::FILE* const mFile;
     bool mIsFirst = true;
     std::map<Process, size_t> mProcesses;
     std::map<std::pair<size_t, std::string>, size_t> mThreads;

@@ -106,11 +106,13 @@ public:
 
     /**
      * Averages the display's colours within `rect` into `rgbOut`, counts the sample, returns 1.
-     *  - `rect`: left, top, right, bottom, in pixels. Right and bottom are exclusive.
+     *  - `rect`: left, top, right, bottom, in pixels of the display in its natural orientation, in
+     *    whatever orientation it is. Right and bottom are exclusive.
      *  - `rgbOut`: red, green, blue, 0 to 255.
      *
      * Returns 0, logs why and leaves `rgbOut` alone if `rect` is all 0, the display has no token,
-     * or the capture, its result or the access to its pixels fails.
+     * or the capture, its result or the access to its pixels fails. On platform versions that turn
+     * `rect` with the display's content, a turn during the call may misplace this one sample.
      *
      * Blocks until the capture arrives, without a time-out: the process must run binder threads.
      * Takes no lock and no budget. Calls on several threads are independent.

@@ -14,6 +14,7 @@
 
 #include "core/Log.h"
 #include "core/SDCImpl.h"
+#include "rgb/CaptureForms.h"
 #include "rgb/ColorAverage.h"
 #include "rgb/RgbShotManager.h"
 #include "rgb/SyncScreenCaptureListener.h"
@@ -27,30 +28,27 @@ int RgbShotManager::getScreenPixcel(int* rgbOut, int* rect) {
         SENSOR_PRIV_LOGD("ic scope is 0. not support pixcel");
         return 0;
     }
-    const sp<IBinder> token = SurfaceComposerClient::getInternalDisplayToken();
+    const sp<IBinder> token = forms::internalDisplayToken<SurfaceComposerClient>();
     if (token == nullptr) {
         SENSOR_PRIV_LOGE("Unable to get handle for display");
         return 0;
     }
 
-    DisplayCaptureArgs args;
-    args.pixelFormat = ui::PixelFormat::RGBA_8888;
-    args.sourceCrop = Rect(rect[0], rect[1], rect[2], rect[3]);
-    args.captureSecureLayers = true;
-    args.displayToken = token;
-    // Unsigned, as the difference of two signed numbers may overflow.
-    args.width = static_cast<uint32_t>(rect[2]) - static_cast<uint32_t>(rect[0]);
-    args.height = static_cast<uint32_t>(rect[3]) - static_cast<uint32_t>(rect[1]);
-    args.useIdentityTransform = true;
+    forms::CaptureRequest request;
+    request.displayToken = token;
+    forms::setField(&forms::captureArgs(&request)->pixelFormat, ui::PixelFormat::RGBA_8888);
+    forms::captureSecureLayers(forms::captureArgs(&request));
+    const Rect area(rect[0], rect[1], rect[2], rect[3]);
 
     const sp<sensor_priv::SyncScreenCaptureListener> listener =
             new sensor_priv::SyncScreenCaptureListener;
-    if (ScreenshotClient::captureDisplay(args, listener) != OK) {
+    if (forms::setArea<SurfaceComposerClient>(&request, area) != OK ||
+        ScreenshotClient::captureDisplay(request, listener) != OK) {
         SENSOR_PRIV_LOGE("UL: captureDisplay failed!");
         return 0;
     }
     const gui::ScreenCaptureResults results = listener->waitForResults();
-    if (results.result != OK) {
+    if (forms::statusOf(results) != OK) {
         SENSOR_PRIV_LOGE("UL: captureResults failed!");
         return 0;
     }

@@ -1,6 +1,6 @@
 #include "rgb/SyncScreenCaptureListener.h"
 
-#include <ui/Fence.h>
+#include "rgb/CaptureForms.h"
 
 namespace android {
 
@@ -8,13 +8,13 @@ inline namespace sensor_priv {
 
 binder::Status SyncScreenCaptureListener::onScreenCaptureCompleted(
         const gui::ScreenCaptureResults& results) {
-    mResults.set_value(results);
+    if (!mIsComplete.exchange(true)) mResults.set_value(results);
     return binder::Status::ok();
 }
 
 gui::ScreenCaptureResults SyncScreenCaptureListener::waitForResults() {
     gui::ScreenCaptureResults results = mResults.get_future().get();
-    results.fence->waitForever("");  // a name for the platform's log; none is needed
+    forms::waitForBuffer(&results);
     return results;
 }
 

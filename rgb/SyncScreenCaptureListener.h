@@ -1,5 +1,6 @@
 #pragma once
 
+#include <atomic>
 #include <future>
 
 #include <android/gui/BnScreenCaptureListener.h>
@@ -17,17 +18,21 @@ inline namespace sensor_priv {
 /** Lets one thread wait for one capture that the platform completes on another thread. */
 class SENSOR_PRIV_HIDDEN SyncScreenCaptureListener : public gui::BnScreenCaptureListener {
 public:
-    /** The platform calls this once, on a binder thread. A second call ends the process. */
+    /**
+     * The platform calls this on a binder thread. The first call counts. Version 16.0 may call it a
+     * second time for a capture that has failed.
+     */
     binder::Status onScreenCaptureCompleted(const gui::ScreenCaptureResults& results) override;
 
     /**
-     * Blocks until the results are there and their buffer is complete, without a time-out. A second
-     * call ends the process.
+     * Blocks until the results are there and their buffer is complete, without a time-out. They
+     * have failed if their buffer cannot be waited for. A second call ends the process.
      */
     gui::ScreenCaptureResults waitForResults();
 
 private:
     std::promise<gui::ScreenCaptureResults> mResults;
+    std::atomic<bool> mIsComplete{false};
 };
 
 }  // namespace sensor_priv

@@ -1,4 +1,7 @@
+#include <algorithm>
 #include <filesystem>
+#include <fstream>
+#include <sstream>
 #include <string>
 #include <utility>
 #include <vector>
@@ -16,7 +19,19 @@ class CaptureImportTest : public ReplayToolTest {
 protected:
     /** The registrations of the trace of a capture with these newest-first registration lines. */
     static Lines registrations(const std::string& lines) {
-        return linesWith("enableSuccess", importText(kSensors + kHeading + lines).trace);
+        return callsWith("enableSuccess", importText(kSensors + kHeading + lines).trace);
+    }
+
+    /** A reader of the trace sees what the file says of its capture, if there is one. */
+    static void checkUses(const std::string& trace, const std::filesystem::path& file) {
+        if (!std::filesystem::exists(file)) return;
+        std::ostringstream text;
+        text << std::ifstream(file).rdbuf();
+        Lines expected = linesWith("", text.str());
+        Lines uses = usesOf(trace);
+        std::sort(expected.begin(), expected.end());
+        std::sort(uses.begin(), uses.end());
+        EXPECT_EQ(uses, expected) << file;
     }
 
     static std::string enable(long long at, const std::string& arguments) {
@@ -85,7 +100,7 @@ TEST_F(CaptureImportTest, FindsItsSectionInABugReportThatPassedThroughAChat) {
                          enable(28'800'000, R"(false, 1, "yes", "yes", 0)")};
     for (const std::string& text : {report, quoted}) {
         const auto imported = importText(text);
-        EXPECT_EQ(linesWith("enableSuccess", imported.trace), expected);
+        EXPECT_EQ(callsWith("enableSuccess", imported.trace), expected);
         ASSERT_EQ(imported.warnings.size(), 1u);
         EXPECT_EQ(imported.warnings[0],
                   "capture:17: warning: 1 registrations left out: they stand behind the end of "
@@ -98,12 +113,12 @@ TEST_F(CaptureImportTest, MakesTheCallsOfTheHostAroundTheRegistrations) {
             kSensors + kHeading +
             "00:00:00 - 0x00000000 pid=1 uid=1 package=a\n"
             "22:59:59 + 0x00000000 pid=1 uid=1 package=a samplingPeriod=1us batchingPeriod=0us\n");
-    Lines calls = linesWith("", imported.trace);
+    const Lines calls = callsWith("", imported.trace);
     const auto call = [](const char* at, const std::string& name, const char* argument) {
         return std::string("{\"at\": ") + at + ", \"call\": \"" + name + "\"" +
                (*argument != '\0' ? std::string(", \"args\": [") + argument + "]" : "") + "}";
     };
-    ASSERT_EQ(calls.size(), 4 + 2 + 24 * 6 + 6 + 1 + 1u);
+    ASSERT_EQ(calls.size(), 4 + 2 + 24 * 6 + 6 + 1u);
     EXPECT_EQ(Lines(calls.begin(), calls.begin() + 12),
               (Lines{call("82789000", "SDCImpl.getInstance", ""),
                      call("82789000", "FlowingDataException.notifyBootCompleted", ""),
@@ -118,7 +133,7 @@ TEST_F(CaptureImportTest, MakesTheCallsOfTheHostAroundTheRegistrations) {
                      call("82810000", "SDCImpl.notifyUltraReset", "23"),
                      call("86400000", "SDCImpl.sendUsedTime", "2")}));
     EXPECT_EQ(calls[15], enable(86'400'000, R"(false, 1, "a", "a", 0)"));
-    EXPECT_EQ(calls.back(), R"({"at": 169220000})");
+    EXPECT_EQ(linesWith("", imported.trace).back(), R"({"at": 169220000})");
 }
 
 TEST_F(CaptureImportTest, BeginsAndEndsADayByItsEdges) {
@@ -170,7 +185,7 @@ TEST_F(CaptureImportTest, PassesMidnightsAndWarnsOfAClockThatWasSetBack) {
         for (const std::string& time : times) {
             expected.push_back(enable(std::stoll(time) * 1000, R"(false, 1, "a", "a", 0)"));
         }
-        EXPECT_EQ(linesWith("enableSuccess", imported.trace), expected) << printed[1];
+        EXPECT_EQ(callsWith("enableSuccess", imported.trace), expected) << printed[1];
         EXPECT_EQ(imported.warnings.size(), setBack) << printed[1];
     }
     EXPECT_EQ(importText(kSensors + kHeading + offs({"11:30:00", "12:00:00"})).warnings,
@@ -190,10 +205,12 @@ TEST_F(CaptureImportTest, LosesNoRegistrationWithoutAWord) {
     };
     for (const auto& [lines, kept, warnings] : std::vector<Capture>{
                  {"02:00:00 + 0xzz pid=1 uid=1 package=b samplingPeriod=1us\n02:00:00 +\n"
-                  "02:00:00 flushed\n25:00:00 + 0x0\n01:30:00 de-activated handle=0x1\n" +
+                  "02:00:00 flushed\n25:00:00 + 0x0\n01:30:00 de-activated handle=0x1\n"
+                  "1:02:03 - 0x0 package=a\n12:00:00.123 activated handle=0x0\n12:00 - 0x0\n"
+                  "99:99:99 -\n02:00:00 - 0x0 pid=1 uid=5000000000 package=a\n" +
                           good,
                   1,
-                  {"6: warning: 3" + unreadable +
+                  {"6: warning: 8" + unreadable +
                    "\"02:00:00 + 0xzz pid=1 uid=1 package=b samplingPeriod=1us\""}},
                  {good + "Maker's statistics:\n" + good + "text\n" + good,
                   1,
@@ -213,11 +230,100 @@ TEST_F(CaptureImportTest, LosesNoRegistrationWithoutAWord) {
                   {"6: warning: 1" + unreadable +
                    "\"02:00:00 - 0x00000000 pid=1 uid=1 package=b\\u0000\""}}}) {
         const auto imported = importText(kSensors + kHeading + lines);
-        EXPECT_EQ(linesWith("enableSuccess", imported.trace).size(), kept) << lines;
+        EXPECT_EQ(callsWith("enableSuccess", imported.trace).size(), kept) << lines;
         Lines expected;
         for (const std::string& warning : warnings) expected.push_back("capture:" + warning);
         EXPECT_EQ(imported.warnings, expected) << lines;
     }
+}
+
+TEST_F(CaptureImportTest, LosesNothingOfItsTablesWithoutAWord) {
+    const std::string client = " | WakeLockRefCount 0 | uid ";
+    const std::string left = " left out: they cannot be read, the first is ";
+    const std::string longName(65536, 'x');
+    const std::string odd = "\x01<b>\xff | WakeLockRefCount 1 | uid 3 | \"";
+    struct Table {
+        std::string text;
+        Lines warnings;
+    };
+    for (const auto& [table, warnings] : std::vector<Table>{
+                 {"2 active connections\n" + longName + client + "1 | x\n" + odd + client + "7\n",
+                  {}},
+                 {"1 active connections\n" + longName + client + "5000000000 | x\n",
+                  {"6: warning: 1 lines of connections" + left + '"' + longName.substr(0, 200) +
+                   '"'}},
+                 {"1 open event connections\na" + client + "1\nX 0x123456789 | status: active\n",
+                  {"7: warning: 1 lines of connections" + left +
+                   "\"X 0x123456789 | status: active\""}},
+                 {"3 active connections\na" + client + "1\n",
+                  {"5: warning: not all connections are there: 1 of 3"}},
+                 {"1 direct connections\nPackage " + longName.substr(0, 9) +
+                          ", HAL channel handle 1, total sensor activated 99999999999999999999\n",
+                  {"6: warning: 1 lines of direct connections" + left + '"' +
+                   longName.substr(0, 9) +
+                   ", HAL channel handle 1, total sensor activated 99999999999999999999\""}},
+                 {"------ CHECKIN BATTERYSTATS (x) ------\n9,0,i,uid,10018," + longName +
+                          "\n9,10018,l,sr,12,1,2\n9,10018,l,sr,5000000000,1,2\n"
+                          "9,10018,l,sr,12,1,2,3,99999999999999999999,5\n9,5000000000,l,sr,1,1,2\n"
+                          "9,0,l,xy,z\n9,0,i,uid,x,a\n------ 0.1s was it ------\n",
+                  {"8: warning: 4 lines of the battery statistics" + left +
+                   "\"9,10018,l,sr,5000000000,1,2\""}}}) {
+        const auto imported = importText(kSensors + table + kHeading + offs({"01:00:00"}));
+        Lines expected;
+        for (const std::string& warning : warnings) expected.push_back("capture:" + warning);
+        EXPECT_EQ(imported.warnings, expected) << table.substr(0, 100);
+        EXPECT_EQ(callsWith("enableSuccess", imported.trace).size(), 1u);
+    }
+    const std::string odds =
+            importText(kSensors + "1 active connections\n" + odd + client +
+                       "7\nZ 0x00000000 | status: active\n" + kHeading + offs({"01:00:00"}))
+                    .trace;
+    EXPECT_EQ(usesOf(odds).back(),
+              R"({"use": {"pkg": "\u0001<b>\ufffd | WakeLockRefCount 1 | uid 3 | \"", "uid": 7, )"
+              R"("handle": 0, "from": 3590000, "before": true, "enables": 1, "periodUs": 200000, )"
+              R"("to": 3600000, "end": "on"}})");
+}
+
+TEST_F(CaptureImportTest, NotesWhatWasRefusedOnce) {
+    const auto line = [](const std::string& time, const char* sign, const std::string& result) {
+        return time + ' ' + sign +
+               " 0x00000000 pid=    9 uid=    1 samplingPeriod=     N/A  us batchingPeriod=     "
+               "N/A  us result=" +
+               result + " (sensor, package): (Zero                  , a)\n";
+    };
+    const std::string no = "-22 (Invalid argument)";
+    const std::string older = line("02:00:01", "+", no) + line("02:00:01", "+", no) +
+                              line("02:00:00", "-", no) + line("01:30:00", "-", "BAD_VALUE") +
+                              line("01:00:00", "-", "OK");
+    const std::string newer = line("02:10:00", "-", "OK") + line("02:00:01", "+", no) +
+                              line("02:00:00", "-", no) + line("00:59:59", "+", "FAILED");
+    const auto imported = importTexts({kSensors + kHeading + older, kSensors + kHeading + newer});
+    EXPECT_EQ(imported.warnings, Lines{});
+    EXPECT_EQ(callsWith("enableSuccess", imported.trace),
+              (Lines{enable(3'600'000, R"(false, 1, "a", "a", 0)"),
+                     enable(7'200'000, R"(false, 1, "a", "a", 0)"),
+                     enable(7'800'000, R"(false, 1, "a", "a", 0)")}));
+    const trace::Note note = noteWith("\"taken\"", imported.trace);
+    ASSERT_TRUE(note.taken);
+    ASSERT_EQ(note.taken->refused.size(), 2u);
+    EXPECT_EQ(note.taken->refused[0].result, "FAILED");
+    EXPECT_EQ(note.taken->refused[1].result, no);
+    EXPECT_EQ(note.taken->refused[1].count, 2);
+    EXPECT_EQ(importText(kSensors + kHeading + line("02:00:00", "+", no)).error,
+              "capture: no previous registrations that were not refused");
+}
+
+TEST_F(CaptureImportTest, SaysIfMergedCapturesDiffer) {
+    const std::string list = kHeading + offs({"01:00:00"});
+    const std::string version = "------ CHECKIN BATTERYSTATS (x) ------\n9,0,i,vers,27,167,";
+    std::string other = kSensors;
+    other.replace(other.find("Zero"), 4, "Null");
+    const std::string ask = " than in 0: are they captures of one device?";
+    EXPECT_EQ(importTexts({kSensors + list + version + "A\n", other + list,
+                           kSensors + list + version + "B\n", kSensors + list})
+                      .warnings,
+              (Lines{"1:1: warning: other sensors" + ask,
+                     "2:1: warning: another build of the system" + ask}));
 }
 
 TEST_F(CaptureImportTest, ReadsACaptureInWhichEveryLineIsFollowedByAnEmptyOne) {
@@ -226,7 +332,7 @@ TEST_F(CaptureImportTest, ReadsACaptureInWhichEveryLineIsFollowedByAnEmptyOne) {
         doubled += c == '\n' ? "\r\n\r\n" : std::string(1, c);
     }
     const auto imported = importText(doubled);
-    EXPECT_EQ(linesWith("enableSuccess", imported.trace).size(), 2u);
+    EXPECT_EQ(callsWith("enableSuccess", imported.trace).size(), 2u);
     EXPECT_EQ(imported.warnings, Lines{});
 }
 
@@ -242,12 +348,12 @@ TEST_F(CaptureImportTest, TakesTheFirstOfSeveralDumpsThatHasRegistrations) {
                   "== dumpstate: 2024-02-01 02:00:00\n" + service + dump}) {
         const auto imported = importText(text);
         EXPECT_EQ(imported.error, "");
-        EXPECT_EQ(linesWith("enableSuccess", imported.trace),
+        EXPECT_EQ(callsWith("enableSuccess", imported.trace),
                   Lines{enable(3'600'000, R"(false, 1, "a", "a", 0)")})
                 << text;
     }
     const auto twice = importText(service + dump + service + dump);
-    EXPECT_EQ(linesWith("enableSuccess", twice.trace).size(), 1u);
+    EXPECT_EQ(callsWith("enableSuccess", twice.trace).size(), 1u);
     EXPECT_EQ(twice.warnings.size(), 1u);
 }
 
@@ -278,26 +384,29 @@ TEST_F(CaptureImportTest, SaysWhatIsMissing) {
 
 TEST_F(CaptureImportTest, DescribesWhereTheTraceComesFrom) {
     const std::string line = "0x00000001) One | M | ver: 1 | type: t(1) | perm: n/a\n";
-    std::string text = report("0 (1) RESET:TIME: 2024-05-02-11-00-00\n0 (2) 050 +screen\n",
-                              "05-02 09:30:00.000  1  2 I screen_toggled: 1\n");
+    std::string text = bugReport("0 (1) RESET:TIME: 2024-05-02-11-00-00\n0 (2) 050 +screen\n",
+                                 "05-02 09:30:00.000  1  2 I screen_toggled: 1\n");
     text.replace(text.find(kHeading), 0, line);
-    const trace::Origin origin = importText(text).origin;
-    EXPECT_EQ(origin.files, Lines{"capture"});
-    EXPECT_EQ(origin.taken, "2024-05-02 12:00:00");
-    EXPECT_EQ(origin.firstDay, 19845);
-    EXPECT_EQ(origin.registrations.from, 36'000'000);
-    EXPECT_EQ(origin.registrationCount, 1);
-    ASSERT_EQ(origin.sensors.size(), 3u);
-    EXPECT_EQ(origin.sensors[1].name, "Name (with) brackets");
-    EXPECT_EQ(origin.namesOfType.at(1), Lines{"Zero"});
-    EXPECT_EQ(origin.namesOfType.at(65537), Lines{"Name (with) brackets"});
-    ASSERT_EQ(origin.displayKnown.size(), 1u);
-    EXPECT_EQ(origin.displayKnown[0].from, 35'990'000);
-    EXPECT_EQ(origin.displayKnown[0].to, 43'200'000);
-    ASSERT_EQ(origin.cameraKnown.size(), 1u);
-    EXPECT_EQ(origin.cameraKnown[0].from, 39'600'000);
-    EXPECT_TRUE(origin.chargeKnown.empty());
-    EXPECT_FALSE(importText(kSensors + kHeading + offs({"01:00:00"})).origin.firstDay);
+    const trace::Note note = noteWith("\"capture\"", importText(text).trace);
+    ASSERT_TRUE(note.capture && note.sensors && note.known);
+    EXPECT_EQ(note.capture->files, Lines{"capture"});
+    EXPECT_EQ(note.capture->taken, "2024-05-02 12:00:00");
+    EXPECT_EQ(note.capture->midnight, "2024-05-02");
+    EXPECT_EQ(note.capture->from, 36'000'000);
+    EXPECT_EQ(note.capture->registrations, 1);
+    EXPECT_EQ(note.capture->knownTo, 43'200'000);
+    ASSERT_EQ(note.sensors->size(), 3u);
+    EXPECT_EQ((*note.sensors)[0].mode, trace::SensorMode::kContinuous);
+    EXPECT_EQ((*note.sensors)[0].minRate, 1.0F);
+    EXPECT_EQ((*note.sensors)[1].name, "Name (with) brackets");
+    ASSERT_EQ(note.known->display.size(), 1u);
+    EXPECT_EQ(note.known->display[0].from, 35'990'000);
+    EXPECT_EQ(note.known->display[0].to, 43'200'000);
+    ASSERT_EQ(note.known->camera.size(), 1u);
+    EXPECT_EQ(note.known->camera[0].from, 39'600'000);
+    EXPECT_TRUE(note.known->charge.empty());
+    const std::string undated = importText(kSensors + kHeading + offs({"01:00:00"})).trace;
+    EXPECT_FALSE(noteWith("\"capture\"", undated).capture->midnight);
 }
 
 TEST_F(CaptureImportTest, PlaysEveryRealCaptureAndTheTraceMadeOfItAlike) {
@@ -305,6 +414,7 @@ TEST_F(CaptureImportTest, PlaysEveryRealCaptureAndTheTraceMadeOfItAlike) {
     if (!std::filesystem::exists(folder)) GTEST_SKIP() << "no real captures at " << folder;
     int played = 0;
     for (const auto& entry : std::filesystem::directory_iterator(folder)) {
+        if (!entry.is_regular_file()) continue;
         const std::string file = "'" + entry.path().string() + "'";
         const Played direct = run("--json " + file);
         if (entry.path().filename() == "android-9-no-sensors.txt") {
@@ -313,7 +423,9 @@ TEST_F(CaptureImportTest, PlaysEveryRealCaptureAndTheTraceMadeOfItAlike) {
             continue;
         }
         EXPECT_EQ(direct.status, 0) << direct.err;
-        write("trace", run("--print-trace " + file).out);
+        const std::string trace = run("--print-trace " + file).out;
+        write("trace", trace);
+        checkUses(trace, folder / "expected" / entry.path().filename().replace_extension("jsonl"));
         EXPECT_EQ(run("--json trace").out, direct.out) << file;
         ++played;
         if (entry.path().filename() == "android-9-emulator.txt") {

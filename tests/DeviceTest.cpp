@@ -6,9 +6,9 @@
 #include <android/log.h>
 #include <cutils/properties.h>
 
+#include "clock/VirtualClock.h"
 #include "platform/PropertyService.h"
 #include "platform/Telemetry.h"
-#include "replay/VirtualClock.h"
 
 namespace {
 

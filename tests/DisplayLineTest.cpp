@@ -4,7 +4,7 @@
 
 #include <gtest/gtest.h>
 
-#include "trace/LineReader.h"
+#include "base/LineReader.h"
 #include "trace/TraceLine.h"
 
 namespace trace {
@@ -14,7 +14,7 @@ namespace {
 std::string judge(const std::string& json, const std::string& trace, TraceLine* line) {
     std::string text = R"({"at": 0, "display": )" + json + '}';
     const size_t size = text.size();
-    text.resize(size + LineReader::kPadding);
+    text.resize(size + base::LineReader::kPadding);
     return TraceParser().parse({text.data(), size}, trace, line).value_or("");
 }
 
@@ -43,7 +43,8 @@ TEST(DisplayLineTest, WhatIsWrongIsNamed) {
             {R"({"rowPadding": true})", R"("rowPadding" must be an integer of 32 bits)"},
             {R"({"png": 3})", R"("png" must be a text)"},
             {R"({"fault": "tokens"})",
-             R"("fault" must be "token", "capture", "results", "lock" or null)"},
+             R"("fault" must be "token", "capture", "results", "lock", "listener", "twice", )"
+             R"("noDisplay", "fence" or null)"},
     };
     for (const auto& [json, error] : kLines) {
         TraceLine line;

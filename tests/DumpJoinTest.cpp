@@ -6,7 +6,7 @@
 
 #include <gtest/gtest.h>
 
-#include "capture/CaptureText.h"
+#include "capture/text/CaptureText.h"
 #include "tests/Captures.h"
 
 namespace {
@@ -31,6 +31,9 @@ std::string join(const std::vector<std::string>& dumps, const std::vector<int64_
         join.add(lines(dumps[i]), taken.empty() ? std::nullopt : std::optional(taken[i]));
     }
     const capture::JoinedLines joined = join.finish();
+    if (const auto& apart = joined.unordered) {
+        return std::to_string(apart->first) + " and " + std::to_string(apart->second);
+    }
     std::string text;
     for (size_t i = 0; i < joined.lines.size(); ++i) {
         const auto& gaps = joined.gaps;
@@ -58,8 +61,8 @@ TEST(DumpJoinTest, JoinsAtTheLongestRunThatEndsTheOlderAndBeginsTheNewer) {
                  {{"abcde", "bcd"}, "abcde: 1 0"},
                  {{"abcde", "de"}, "abcde: 0 1"},
                  {{"de", "abc", "bcd"}, "abcde: 1 2 0"},
-                 {{"abc", "xyz"}, "abc xyz: 0 1"},
-                 {{"xyz", "abc", "cd"}, "xyz abcd: 0 1 2"},
+                 {{"abc", "xyz"}, "1 and 0"},
+                 {{"xyz", "abc", "cd"}, "1 and 0"},
                  {{"a", "b", "ab"}, "ab: 0 1 2"},
                  {{"xbcab", "bca"}, "xbcab: 1 0"},
                  {{"ababa", "aba"}, "ababa: 0 1"},
@@ -86,7 +89,7 @@ TEST(DumpJoinTest, GivesALongCaptureAgainFromPiecesInAnyOrder) {
 /** A report taken at `taken`, with registrations off at `times`, newest first. */
 std::string dump(const std::string& taken, const std::vector<std::string>& times,
                  const std::string& history = "") {
-    std::string text = report(history, "");
+    std::string text = bugReport(history, "");
     const size_t line = text.find("10:00:00 -");
     const std::string rest = text.substr(line + 8, text.find('\n', line) + 1 - line - 8);
     std::string lines;
@@ -104,34 +107,39 @@ TEST(DumpJoinTest, NamesAGapWithItsTimes) {
     EXPECT_EQ(dated.warnings,
               std::vector<std::string>{"0:13: warning: registrations are missing from 2024-05-02 "
                                        "11:00:00 to 2024-05-04 10:00:00"});
-    ASSERT_EQ(dated.origin.gaps.size(), 1u);
-    EXPECT_EQ(dated.origin.gaps[0].from, 39'600'000);
-    EXPECT_EQ(dated.origin.gaps[0].to, 2 * 86'400'000 + 36'000'000);
-    EXPECT_EQ(dated.origin.files, (std::vector<std::string>{"1", "0"}));
-    EXPECT_EQ(dated.origin.taken, "2024-05-04 12:00:00");
+    const trace::Note note = noteWith("\"capture\"", dated.trace);
+    ASSERT_EQ(note.gaps.size(), 1u);
+    EXPECT_EQ(note.gaps[0].from, 39'600'000);
+    EXPECT_EQ(note.gaps[0].to, 2 * 86'400'000 + 36'000'000);
+    EXPECT_EQ(note.capture->files, (std::vector<std::string>{"1", "0"}));
+    EXPECT_EQ(note.capture->taken, "2024-05-04 12:00:00");
     const std::string list = kSensors + "Previous Registrations:\n";
     EXPECT_EQ(importTexts({list + "09:00:00 - 0x00000000 pid=1 uid=1 package=a\n",
                            list + "07:00:00 - 0x00000000 pid=1 uid=1 package=b\n"})
-                      .warnings[0],
-              "1:6: warning: registrations are missing from 09:00:00 to 07:00:00");
+                      .error,
+              "0: no registration is also in 1, and without dates the two cannot be put in order: "
+              "merge captures that say when they were taken");
 }
 
 TEST(DumpJoinTest, DatesEachDumpByItself) {
+    const auto headOf = [](const Imported& imported) {
+        return *noteWith("\"capture\"", imported.trace).capture;
+    };
     // The line of 09:00 is of two days before the newest: the older dump says so.
     const auto imported = importTexts({dump("2024-05-02 12:00:00", {"09:00:00"}),
                                        dump("2024-05-04 12:00:00", {"10:00:00", "09:00:00"})});
-    EXPECT_EQ(imported.origin.registrations.to, 2 * 86'400'000 + 36'000'000);
-    EXPECT_EQ(importText(dump("2024-05-02 12:00:00", {"12:00:00"})).origin.firstDay, 19845);
-    EXPECT_EQ(importText(dump("2024-05-02 12:00:00", {"12:00:01"})).origin.firstDay, 19844);
+    EXPECT_EQ(headOf(imported).to, 2 * 86'400'000 + 36'000'000);
+    EXPECT_EQ(headOf(importText(dump("2024-05-02 12:00:00", {"12:00:00"}))).midnight, "2024-05-02");
+    EXPECT_EQ(headOf(importText(dump("2024-05-02 12:00:00", {"12:00:01"}))).midnight, "2024-05-01");
     // Where two dumps could follow each other either way, their dates tell.
     const auto either = importTexts({dump("2024-05-03 12:00:00", {"09:00:00", "10:30:00"}),
                                      dump("2024-05-02 12:00:00", {"10:30:00", "09:00:00"})});
-    EXPECT_EQ(either.origin.registrations.from, 32'400'000);
+    EXPECT_EQ(headOf(either).from, 32'400'000);
     // A date that is later than the newer dump allows is wrong.
     const auto late = importTexts({dump("2024-05-04 12:00:00", {"09:00:00"}),
                                    dump("2024-05-04 12:00:00", {"07:30:00", "09:00:00"})});
-    EXPECT_EQ(late.origin.registrations.to, 86'400'000 + 27'000'000);
-    EXPECT_EQ(late.origin.firstDay, 19846);
+    EXPECT_EQ(headOf(late).to, 86'400'000 + 27'000'000);
+    EXPECT_EQ(headOf(late).midnight, "2024-05-03");
 }
 
 TEST(DumpJoinTest, TakesStatesFromEachDumpSinceTheOneBefore) {
@@ -145,7 +153,8 @@ TEST(DumpJoinTest, TakesStatesFromEachDumpSinceTheOneBefore) {
         const auto imported = importTexts({dump("2024-05-02 11:00:00", {"09:30:00"}, first),
                                            dump(secondTaken, {"10:50:00", "09:30:00"}, history)});
         std::string known;
-        for (const auto& each : imported.origin.displayKnown) {
+        const trace::Note note = noteWith("\"capture\"", imported.trace);
+        for (const auto& each : note.known->display) {
             known +=
                     " " + std::to_string(each.from / 60000) + "-" + std::to_string(each.to / 60000);
         }

@@ -111,6 +111,39 @@ TEST(GraphicsTest, FaultsHaveTheStatusOfTheirPlace) {
     EXPECT_EQ(buffer->lock(GRALLOC_USAGE_SW_READ_OFTEN, &base), BAD_VALUE);
     EXPECT_EQ(buffer->unlock(), BAD_VALUE);
     EXPECT_EQ(base, nullptr);
+    change.fault = DisplayFault::kListener;
+    show(change);
+    EXPECT_EQ(capture(args).result, PERMISSION_DENIED);
+    EXPECT_EQ(capture(request(1, 0)).result, BAD_VALUE);
+    change.fault = DisplayFault::kTwice;
+    show(change);
+    EXPECT_EQ(capture(args).result, NO_MEMORY) << "the first completion's";
+    change.fault = DisplayFault::kFence;
+    show(change);
+    EXPECT_EQ(capture(args).result, -EINVAL);
+    EXPECT_NE(capture(args).buffer, nullptr);
+    change.fault = DisplayFault::kNoDisplay;
+    show(change);
+    EXPECT_EQ(SurfaceComposerClient::getInternalDisplayToken(), nullptr);
+    EXPECT_TRUE(SurfaceComposerClient::getPhysicalDisplayIds().empty());
+    EXPECT_EQ(ScreenshotClient::captureDisplay(args, new Listener), NAME_NOT_FOUND);
+}
+
+TEST(GraphicsTest, TheOneDisplayIsFoundByItsIdAndNeverTurns) {
+    DisplayChange change;
+    change.size = {10, 20};
+    show(change);
+    const auto ids = SurfaceComposerClient::getPhysicalDisplayIds();
+    ASSERT_EQ(ids.size(), 1u);
+    const sp<IBinder> token = SurfaceComposerClient::getPhysicalDisplayToken(ids[0]);
+    EXPECT_EQ(token, SurfaceComposerClient::getInternalDisplayToken());
+    EXPECT_EQ(SurfaceComposerClient::getPhysicalDisplayToken({ids[0].value + 1}), nullptr);
+    ui::DisplayState state;
+    EXPECT_EQ(SurfaceComposerClient::getDisplayState(token, &state), OK);
+    EXPECT_EQ(state.orientation, ui::Rotation::Rotation0);
+    EXPECT_EQ(state.layerStackSpaceRect.width, 10);
+    EXPECT_EQ(state.layerStackSpaceRect.height, 20);
+    EXPECT_EQ(SurfaceComposerClient::getDisplayState(nullptr, &state), NAME_NOT_FOUND);
 }
 
 TEST(GraphicsTest, ABufferHasTheDisplaysPixelsAndWhiteBehindItsRows) {

@@ -31,6 +31,7 @@ static_assert(std::has_virtual_destructor_v<CaptureArgs>);
 static_assert(std::is_base_of_v<RefBase, SurfaceComposerClient>);
 static_assert(std::is_base_of_v<LightRefBase<Fence>, Fence>);
 static_assert(std::is_same_v<IScreenCaptureListener, gui::IScreenCaptureListener>);
+static_assert(std::is_same_v<DisplayCaptureArgs, gui::DisplayCaptureArgs>);
 
 // The same layout on 32 and 64 bits.
 static_assert(sizeof(sensors_event_t) == 104);
@@ -63,7 +64,7 @@ TEST(PlatformHeadersTest, DefaultsAreTheDevices) {
     EXPECT_EQ(results.buffer, nullptr);
     EXPECT_EQ(results.capturedDataspace, ui::Dataspace::V0_SRGB);
     EXPECT_EQ(static_cast<int32_t>(results.capturedDataspace), 142671872);
-    EXPECT_FALSE(results.capturedSecureLayers);
+    EXPECT_FALSE(results.capturedSecureLayers || results.capturedHdrLayers);
     EXPECT_EQ(results.result, OK);
     EXPECT_EQ(results.writeToParcel(nullptr), INVALID_OPERATION);
     EXPECT_EQ(results.readFromParcel(nullptr), INVALID_OPERATION);

@@ -1,7 +1,11 @@
+#include <functional>
 #include <sstream>
+#include <utility>
 
 #include <gmock/gmock.h>
+#include <sys/stat.h>
 
+#include "record/Pseudonyms.h"
 #include "record/Screen.h"
 #include "tests/ReplayTool.h"
 
@@ -18,6 +22,7 @@ using ::testing::StartsWith;
 class RecordTest : public ReplayToolTest {
 protected:
     static constexpr char kRecord[] = "sensor-priv.jsonl";
+    static constexpr char kKey[] = "sensor-priv.key";
     static constexpr char kOldRecord[] = "sensor-priv.old.jsonl";
 
     Played record(const std::string& trace, const std::string& settings = "") const {
@@ -149,9 +154,10 @@ TEST_F(RecordTest, ProcessesAddToTheRecordAndEachBootReplays) {
 }
 
 TEST_F(RecordTest, ALineThatACrashHasCutOffIsTakenBack) {
-    write(kRecord, "{\"at\": 1}\n{\"at\": 2, \"call\": \"SDCImpl.pro");
+    const std::string whole = "# 2018-04-25T11:45:34Z: process 7 begins\n{\"at\": 1}\n";
+    write(kRecord, whole + "{\"at\": 2, \"call\": \"SDCImpl.pro");
     record(R"({"at": 9, "call": "SDCImpl.setRgbShotCount"})");
-    EXPECT_THAT(read(kRecord), StartsWith("{\"at\": 1}\n# "));
+    EXPECT_THAT(read(kRecord), StartsWith(whole + "# "));
 }
 
 TEST_F(RecordTest, PartsHoldTheirSizeAndPlayByThemselvesAndTogether) {
@@ -176,17 +182,95 @@ TEST_F(RecordTest, PartsHoldTheirSizeAndPlayByThemselvesAndTogether) {
     expectAgreement("whole");
 }
 
-TEST_F(RecordTest, WhatCannotBeWrittenEndsTheRecordAndNotTheHost) {
+TEST_F(RecordTest, AFileThatIsNotItsOwnKeepsEveryByteAndNobodyWaitsForIt) {
     const std::string trace = R"({"at": 0, "call": "SDCImpl.setRgbShotCount"}
 {"at": 1, "call": "RgbShotManager.isEmpty"})";
     const Played alone = run("--json -", trace);
-    std::filesystem::create_symlink("/dev/full", kRecord);
-    for (const char* folder : {"missing", "."}) {
-        const Played played = record(trace, std::string("SENSOR_PRIV_RECORD=") + folder);
+    write("foreign", "no record");
+    const struct {
+        const char* what;
+        std::function<void()> make;
+        const char* settings;
+    } cases[] = {
+            {"a missing folder", [] {}, "SENSOR_PRIV_RECORD=missing"},
+            {"a FIFO", [] { mkfifo(kRecord, 0600); }, ""},
+            {"a link", [] { std::filesystem::create_symlink("foreign", kRecord); }, ""},
+            {"a folder", [] { std::filesystem::create_directory(kRecord); }, ""},
+            {"a text", [] { std::filesystem::copy_file("foreign", kRecord); }, ""},
+            {"no key", [] { std::filesystem::copy_file("foreign", kKey); },
+             "SENSOR_PRIV_RECORD_REDACT=1"},
+    };
+    for (const auto& [what, make, settings] : cases) {
+        SCOPED_TRACE(what);
+        make();
+        const Played played = record(trace, settings);
         EXPECT_EQ(played.out, alone.out);
-        EXPECT_THAT(played.err, ContainsRegex("sensor-priv-record E .*nothing is recorded: "
-                                              "[^\n]*sensor-priv.jsonl[^\n]*\n?$"));
+        EXPECT_THAT(played.err, ContainsRegex("sensor-priv-record E .*nothing is recorded: [^\n]*"
+                                              "sensor-priv\\.(jsonl|key) [^\n]*\n?$"));
+        EXPECT_EQ(read("foreign"), "no record");
+        std::filesystem::remove(kRecord);
     }
+    EXPECT_EQ(read(kKey), "no record");
+}
+
+TEST_F(RecordTest, FilesAreForTheirOwnerOnlyAlsoThoseThatWereThere) {
+    const auto modeOf = [](const char* file) {
+        return static_cast<int>(std::filesystem::status(file).permissions());
+    };
+    for (const mode_t before : {0, 0666}) {
+        record(R"({"at": 9, "call": "SDCImpl.setRgbShotCount"})", "SENSOR_PRIV_RECORD_REDACT=1");
+        EXPECT_EQ(modeOf(kRecord), 0600) << before;
+        EXPECT_EQ(modeOf(kKey), 0600) << before;
+        chmod(kRecord, 0666);
+        chmod(kKey, 0666);
+    }
+}
+
+TEST_F(RecordTest, NoSizeThatIsNoPositiveNumberCounts) {
+    std::string trace = "{\"at\": 0, \"call\": \"SDCImpl.getInstance\"}\n";
+    for (int i = 0; i < 8000; ++i) {
+        trace += "{\"at\": 1, \"call\": \"RgbShotManager.getScreenPixcel\", \"args\": "
+                 "[[0, 0, 9, 9]]}\n";
+    }
+    for (const char* size : {"-5", "0", "1x", ""}) {
+        record(trace, std::string("SENSOR_PRIV_RECORD_MB=") + size);
+        EXPECT_FALSE(std::filesystem::exists(kOldRecord)) << size;
+        std::filesystem::remove(kRecord);
+    }
+    record(trace, "SENSOR_PRIV_RECORD_MB=1");
+    EXPECT_TRUE(std::filesystem::exists(kOldRecord));
+    // A part begins anew, also with what the display showed for the samples of the part before.
+    const std::string part = read(kRecord);
+    EXPECT_THAT(part.substr(part.find("# end of its start")),
+                ContainsRegex(R"(^[^\n]*\n[^\n]*"display": \{"size": \[1080, 2400\])"));
+}
+
+TEST(PseudonymsTest, TheHashIsTheOneThatItsAuthorsPublished) {
+    // Their first vectors: the key 00 01 .. 0f, and the texts "", 00, 00 01, ... (here 15 bytes).
+    const record::HashKey key{0x0706050403020100, 0x0f0e0d0c0b0a0908};
+    std::string text;
+    EXPECT_EQ(record::sipHash(key, text), 0x726fdb47dd0e0e31U);
+    for (char c = 0; c < 15; ++c) text += c;
+    EXPECT_EQ(record::sipHash(key, text), 0xa129ca6149be45e5U);
+}
+
+TEST(PseudonymsTest, NamesAreFoundWhereNamesStand) {
+    record::Pseudonyms names({1, 2});
+    const std::string one = names.of("1");
+    const std::string slashed = names.of("a/b");
+    const std::string escaped = names.of("\"\xC3\xA4\\");
+    const std::pair<std::string, std::string> payloads[] = {
+            {"count:1&pkg:1/a/b&time:1", "count:1&pkg:" + one + '/' + slashed + "&time:1"},
+            {"days:1&pkg:a/b&shockAndChargeTime:1",
+             "days:1&pkg:" + slashed + "&shockAndChargeTime:1"},
+            {"TempInvalidRate:1/1&pkg:unknown&ultraEnergy:1/1&ultraExpired:1",
+             "TempInvalidRate:1/1&pkg:unknown&ultraEnergy:1/1&ultraExpired:1"},
+            {R"(info:{"pkg" : "1/\"\u00e4\\","totalTime" : "1"})",
+             R"(info:{"pkg" : ")" + one + '/' + escaped + R"(","totalTime" : "1"})"},
+            {R"(info:{"pkg" : "&time:\ud83d\ude00&pkg:x\u0000y/1"})",
+             R"(info:{"pkg" : ")" + names.of("&time:\xF0\x9F\x98\x80&pkg:x") + '/' + one + R"("})"},
+    };
+    for (const auto& [payload, expected] : payloads) EXPECT_EQ(names.replaceIn(payload), expected);
 }
 
 TEST_F(RecordTest, NamesAreReplacedButForWhatTheLibraryLooksFor) {

@@ -120,7 +120,7 @@ TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
             joined({in("one", boot("100", "device")), in("one", saved("600", 1)),
                     in("three", boot("5", "device")), in("three", reported("2005", 1))});
     EXPECT_EQ(run("--json one two three").out, expected);
-    EXPECT_EQ(run("--json one - three", "\n").out, expected);
+    EXPECT_EQ(run("--json one - three", "# nothing\n").out, expected);
     EXPECT_EQ(run("--json --properties store one").status, 0);
     EXPECT_EQ(storedIn("store", "sys.x") + storedIn("store", "ro.x"), "12");
     EXPECT_EQ(happened(run("--json --properties store three")), (Lines{reported("2005", 1)}));
@@ -232,7 +232,7 @@ TEST_F(ReplayTest, NamesFilesThatItCannotUse) {
                  {"--properties broken trace", "broken: cannot keep properties in this file: "},
                  {"--properties no/where trace", "no/where: cannot keep properties in this file: "},
                  {"--print-trace trace", "trace: not a device capture\n"},
-                 {"", "FILE is required"}}) {
+                 {"", "FILE is missing"}}) {
         const Played played = run(arguments);
         EXPECT_EQ(played.status, 2) << arguments;
         EXPECT_EQ(played.out, "") << arguments;

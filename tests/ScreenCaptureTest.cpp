@@ -1,4 +1,3 @@
-#include <algorithm>
 #include <array>
 #include <csignal>
 #include <random>
@@ -15,6 +14,7 @@
 #include "rgb/RgbShotManager.h"
 #include "rgb/SyncScreenCaptureListener.h"
 #include "tests/DeviceTest.h"
+#include "tests/Pictures.h"
 
 namespace {
 
@@ -36,8 +36,8 @@ namespace android {
 status_t ScreenshotClient::captureDisplay(const DisplayCaptureArgs& args,
                                           const sp<IScreenCaptureListener>& listener) {
     static auto* const next = platforms<decltype(captureDisplay)>(
-            "_ZN7android16ScreenshotClient14captureDisplayERKNS_18DisplayCaptureArgsE"
-            "RKNS_2spINS_3gui22IScreenCaptureListenerEEE");
+            "_ZN7android16ScreenshotClient14captureDisplayERKNS_3gui18DisplayCaptureArgsE"
+            "RKNS_2spINS1_22IScreenCaptureListenerEEE");
     request = args;
     return next(args, listener);
 }
@@ -67,7 +67,7 @@ using platform::Picture;
 using Rgb = std::array<int, 3>;
 using Rectangle = std::array<int, 4>;
 
-constexpr char kCount[] = "persist.zuno.rgb.shot.count";
+constexpr char kSampleCount[] = "persist.zuno.rgb.shot.count";
 constexpr Rgb kUntouched = {-1, -2, -3};
 
 /** `kUntouched` if the sample fails. */
@@ -76,28 +76,6 @@ Rgb sample(Rectangle rect) {
     const int status = RgbShotManager::getInstance()->getScreenPixcel(rgb.data(), rect.data());
     EXPECT_EQ(status, rgb != kUntouched);
     return rgb;
-}
-
-Picture randomPicture(uint32_t width, uint32_t height, unsigned seed) {
-    std::mt19937 random(seed);
-    Picture picture{width, height, std::vector<uint8_t>(size_t{4} * width * height)};
-    for (uint8_t& byte : picture.pixels) byte = static_cast<uint8_t>(random());
-    return picture;
-}
-
-Rgb averageOf(const Picture& picture, const Rectangle& rect) {
-    const auto [left, top, right, bottom] = rect;
-    std::array<int64_t, 3> sums{};
-    for (int y = std::max(top, 0); y < std::min<int>(bottom, picture.height); ++y) {
-        for (int x = std::max(left, 0); x < std::min<int>(right, picture.width); ++x) {
-            for (size_t i = 0; i < 3; ++i) {
-                sums[i] += picture.pixels[4 * (size_t{picture.width} * y + x) + i];
-            }
-        }
-    }
-    const int64_t count = int64_t{right - left} * (bottom - top);
-    return {static_cast<int>(sums[0] / count), static_cast<int>(sums[1] / count),
-            static_cast<int>(sums[2] / count)};
 }
 
 class ScreenCaptureTest : public DeviceTest {
@@ -188,6 +166,11 @@ TEST_F(ScreenCaptureTest, AFailureIsLoggedLeavesTheOutputAndCountsNothing) {
             {DisplayFault::kCapture, {0, 0, 10, 10}, kNoCapture},
             {DisplayFault::kResults, {0, 0, 10, 10}, kNoResults},
             {DisplayFault::kLock, {0, 0, 10, 10}, kNoBase},
+            {DisplayFault::kListener, {0, 0, 10, 10}, kNoResults},
+            {DisplayFault::kListener, {0, 0, 10, 16385}, kNoResults},
+            {DisplayFault::kTwice, {0, 0, 10, 10}, kNoResults},
+            {DisplayFault::kNoDisplay, {0, 0, 10, 10}, kNoToken},
+            {DisplayFault::kFence, {0, 0, 10, 10}, kNoResults},
             {DisplayFault::kNone, {0, 0, 0, 10}, kNoCapture},
             {DisplayFault::kNone, {5, 0, 4, 10}, kNoCapture},
             {DisplayFault::kNone, {0, 0, 10, 16385}, kNoCapture},
@@ -204,29 +187,26 @@ TEST_F(ScreenCaptureTest, AFailureIsLoggedLeavesTheOutputAndCountsNothing) {
                   fault == DisplayFault::kLock ? "lock 3 unlock " : "");
     }
     advanceTo(1000);
-    EXPECT_EQ(property(kCount), "");
+    EXPECT_EQ(property(kSampleCount), "");
 
     DisplayChange change;
     change.fault = DisplayFault::kNone;
     changeDisplay(change);
     EXPECT_EQ(sample({0, 0, 10, 10}), Rgb{});
     advanceTo(1500);
-    EXPECT_EQ(property(kCount), "1");
+    EXPECT_EQ(property(kSampleCount), "1");
 }
 
 TEST_F(ScreenCaptureTest, AListenerServesOneCapture) {
-    const auto useTwice = [](auto use) noexcept {
-        // NOLINTNEXTLINE(bugprone-unhandled-exception-at-new)
-        const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
-        EXPECT_TRUE(listener->onScreenCaptureCompleted({}).isOk());
-        EXPECT_EQ(listener->waitForResults().result, OK);
-        use(listener);
-    };
-    const auto aborts = ::testing::KilledBySignal(SIGABRT);
-    EXPECT_EXIT(useTwice([](const auto& l) { l->onScreenCaptureCompleted({}); }), aborts,
-                "terminate called");
-    EXPECT_EXIT(useTwice([](const auto& l) { l->waitForResults(); }), aborts,
-                "Future already retrieved");
+    const sp<SyncScreenCaptureListener> listener = new SyncScreenCaptureListener;
+    gui::ScreenCaptureResults results;
+    results.result = NO_MEMORY;
+    EXPECT_TRUE(listener->onScreenCaptureCompleted(results).isOk());
+    EXPECT_TRUE(listener->onScreenCaptureCompleted({}).isOk());
+    EXPECT_EQ(listener->waitForResults().result, NO_MEMORY);
+    EXPECT_TRUE(listener->onScreenCaptureCompleted({}).isOk());
+    EXPECT_EXIT([&]() noexcept { listener->waitForResults(); }(),
+                ::testing::KilledBySignal(SIGABRT), "Future already retrieved");
 }
 
 TEST_F(ScreenCaptureTest, APictureGivesTheDisplayItsSizeUntilAColorOrASizeEndsIt) {

@@ -5,8 +5,8 @@
 
 #include <utils/AndroidThreads.h>
 
+#include "clock/VirtualClock.h"
 #include "core/SDCImpl.h"
-#include "replay/VirtualClock.h"
 #include "tests/DeviceTest.h"
 #include "usage/MagneticUseIf.h"
 

@@ -29,7 +29,7 @@ class StateCourseTest : public ::testing::Test {
 protected:
     static void check(const std::vector<Case>& cases) {
         for (const Case& each : cases) {
-            const auto imported = importText(report(each.history, each.log));
+            const auto imported = importText(bugReport(each.history, each.log));
             EXPECT_EQ(imported.error, "") << each.what;
             EXPECT_EQ(statesOf(imported.trace), each.states) << each.what;
         }
@@ -110,7 +110,7 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
             "  05-02 10:00:01.500 050 80000000 plug=usb\n"
             "05-02 10:00:05.999 050 +screen\n05-02 10:30:00.000 START\n"
             "05-02 12:00:01.000 050 +camera\n";
-    std::string text = report(local, "");
+    std::string text = bugReport(local, "");
     text.replace(text.find("History ("), 8, "History [Format: 2] ");
     EXPECT_EQ(statesOf(importText(text).trace),
               "10:00:01 d1 p2 c0 t0, 10:00:05 d2, 10:30:00 d1, 12:00:00 p0");
@@ -203,7 +203,7 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
 }
 
 TEST_F(StateCourseTest, ReadsSectionsFromWhereTheyBeginToWhereTheyEnd) {
-    const std::string text = report("0 (1) RESET:TIME: 2024-05-02-11-00-00\n" + kComplete, "");
+    const std::string text = bugReport("0 (1) RESET:TIME: 2024-05-02-11-00-00\n" + kComplete, "");
     const std::string states = "11:00:00 d1 p2 c0 t0, 12:00:00 p0";
     const std::string on = "+1h00m00s000ms (2) 050 +screen\n";
     const std::string heading = "Battery History (1):\n" + kReset + on + "\n";
@@ -237,21 +237,21 @@ TEST_F(StateCourseTest, SaysWhatCannotBeDated) {
         return statesOf(imported.trace) + (imported.warnings.empty() ? "" : imported.warnings[0]);
     };
     const std::string course = kReset + kComplete;
-    EXPECT_EQ(warnings(report("0 (2) 050 +screen\n", ""), ""),
+    EXPECT_EQ(warnings(bugReport("0 (2) 050 +screen\n", ""), ""),
               "capture:5: warning: the battery history is left out: it has no TIME line");
-    EXPECT_EQ(warnings(report(course, ""), ""), "09:59:50 d1 p2 c0 t0, 12:00:00 p0");
-    EXPECT_EQ(warnings(report("", ""), ""), "");
+    EXPECT_EQ(warnings(bugReport(course, ""), ""), "09:59:50 d1 p2 c0 t0, 12:00:00 p0");
+    EXPECT_EQ(warnings(bugReport("", ""), ""), "");
     // The header alone tells when knowledge ends; nothing does without it.
-    EXPECT_EQ(warnings(report(course, ""), ", ending at: 2024-05-02 12:00:00"),
+    EXPECT_EQ(warnings(bugReport(course, ""), ", ending at: 2024-05-02 12:00:00"),
               "09:59:50 d1 p2 c0 t0, 11:59:00 p0");
-    std::string undated = report(course, "");
+    std::string undated = bugReport(course, "");
     undated.erase(undated.find(", ending at"), 32);
     EXPECT_EQ(warnings(undated, ": 2024-05-02 11:59:00"),
               "capture:5: warning: no display, charger, camera or calls: the capture does not say "
               "when it was taken");
-    EXPECT_EQ(warnings(report(course + "+59m59s000ms (2) SHUTDOWN\n+1h00m00s999ms (2) START\n"
-                                       "+1h (2) TIME: 2024-05-02-10-00-01\n",
-                              ""),
+    EXPECT_EQ(warnings(bugReport(course + "+59m59s000ms (2) SHUTDOWN\n+1h00m00s999ms (2) START\n"
+                                          "+1h (2) TIME: 2024-05-02-10-00-01\n",
+                                 ""),
                        ""),
               "09:59:50 d1 p2 c0 t0, 12:00:00 p0capture:9: warning: the system started or went "
               "down after the oldest registration (lines: 1)");
@@ -268,7 +268,7 @@ TEST_F(StateCourseTest, AgreesWithTheExamplesOfRealReports) {
                  {"android-7.1-phone",
                   "+1 15:58:29 d2 p2, +1 16:03:32 d1, +1 16:36:14 d2, +1 16:41:19 d1, +1 16:43:36 "
                   "d2, +1 16:48:41 d1, +1 17:12:53 d2, +1 17:23:49 d1, +1 17:54:52 d2, +1 "
-                  "18:02:42 d1, +1 18:37:43 c0 t0, +1 18:37:45 d2, +1 18:42:50 d1, +1 20:50:21 "
+                  "18:02:42 d1, +1 18:37:43 c0 t0, +1 18:37:45 d2, +1 18:42:50 d1, +1 20:50:49 "
                   "p0"},
                  {"android-9-board", "07:36:50 d1 p1 c0 t0, 07:36:59 d2, 08:05:43 d1 p0"}}) {
         std::ostringstream text;

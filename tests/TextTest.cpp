@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "base/Calendar.h"
 #include "report/Format.h"
 #include "report/Table.h"
 
@@ -53,12 +54,16 @@ TEST(TextTest, ALongTextLosesItsMiddleAndStaysWithinItsColumns) {
 
 TEST(TextTest, TimesRatesAndDaysAreWrittenForAPerson) {
     constexpr int64_t kSecond = 1'000'000'000;
-    EXPECT_EQ(formatDuration(0), "0:00:00");
-    EXPECT_EQ(formatDuration(3600 * kSecond - 1), "0:59:59");
-    EXPECT_EQ(formatDuration(int64_t{100} * 3600 * kSecond + 61 * kSecond), "100:01:01");
-    EXPECT_EQ(formatTimeOfDay(int64_t{25} * 3600 * kSecond + 62 * kSecond), "01:01:02");
-    EXPECT_EQ(formatDate(0), "1970-01-01");
-    EXPECT_EQ(formatDate(19'782), "2024-02-29");
+    EXPECT_EQ(base::formatDuration(std::chrono::nanoseconds(0)), "0:00:00");
+    EXPECT_EQ(base::formatDuration(std::chrono::nanoseconds(3600 * kSecond - 1)), "0:59:59");
+    EXPECT_EQ(base::formatDuration(
+                      std::chrono::nanoseconds(int64_t{100} * 3600 * kSecond + 61 * kSecond)),
+              "100:01:01");
+    EXPECT_EQ(base::formatTimeOfDay(
+                      std::chrono::nanoseconds(int64_t{25} * 3600 * kSecond + 62 * kSecond)),
+              "01:01:02");
+    EXPECT_EQ(base::formatDate(0), "1970-01-01");
+    EXPECT_EQ(base::formatDate(19'782), "2024-02-29");
     EXPECT_EQ(formatRate(66'667'000), "15.0");
     EXPECT_EQ(formatRate(5'000'000'000), "0.2");
     EXPECT_EQ(formatRate(10'000), "100000.0");
@@ -67,35 +72,48 @@ TEST(TextTest, TimesRatesAndDaysAreWrittenForAPerson) {
     EXPECT_EQ(formatRate(-1), "fastest");
     EXPECT_EQ(formatClock(86'399'999'999'999), "day 1 23:59:59.999999999");
     EXPECT_EQ(formatClock(86'461'001'000'000), "day 2 00:01:01.001");
-    EXPECT_EQ(printable(" \t a\n\x7f  b"), " a?? b");
+    EXPECT_EQ(onOneLine(" \t a\n\x7f  b"), " a?? b");
     const std::string letters = "?VDIWEFS?";
     for (int level = 1; level < 10; ++level) EXPECT_EQ(levelLetter(level), letters[level - 1]);
     EXPECT_EQ(levelLetter(-1), '?');
 }
 
-TEST(TextTest, ATableFitsItsWidthByCuttingTheWidestNamesFirst) {
-    Table table(
-            {{"A", Table::Column::kCut}, {"B", Table::Column::kCut}, {"N", Table::Column::kRight}},
-            2);
-    table.add({std::string(120, 'a'), std::string(30, 'b'), "1"});
-    table.add({"<x>", "\"&'", "234"});
-    table.add({"left", "out", "0"});
-    std::string expected = "  A" + std::string(60, ' ') + "  B" + std::string(29, ' ') + "    N\n";
-    expected += "  " + std::string(30, 'a') + "\u2026" + std::string(30, 'a') + "  " +
-                std::string(30, 'b') + "    1\n";
-    expected += "  <x>" + std::string(58, ' ') + "  \"&'" + std::string(27, ' ') + "  234\n";
-    expected += "  and 1 more (--all shows them)\n";
-    EXPECT_EQ(table.text(2), expected);
-    const std::string html = table.html();
-    EXPECT_NE(html.find("<td>&lt;x&gt;</td><td>&quot;&amp;&#39;</td><td class=\"number\">234</td>"),
-              std::string::npos)
-            << html;
-    EXPECT_NE(html.find("<p>and 1 more</p>"), std::string::npos);
+TEST(TextTest, ATableFitsItsRoomByCuttingTheWidestNamesFirst) {
+    Table table({{"A", Table::Column::kCut},
+                 {"B", Table::Column::kCut},
+                 {"N", Table::Column::kRight},
+                 {"M", Table::Column::kRight},
+                 {"empty"}},
+                2);
+    const std::string a(120, 'a');
+    const std::string half(30, 'a');
+    table.add({a, std::string(30, 'b'), "1", "", ""});
+    table.add({"<x>", "\"&'", "234", "5 s", ""});
+    table.add({"left", "out", "0", "", ""});
+    const std::string more = "  and 1 more (--all shows them)\n";
+    EXPECT_EQ(table.text(2, 105), "  A" + std::string(60, ' ') + "  B" + std::string(29, ' ') +
+                                          "    N    M\n  " + half + "\u2026" + half + "  " +
+                                          std::string(30, 'b') + "    1\n  <x>" +
+                                          std::string(58, ' ') + "  \"&'" + std::string(27, ' ') +
+                                          "  234  5 s\n" + more);
+    EXPECT_EQ(table.text(2, 29),
+              "  A             B\n      N    M\n  aaaaa\u2026aaaaaa  bbbbbb\u2026bbbbbb\n      1\n"
+              "  <x>           \"&'\n    234  5 s\n" +
+                      more)
+            << "names on a line of their own";
+    EXPECT_EQ(table.text(2).find("\u2026"), std::string::npos) << "without a width nothing is cut";
+    EXPECT_EQ(table.text(2, 8).substr(0, 23), "  A   B\n      N\n      M") << "as many as it needs";
+}
 
-    Table wide(std::vector<Table::Column>(12, {"A", Table::Column::kCut}), 1);
-    wide.add(std::vector<std::string>(12, std::string(30, 'a')));
-    const std::string text = wide.text(0);
-    EXPECT_EQ(width(text.substr(text.find('\n') + 1)), 12 * 10 + 11 * 2u) << "10 of each are kept";
+TEST(TextTest, ASentenceIsBrokenAtItsBlanks) {
+    const std::pair<std::string, std::vector<std::string>> kCases[] = {
+            {"", {""}},
+            {"one two", {"one two"}},
+            {"one two three", {"one two", "three"}},
+            {"one twothreefour", {"one", "twothre", "efour"}},
+            {"\u4e00\u4e8c\u4e09\u56db", {"\u4e00\u4e8c\u4e09", "\u56db"}},
+    };
+    for (const auto& [text, lines] : kCases) EXPECT_EQ(wrap(text, 7), lines) << text;
 }
 
 }  // namespace

@@ -8,8 +8,9 @@
 
 #include <gtest/gtest.h>
 
+#include "base/Json.h"
+#include "base/LineReader.h"
 #include "trace/CallTable.h"
-#include "trace/LineReader.h"
 #include "trace/TraceTime.h"
 
 namespace trace {
@@ -19,7 +20,7 @@ namespace {
 std::string judge(std::string text, TraceLine* line = nullptr) {
     TraceLine ignored;
     const size_t size = text.size();
-    text.resize(size + LineReader::kPadding);
+    text.resize(size + base::LineReader::kPadding);
     return TraceParser()
             .parse({text.data(), size}, "", line != nullptr ? line : &ignored)
             .value_or("");
@@ -83,7 +84,7 @@ TEST(TraceLineTest, ATimeIsWrittenWithTheDecimalsThatItHas) {
             {10'020'000, "10.02"},
             {1'003'000'000, "1003"},
             {8'999'999'999'999'750'000, "8999999999999.75"}};
-    for (const auto& [ns, text] : kTimes) EXPECT_EQ(formatMs(ns), text);
+    for (const auto& [ns, text] : kTimes) EXPECT_EQ(base::formatMs(ns), text);
 }
 
 TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
@@ -234,7 +235,7 @@ TEST(TraceLineTest, BlankLinesAndRemarksAreSkipped) {
 }
 
 /** Gives a text, then blanks, then another text, in pieces. */
-class Text : public ByteSource {
+class Text : public base::ByteSource {
 public:
     Text(std::string before, size_t blanks, std::string after)
           : mText(std::move(before) + std::string(blanks, ' ') + std::move(after)) {}
@@ -256,13 +257,13 @@ private:
 TEST(LineReaderTest, ALineMayHave64MiBAndNoByteMore) {
     constexpr size_t kLimit = 67'108'864;
     for (const char* end : {"", "\nx"}) {
-        LineReader whole(std::make_unique<Text>("a\n", kLimit, end));
+        base::LineReader whole(std::make_unique<Text>("a\n", kLimit, end));
         EXPECT_EQ(whole.next()->size(), 1u);
         EXPECT_EQ(whole.next()->size(), kLimit) << end;
         EXPECT_EQ(whole.next().has_value(), *end != '\0');
         EXPECT_EQ(whole.error(), std::nullopt);
 
-        LineReader tooLong(std::make_unique<Text>("a\n", kLimit + 1, end));
+        base::LineReader tooLong(std::make_unique<Text>("a\n", kLimit + 1, end));
         EXPECT_EQ(tooLong.next()->size(), 1u);
         EXPECT_EQ(tooLong.next(), std::nullopt);
         EXPECT_EQ(tooLong.error(), "the line is longer than 64 MiB");
@@ -271,10 +272,10 @@ TEST(LineReaderTest, ALineMayHave64MiBAndNoByteMore) {
 }
 
 TEST(LineReaderTest, AByteOrderMarkIsSkippedAtTheStartOnly) {
-    LineReader reader(std::make_unique<Text>("\xEF\xBB\xBF{}\n\xEF\xBB\xBFx\n\n", 0, "last"));
+    base::LineReader reader(std::make_unique<Text>("\xEF\xBB\xBF{}\n\xEF\xBB\xBFx\n\n", 0, "last"));
     for (const char* line : {"{}", "\xEF\xBB\xBFx", "", "last"}) EXPECT_EQ(reader.next(), line);
     EXPECT_EQ(reader.next(), std::nullopt);
-    LineReader half(std::make_unique<Text>("\xEF\xBB{}", 0, ""));
+    base::LineReader half(std::make_unique<Text>("\xEF\xBB{}", 0, ""));
     EXPECT_EQ(half.next(), "\xEF\xBB{}");
 }
 

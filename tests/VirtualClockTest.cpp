@@ -1,4 +1,4 @@
-#include "replay/VirtualClock.h"
+#include "clock/VirtualClock.h"
 
 #include <fstream>
 #include <functional>

@@ -1,13 +1,15 @@
-#include "capture/WallTime.h"
+#include "capture/dump/WallTime.h"
 
 #include <optional>
 #include <string>
 
 #include <gtest/gtest.h>
 
+#include "base/Calendar.h"
+
 namespace {
 
-using capture::formatStamp;
+using base::formatStamp;
 using capture::parseStamp;
 
 TEST(WallTimeTest, ReadsMomentsThatExist) {
@@ -35,7 +37,7 @@ TEST(WallTimeTest, PrintsWhatItReads) {
         EXPECT_EQ(parseStamp(formatStamp(time)), time);
     }
     EXPECT_EQ(formatStamp(-1), "1969-12-31 23:59:59");
-    EXPECT_EQ(capture::formatTimeOfDay(86'400'000 + 3'723'999), "01:02:03");
+    EXPECT_EQ(base::formatTimeOfDay(std::chrono::milliseconds(86'400'000 + 3'723'999)), "01:02:03");
 }
 
 TEST(WallTimeTest, GivesALogLineTheYearInWhichItLies) {

@@ -6,7 +6,7 @@
 #  - each file and folder that it names exists;
 #  - it links the library of each platform header that the sources include, and exports those that
 #    the host's headers include.
-# shellcheck disable=SC2046,SC2086  # lists are words without blanks
+# shellcheck disable=SC2013,SC2046,SC2086  # lists are words without blanks
 set -eu
 cd "$1"
 shift
@@ -52,13 +52,13 @@ for path in $(values export_include_dirs) $(values version_script); do
     [ -e "$path" ] || fail "$path does not exist"
 done
 same 'linked libraries' "$(values static_libs) $(values shared_libs)" \
-    "$(libraries_of core/*.* exception/*.* rgb/*.* usage/*.*) libtally_nc libsensorconfig"
+    "$(libraries_of core/*.* exception/*.* rgb/*.* usage/*.*) libbase libtally_nc libsensorconfig"
 same 'exported libraries' "$(values export_shared_lib_headers)" \
     "$(libraries_of $(grep -l SENSOR_PRIV_EXPORT core/*.h exception/*.h rgb/*.h usage/*.h))"
 same 'header libraries' "$(values header_libs)" libbase_headers
 same 'exported header libraries' "$(values export_header_lib_headers)" libbase_headers
-same 'word size' "$(values compile_multilib)" 32
-for property in vendor local_include_dirs; do
+same 'word size' "$(values compile_multilib)" both
+for property in cpp_std vendor local_include_dirs; do
     printf '%s' "$text" | grep -q "[{,]$property:" && fail "$property: must not be set"
 done
 exit 0

@@ -41,6 +41,21 @@ diff - used <<'END'
 2024-03-02|gyroscope|com.example.panorama.GyroReader$Listener/com.example.panorama.GyroReader$Listener|2|170|200.0
 END
 
+# The same of uses: those of `--uses` are those of the lines.
+grep -v broken list | tr '\n' '\0' >sound
+xargs -0 bin/sensor-replay --uses uses.csv <sound >/dev/null
+xargs -0 bin/sensor-replay --json <sound >lines.jsonl
+askUses() {
+    sqlite3 -init "$folder/examples/fleet/uses.sql" uses.db
+}
+printf '.mode list\n.headers off\nselect count(*) from use_day;\n' | askUses >counted
+grep -c '"use": ' lines.jsonl | diff - counted
+awk '/^```sql uses$/ { name = NR ".uses"; next } /^```$/ { name = "" } name { print > name }' \
+    "$folder/docs/many-captures.md"
+for question in *.uses; do
+    askUses <"$question" >answer || { printf 'no answer to line %s\n' "${question%.uses}" && exit 1; }
+done
+
 # Each question of the page has an answer.
 awk '/^```sql$/ { name = NR ".sql"; next } /^```$/ { name = "" } name { print > name }' \
     "$folder/docs/many-captures.md"

@@ -4,17 +4,17 @@
 #  - a class that is marked as exported and has no entry in the map;
 #  - an operation of the facade that no trace can call, nor the stress run, which makes every call;
 #  - a call without a row in docs/trace.md, and its class in the recorder's map;
-#  - an event id, a property or a reason of the summary without a row in docs/output.md;
+#  - an event id, a property or a cause of the summary without a row in docs/output.md;
 #  - a property that the recorder does not look at;
-#  - an event id whose payload report/Payload.cpp does not take apart;
+#  - an event id, or a property, that trace/Words.h does not have;
 #  - an option of sensor-replay that its manual or the completion does not have, and the reverse;
 #  - a version that the list of changes does not have.
 # shellcheck disable=SC2013  # no line has a blank
 set -eu
 cd "$1"
 status=0
-reasons=$(mktemp)
-trap 'rm -f "$reasons"' EXIT
+causes=$(mktemp)
+trap 'rm -f "$causes"' EXIT
 
 # $1 must stand in file $2; $3 says what it is.
 expect() {
@@ -48,20 +48,21 @@ strings() {
 }
 for id in $(strings 'N[0-9]+\|[0-9]+'); do
     expect "\`${id%|*}\\|${id#*|}\`" docs/output.md "the event $id"
-    expect "{\"$id\"" report/Payload.cpp "the event $id"
+    expect "\"$id\"" trace/Words.h "the event $id"
 done
 for property in $(strings '(persist|ro|service)\.[a-z._]+'); do
     # A row may leave out the first two parts of a name that stand in the name before it.
     suffix=${property#*.*.}
     expect "$suffix\`" docs/output.md "the property $property"
     expect "\"$property\"," record/Surroundings.cpp "the property $property"
+    expect "\"$property\"," trace/Words.h "the property $property"
 done
 
-sed -n '/kTexts\[\]/,/};/p' report/Reasons.cpp | tr -d '\n' | sed 's/" *"//g' |
-    grep -o '"[^"]*"' | tr -d '"' >"$reasons"
-while read -r reason; do
-    expect "| $reason |" docs/output.md "the reason"
-done <"$reasons"
+sed -n '/kTexts\[\]/,/};/p' report/CauseText.cpp | tr -d '\n' | sed 's/" *"//g' |
+    grep -o '"[^"]*"' | tr -d '"' >"$causes"
+while read -r cause; do
+    expect "| $cause |" docs/output.md "the cause"
+done <"$causes"
 
 options=$("$3" --help | sed -n 's/^  \(-h,\)\{0,1\}\(--[a-z-]*\).*/\2/p')
 for option in $options; do

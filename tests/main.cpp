@@ -12,10 +12,9 @@
 #include <vector>
 
 #include <fnmatch.h>
+#include <gtest/gtest.h>
 #include <sys/wait.h>
 #include <unistd.h>
-
-#include <gtest/gtest.h>
 
 namespace {
 

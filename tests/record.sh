@@ -10,7 +10,7 @@ shift 2
 folder=$(mktemp -d)
 trap 'rm -rf "$folder"' EXIT
 happened() {
-    sed -n -e 's/, "fields": .*//' -e '/"event": {/p' -e '/"property": {/p' "$1"
+    sed -n -e 's/, "fields": .*//' -e 's/, "ahead": true//' -e '/"event": {/p' -e '/"property": {/p' "$1"
 }
 env LD_PRELOAD="$recorder" SENSOR_PRIV_RECORD="$folder" "$@" >"$folder/out" 2>"$folder/err" ||
     { cat "$folder/err"; exit 1; }

@@ -44,7 +44,7 @@ Error read(element json, android::UltraExceptionInfo* info) {
         Error error = "is unknown";
         if (key == "packageName") error = trace::read(value, &info->packageName);
         if (key == "phoneState") error = trace::read(value, &info->phoneState);
-        if (error) return toJson(key) + ' ' + *error;
+        if (error) return base::toJson(key) + ' ' + *error;
     }
     return {};
 }
@@ -82,6 +82,7 @@ constexpr Readers kCallReaders[] = {
 #define CALL(Class, operation, parameters) \
     ReadersOf<typename ArgumentsOf<decltype(&android::Class::operation)>::type>::kAll,
 #define VARIABLE(name)
+#include "base/Json.h"
 #include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE

@@ -2,7 +2,8 @@
 
 #include <algorithm>
 #include <iterator>
-#include <numeric>
+
+#include "base/Nearest.h"
 
 namespace trace {
 
@@ -47,12 +48,12 @@ std::string describeArguments() {
     return describeAll(static_cast<typename ArgumentsOf<Operation>::type*>(nullptr));
 }
 
-struct Call {
+struct NamedCall {
     std::string_view name;
     std::string (*arguments)();
 };
 
-constexpr Call kCalls[] = {
+constexpr NamedCall kCalls[] = {
 #define CALL(Class, operation, parameters) \
     {#Class "." #operation, describeArguments<decltype(&android::Class::operation)>},
 #define VARIABLE(name)
@@ -69,21 +70,6 @@ constexpr std::string_view kVariables[] = {
 #undef VARIABLE
 };
 
-/** How many characters have to be put in, left out or replaced to make `b` of `a`. */
-size_t distance(std::string_view a, std::string_view b) {
-    std::vector<size_t> row(b.size() + 1);  // of the prefix of `a` so far to each prefix of `b`
-    std::iota(row.begin(), row.end(), size_t{0});
-    for (size_t i = 0; i < a.size(); ++i) {
-        size_t diagonal = row[0]++;
-        for (size_t j = 0; j < b.size(); ++j) {
-            const size_t replaced = diagonal + (a[i] == b[j] ? 0 : 1);
-            diagonal = row[j + 1];
-            row[j + 1] = std::min({replaced, diagonal + 1, row[j] + 1});
-        }
-    }
-    return row.back();
-}
-
 }  // namespace
 
 std::string_view callName(size_t index) {
@@ -92,7 +78,7 @@ std::string_view callName(size_t index) {
 
 std::optional<size_t> findCall(std::string_view name) {
     const auto* found = std::find_if(std::begin(kCalls), std::end(kCalls),
-                                     [&](const Call& call) { return call.name == name; });
+                                     [&](const NamedCall& call) { return call.name == name; });
     if (found == std::end(kCalls)) return std::nullopt;
     return static_cast<size_t>(found - kCalls);
 }
@@ -104,18 +90,14 @@ std::optional<size_t> findVariable(std::string_view name) {
 }
 
 std::string_view nearestCall(std::string_view name) {
-    constexpr size_t kLongest = 100;  // of a name that is worth a comparison
-    name = name.substr(0, kLongest);
-    return std::min_element(std::begin(kCalls), std::end(kCalls),
-                            [&](const Call& a, const Call& b) {
-                                return distance(name, a.name) < distance(name, b.name);
-                            })
-            ->name;
+    std::vector<std::string_view> names;
+    for (const NamedCall& call : kCalls) names.push_back(call.name);
+    return base::nearest(name, names);
 }
 
 std::string listCalls() {
     std::string text;
-    for (const Call& call : kCalls) {
+    for (const NamedCall& call : kCalls) {
         text.append(call.name).append(" [").append(call.arguments()).append("]\n");
     }
     return text;

@@ -7,6 +7,8 @@
 #include <string_view>
 #include <utility>
 
+#include "base/Json.h"
+
 namespace trace {
 
 using simdjson::dom::element;
@@ -51,7 +53,7 @@ Error readPicture(element json, const std::string& trace, platform::Picture* pic
     if (Error error = read(json, &path)) return error;
     // An absolute path stands for itself; standard input, "-", is beside the current directory.
     const auto file = std::filesystem::path(trace).parent_path() / path;
-    if (Error error = platform::readPng(file, picture)) return toJson(path) + ": " + *error;
+    if (Error error = platform::readPng(file, picture)) return base::toJson(path) + ": " + *error;
     return {};
 }
 
@@ -61,6 +63,10 @@ Error readFault(element json, platform::DisplayFault* fault) {
             {"capture", platform::DisplayFault::kCapture},
             {"results", platform::DisplayFault::kResults},
             {"lock", platform::DisplayFault::kLock},
+            {"listener", platform::DisplayFault::kListener},
+            {"twice", platform::DisplayFault::kTwice},
+            {"noDisplay", platform::DisplayFault::kNoDisplay},
+            {"fence", platform::DisplayFault::kFence},
     };
     *fault = platform::DisplayFault::kNone;
     if (json.is_null()) return {};
@@ -71,7 +77,8 @@ Error readFault(element json, platform::DisplayFault* fault) {
         }
     }
     if (*fault != platform::DisplayFault::kNone) return {};
-    return R"(must be "token", "capture", "results", "lock" or null)";
+    return R"(must be "token", "capture", "results", "lock", "listener", "twice", "noDisplay", )"
+           R"("fence" or null)";
 }
 
 }  // namespace
@@ -94,9 +101,9 @@ Error readDisplay(element json, const std::string& trace, platform::DisplayChang
         } else if (key == "fault") {
             error = readFault(value, &change->fault.emplace());
         } else {
-            return "unknown key " + toJson(key);
+            return "unknown key " + base::toJson(key);
         }
-        if (error) return toJson(key) + ' ' + *error;
+        if (error) return base::toJson(key) + ' ' + *error;
     }
     if (change->picture && (change->size || change->color)) {
         return R"("png" together with "size" or "color")";

@@ -4,6 +4,8 @@
 #include <charconv>
 #include <unordered_set>
 
+#include "base/Json.h"
+
 namespace trace {
 
 using simdjson::dom::array;
@@ -118,7 +120,7 @@ Error checkKeys(object json) {
     if (json.size() < 2) return {};
     std::unordered_set<std::string_view> keys;
     for (const auto field : json) {
-        if (!keys.insert(field.key).second) return "the key " + toJson(field.key) + " twice";
+        if (!keys.insert(field.key).second) return "the key " + base::toJson(field.key) + " twice";
     }
     return {};
 }

@@ -10,7 +10,7 @@
 
 #include <simdjson.h>
 
-#include "trace/JsonText.h"
+#include "base/Json.h"
 
 namespace trace {
 

@@ -3,12 +3,14 @@
 #include <algorithm>
 #include <array>
 
+#include "base/Json.h"
+#include "base/LineReader.h"
 #include "platform/PropertyService.h"
 #include "trace/Arguments.h"
 #include "trace/DisplayLine.h"
 #include "trace/JsonReader.h"
-#include "trace/LineReader.h"
 #include "trace/TraceTime.h"
+#include "trace/TraceWriter.h"
 
 namespace trace {
 
@@ -24,7 +26,8 @@ namespace {
 
 /** The number behind "at" in `text`, a valid JSON object, as it is written there. */
 std::string_view atToken(simdjson::ondemand::parser* parser, std::string_view text) {
-    auto document = parser->iterate(text.data(), text.size(), text.size() + LineReader::kPadding);
+    auto document =
+            parser->iterate(text.data(), text.size(), text.size() + base::LineReader::kPadding);
     for (auto field : document.get_object()) {
         std::string_view key;
         if (field.unescaped_key().get(key) != simdjson::SUCCESS) break;
@@ -52,7 +55,8 @@ Error readCall(element json, Call* call) {
     if (json.get(name) != simdjson::SUCCESS) return R"("call" must be a text)";
     const std::optional<size_t> index = findCall(name);
     if (!index) {
-        return "unknown call " + toJson(name) + "; the nearest is " + toJson(nearestCall(name));
+        return "unknown call " + base::toJson(name) + "; the nearest is " +
+               base::toJson(nearestCall(name));
     }
     call->index = *index;
     return {};
@@ -64,10 +68,10 @@ Error readVariables(element json, VariableWrites* variables) {
     if (Error error = checkKeys(values)) return error;
     for (const auto [name, value] : values) {
         const std::optional<size_t> index = findVariable(name);
-        if (!index) return "unknown variable " + toJson(name);
+        if (!index) return "unknown variable " + base::toJson(name);
         auto& write = variables->writes.emplace_back(*index, 0);
         if (Error error = readVariable(*index, value, &write.second)) {
-            return toJson(name) + ' ' + *error;
+            return base::toJson(name) + ' ' + *error;
         }
     }
     return {};
@@ -82,11 +86,11 @@ Error readProperties(element json, PropertyWrites* properties) {
         if (name.find('\0') != std::string_view::npos) return "a property's name holds a NUL";
         if (!value.is_null()) {
             if (Error error = read(value, &write.second.emplace())) {
-                return toJson(name) + ' ' + *error + " or null";
+                return base::toJson(name) + ' ' + *error + " or null";
             }
         }
         if (Error error = platform::refuseProperty(write.first, write.second.value_or(""))) {
-            return toJson(name) + ": " + *error;
+            return base::toJson(name) + ": " + *error;
         }
     }
     return {};
@@ -104,8 +108,8 @@ Error readTexts(element json, const std::array<std::string_view, Size>& keys,
         if (!ignored.empty() && key == ignored) continue;
         const auto place =
                 static_cast<size_t>(std::find(keys.begin(), keys.end(), key) - keys.begin());
-        if (place == Size) return "has the unknown key " + toJson(key);
-        if (Error error = read(value, &(*texts)[place])) return toJson(key) + ' ' + *error;
+        if (place == Size) return "has the unknown key " + base::toJson(key);
+        if (Error error = read(value, &(*texts)[place])) return base::toJson(key) + ' ' + *error;
         ++found;
     }
     return found == Size ? Error() : "lacks a key";
@@ -132,20 +136,17 @@ Error readExpectation(element json, Expectation* expectation) {
         }
         expectation->entry = propertyEntry(texts[0], texts[1]);
     } else {
-        return R"("expect" has the unknown key )" + toJson(kind);
+        return R"("expect" has the unknown key )" + base::toJson(kind);
     }
     return {};
 }
 
 Error readBoot(element json, BootKind* boot) {
-    std::string_view kind;
-    if (json.get(kind) == simdjson::SUCCESS && kind == "device") {
-        *boot = BootKind::kDevice;
-    } else if (json.get(kind) == simdjson::SUCCESS && kind == "process") {
-        *boot = BootKind::kProcess;
-    } else {
-        return R"("boot" must be "device" or "process")";
-    }
+    std::string_view name;
+    const bool isText = json.get(name) == simdjson::SUCCESS;
+    const auto* found = std::find(kBootKinds.begin(), kBootKinds.end(), name);
+    if (!isText || found == kBootKinds.end()) return R"("boot" must be "device" or "process")";
+    *boot = static_cast<BootKind>(found - kBootKinds.begin());
     return {};
 }
 
@@ -160,19 +161,10 @@ Error readAction(std::string_view key, element value, const std::string& trace, 
     }
     if (key == "expect") return readExpectation(value, &action.emplace<Expectation>());
     if (key == "boot") return readBoot(value, &action.emplace<BootKind>());
-    return "unknown key " + toJson(key);
+    return "unknown key " + base::toJson(key);
 }
 
 }  // namespace
-
-std::string eventEntry(std::string_view module, std::string_view id, std::string_view payload) {
-    return R"("event": {"module": )" + toJson(module) + R"(, "id": )" + toJson(id) +
-           R"(, "payload": )" + toJson(payload) + '}';
-}
-
-std::string propertyEntry(std::string_view name, std::string_view value) {
-    return R"("property": {"name": )" + toJson(name) + R"(, "value": )" + toJson(value) + '}';
-}
 
 TraceParser::TraceParser() : mParsers(std::make_unique<Parsers>()) {}
 
@@ -180,7 +172,7 @@ TraceParser::~TraceParser() = default;
 
 std::optional<std::string> TraceParser::parse(std::string_view text, const std::string& trace,
                                               TraceLine* line) {
-    static_assert(LineReader::kPadding >= simdjson::SIMDJSON_PADDING);
+    static_assert(base::LineReader::kPadding >= simdjson::SIMDJSON_PADDING);
     element document;
     object fields;
     const auto status = mParsers->document.parse(text.data(), text.size(), false).get(document);
@@ -189,6 +181,7 @@ std::optional<std::string> TraceParser::parse(std::string_view text, const std::
     if (Error error = checkKeys(fields)) return error;
 
     line->action = std::monostate();
+    line->note.clear();
     std::optional<element> at;
     std::optional<element> arguments;
     for (const auto [key, value] : fields) {
@@ -196,12 +189,15 @@ std::optional<std::string> TraceParser::parse(std::string_view text, const std::
             at = value;
         } else if (key == "args") {
             arguments = value;
+        } else if (key == "note") {
+            if (!value.is_object()) return R"("note" must be an object)";
+            line->note = simdjson::minify(value);
         } else if (Error error = readAction(key, value, trace, line)) {
             return error;
         }
     }
-    if (fields.size() > size_t{1} + (at ? 1 : 0) + (arguments ? 1 : 0))
-        return "more than one action";
+    const size_t others = (at ? 1 : 0) + (arguments ? 1 : 0) + (line->note.empty() ? 0 : 1);
+    if (fields.size() > 1 + others) return "more than one action";
     if (!at) return R"("at" is missing)";
     if (Error error = readTime(*at, &mParsers->numbers, text, &line->at)) return error;
     if (auto* call = std::get_if<Call>(&line->action)) {

@@ -12,10 +12,9 @@
 
 #include "platform/Display.h"
 #include "trace/CallTable.h"
+#include "trace/Words.h"
 
 namespace trace {
-
-enum class BootKind { kDevice, kProcess };
 
 /** A call of the library: its place in calls.inc, and what it takes. */
 struct Call {
@@ -35,7 +34,7 @@ struct PropertyWrites {
 
 /** What the library did on the device that the trace was recorded on. */
 struct Expectation {
-    std::string entry;  // `eventEntry` or `propertyEntry`
+    std::string entry;  // `eventEntry` or `propertyEntry` of trace/TraceWriter.h
 };
 
 /** One line of a trace, judged: its action is known to be in order and can be carried out. */
@@ -44,12 +43,8 @@ struct TraceLine {
     std::variant<std::monostate, Call, VariableWrites, PropertyWrites, platform::DisplayChange,
                  Expectation, BootKind>
             action;
+    std::string note;  // the object behind "note", as JSON; empty if the line has none
 };
-
-// What the library did, as output and "expect" lines have it: the key and its object.
-
-std::string eventEntry(std::string_view module, std::string_view id, std::string_view payload);
-std::string propertyEntry(std::string_view name, std::string_view value);
 
 /** Judges lines one by one. Whether times go back is the caller's business. */
 class TraceParser {
@@ -58,9 +53,9 @@ public:
     ~TraceParser();
 
     /**
-     * Parses `text`, behind which `LineReader::kPadding` bytes must be readable, into `*line`.
-     * Pictures are looked for beside the file `trace`. Returns nothing, or what is wrong with the
-     * line; `*line` is then not to be used.
+     * Parses `text`, behind which `base::LineReader::kPadding` bytes must be readable, into
+     * `*line`. Pictures are looked for beside the file `trace`. Returns nothing, or what is wrong
+     * with the line; `*line` is then not to be used.
      */
     std::optional<std::string> parse(std::string_view text, const std::string& trace,
                                      TraceLine* line);

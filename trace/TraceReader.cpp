@@ -2,22 +2,21 @@
 
 namespace trace {
 
-bool TraceReader::next(TraceLine* line, std::optional<Failure>* failure) {
+base::Result<bool> TraceReader::next(TraceLine* line) {
     while (const auto text = mLines->next()) {
-        if (!isSkipped(*text)) return judge(*text, line, failure);
+        if (isSkipped(*text)) continue;
+        auto judged = judge(*text, line);
+        mIsTorn = !judged && mAllowsTornEnd && mLines->isLastOpen();
+        if (mIsTorn) return false;
+        return judged.map([] { return true; });
     }
-    return mLines->error() ? fail(*mLines->error(), failure) : false;
-}
-
-bool TraceReader::judge(std::string_view text, TraceLine* line, std::optional<Failure>* failure) {
-    mText = text;
-    if (const auto error = mParser.parse(text, mName, line)) return fail(*error, failure);
-    return true;
-}
-
-bool TraceReader::fail(const std::string& what, std::optional<Failure>* failure) const {
-    *failure = Failure{at(mName, lineNumber()) + what};
+    if (mLines->error()) return fail(*mLines->error());
     return false;
+}
+
+base::Result<void> TraceReader::judge(std::string_view text, TraceLine* line) {
+    if (const auto error = mParser.parse(text, mName, line)) return fail(*error);
+    return {};
 }
 
 }  // namespace trace

@@ -1,12 +1,11 @@
 #pragma once
 
 #include <cstdint>
-#include <optional>
 #include <string>
 #include <string_view>
 
-#include "trace/Failure.h"
-#include "trace/LineReader.h"
+#include "base/LineReader.h"
+#include "base/Result.h"
 #include "trace/TraceLine.h"
 
 namespace trace {
@@ -15,33 +14,39 @@ namespace trace {
 class TraceReader {
 public:
     /** `name` is the file's name, for messages and to find pictures beside it. */
-    TraceReader(std::string name, LineReader* lines) : mName(std::move(name)), mLines(lines) {}
+    TraceReader(std::string name, base::LineReader* lines)
+          : mName(std::move(name)),
+            mLines(lines) {}
 
     const std::string& name() const { return mName; }
 
-    /**
-     * Judges the next line that is neither blank nor a comment; false at the end. On a failure,
-     * `*failure` says what is wrong.
-     */
-    bool next(TraceLine* line, std::optional<Failure>* failure);
+    /** From now on the trace ends before a torn last line: wrong, and without a line feed. */
+    void allowTornEnd() { mAllowsTornEnd = true; }
+
+    /** Whether the trace has ended so, at `lineNumber()`. */
+    bool isTorn() const { return mIsTorn; }
+
+    /** Judges the next line that is neither blank nor a comment; false at the end. */
+    base::Result<bool> next(TraceLine* line);
 
     /** Judges `text` as the line that stands at `lineNumber()`. */
-    bool judge(std::string_view text, TraceLine* line, std::optional<Failure>* failure);
+    base::Result<void> judge(std::string_view text, TraceLine* line);
 
-    /** The text of the last line; valid until the next one. */
-    std::string_view text() const { return mText; }
     int64_t lineNumber() const { return mLines->lineNumber(); }
 
     /** Whether `next` will not have to wait for input. */
     bool hasLine() const { return mLines->hasLine(); }
 
 private:
-    bool fail(const std::string& what, std::optional<Failure>* failure) const;
+    tl::unexpected<base::Failure> fail(const std::string& what) const {
+        return base::fail(base::at(mName, lineNumber()) + what);
+    }
 
     const std::string mName;
-    LineReader* const mLines;
+    base::LineReader* const mLines;
     TraceParser mParser;
-    std::string_view mText;
+    bool mAllowsTornEnd = false;
+    bool mIsTorn = false;
 };
 
 }  // namespace trace

@@ -11,11 +11,11 @@
 #include <string>
 #include <thread>
 
+#include <CLI/CLI.hpp>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
 #include <unistd.h>
-#include <CLI/CLI.hpp>
 
 #include "examples/host/SensorService.h"
 #include "examples/host/Session.h"

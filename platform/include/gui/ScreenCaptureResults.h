@@ -21,6 +21,7 @@ struct ScreenCaptureResults : public Parcelable {
     sp<GraphicBuffer> buffer;
     sp<Fence> fence = Fence::NO_FENCE;  // signals when the buffer's contents are complete
     bool capturedSecureLayers{false};
+    bool capturedHdrLayers{false};
     ui::Dataspace capturedDataspace{ui::Dataspace::V0_SRGB};
     status_t result = OK;
 };

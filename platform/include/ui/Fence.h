@@ -31,7 +31,8 @@ public:
 
     /**
      * Waits for the signal. A time-out of 0 does not wait: returns -ETIME if there was no signal.
-     * Any other time-out never passes, as the clock stands still during a capture.
+     * Any other time-out never passes, as the clock stands still during a capture. Returns an error
+     * if the signal is one.
      */
     status_t wait(int timeoutMs);
     status_t waitForever(const char* logname);
@@ -44,6 +45,7 @@ private:
         std::mutex mutex;
         std::condition_variable given;
         bool isGiven = false;  // guarded by mutex
+        status_t status = OK;  // what a wait for it returns; constant once it is shared
     };
 
     explicit Fence(std::shared_ptr<Signal> signal) : mSignal(std::move(signal)) {}

@@ -5,7 +5,6 @@
 #include <memory>
 
 #include <stdint.h>
-
 #include <ui/PixelFormat.h>
 #include <utils/Errors.h>
 #include <utils/RefBase.h>

@@ -1,0 +1,236 @@
+#include "day/Comparison.h"
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <set>
+#include <tuple>
+#include <utility>
+
+namespace day {
+
+namespace {
+
+using Side = std::vector<Profile>;
+
+constexpr std::array<Per, kPers> kAll = {Per::kHour, Per::kOffHour, Per::kBattery};
+constexpr double kSecondsPerHour = 3600;
+constexpr double kLeastDifference = 0.001;  // seconds per hour; less is rounding
+
+const ProfileRow& rowOf(const Profile& profile, const ProfileKey& key) {
+    static const ProfileRow kNone;
+    const auto found = profile.rows.find(key);
+    return found == profile.rows.end() ? kNone : found->second;
+}
+
+bool isCovered(const Profile& profile, Per per) {
+    return profile.coverage(per) >= kLeastCoverage;
+}
+
+bool isCovered(const Side& side, Per per) {
+    return std::any_of(side.begin(), side.end(),
+                       [per](const Profile& each) { return isCovered(each, per); });
+}
+
+/** By the inputs that cover enough; where none does, by all that cover anything. */
+Spread spreadOf(const Side& side, const ProfileKey& key, Per per) {
+    const bool wantsEnough = isCovered(side, per);
+    std::vector<double> values;
+    for (const Profile& profile : side) {
+        const int64_t coverage = profile.coverage(per);
+        if (coverage <= 0 || (wantsEnough && !isCovered(profile, per))) continue;
+        values.push_back(static_cast<double>(heldPer(rowOf(profile, key), per)) /
+                         static_cast<double>(coverage) * kSecondsPerHour);
+    }
+    if (values.empty()) return {};
+    std::sort(values.begin(), values.end());
+    const size_t half = values.size() / 2;
+    const double median =
+            values.size() % 2 == 1 ? values[half] : (values[half - 1] + values[half]) / 2;
+    return {median, values.front(), values.back()};
+}
+
+/** A key's uses in all inputs of a side. */
+struct SideSum {
+    ProfileRow row;
+    double covered = 0;  // ns
+};
+
+SideSum sumOf(const Side& side, const ProfileKey& key) {
+    SideSum sum;
+    for (const Profile& profile : side) {
+        sum.covered += static_cast<double>(profile.covered);
+        if (const auto found = profile.rows.find(key); found != profile.rows.end()) {
+            add(found->second, &sum.row);
+        }
+    }
+    return sum;
+}
+
+double ratio(double part, double whole) {
+    return whole > 0 ? part / whole : 0;
+}
+
+double ratio(int64_t part, int64_t whole) {
+    return ratio(static_cast<double>(part), static_cast<double>(whole));
+}
+
+/** The shortest period as a rate; without one 0. */
+double rateOf(const ProfileRow& row) {
+    if (!row.periodNs) return 0;
+    if (*row.periodNs <= 0) return std::numeric_limits<double>::infinity();
+    return 1 / static_cast<double>(*row.periodNs);
+}
+
+/** How little is batched: the larger, the more often the processor wakes. */
+double unbatchedness(const ProfileRow& row) {
+    if (!row.batchUs || *row.batchUs < 0) return 0;
+    return 1 / (1 + static_cast<double>(*row.batchUs));
+}
+
+std::vector<Change> changesOf(const SideSum& before, const SideSum& after, Per per, double size) {
+    std::vector<Change> changes;
+    const auto look = [&](Factor factor, double old, double now) {
+        const bool isMore = now > old;
+        const bool isLarge = std::max(old, now) >= kLeastFactor * std::min(old, now);
+        if (old == now || !isLarge || (size != 0 && isMore != (size > 0))) return;
+        changes.push_back({factor, isMore});
+    };
+    const ProfileRow& a = before.row;
+    const ProfileRow& b = after.row;
+    if (per == Per::kBattery) {
+        look(Factor::kBackground, ratio(a.background, a.heldOnBattery),
+             ratio(b.background, b.heldOnBattery));
+        return changes;
+    }
+    look(Factor::kUseLength, ratio(a.held, a.uses), ratio(b.held, b.uses));
+    look(Factor::kEnables, ratio(static_cast<double>(a.enables), before.covered),
+         ratio(static_cast<double>(b.enables), after.covered));
+    if (a.periodNs && b.periodNs) look(Factor::kRate, rateOf(a), rateOf(b));
+    if (a.batchUs && b.batchUs) look(Factor::kBatching, unbatchedness(a), unbatchedness(b));
+    if (a.displayKnown > 0 && b.displayKnown > 0) {
+        look(Factor::kDisplayOff, ratio(a.heldOff, a.displayKnown),
+             ratio(b.heldOff, b.displayKnown));
+    }
+    return changes;
+}
+
+bool isRateOrBatching(const Change& change) {
+    return change.factor == Factor::kRate || change.factor == Factor::kBatching;
+}
+
+/** What differs for a key, if anything does. */
+std::optional<Difference> differenceOf(const Side& before, const Side& after, const ProfileKey& key,
+                                       Per per) {
+    Difference result{key,
+                      {},
+                      per,
+                      ChangeState::kChanged,
+                      spreadOf(before, key, per),
+                      spreadOf(after, key, per),
+                      0,
+                      {}};
+    const SideSum sumBefore = sumOf(before, key);
+    const SideSum sumAfter = sumOf(after, key);
+    result.sensor = sumAfter.row.sensor.empty() ? sumBefore.row.sensor : sumAfter.row.sensor;
+    const double size = result.after.median - result.before.median;
+    const bool isSame = std::fabs(size) < kLeastDifference &&
+                        std::fabs(result.after.largest - result.before.largest) < kLeastDifference;
+    if (!isCovered(before, per) || !isCovered(after, per)) {
+        if (isSame) return std::nullopt;
+        result.state = ChangeState::kNotCovered;
+        return result;
+    }
+    if (!isSame) result.size = size;
+    if (result.before.largest == 0 && result.after.largest == 0) return std::nullopt;
+    if (result.before.largest == 0) {
+        result.state = ChangeState::kNew;
+    } else if (result.after.largest == 0) {
+        result.state = ChangeState::kGone;
+    } else {
+        result.changes = changesOf(sumBefore, sumAfter, per, result.size);
+        // An app that holds a sensor as long as before, but at another rate, has changed.
+        const bool costsOtherwise =
+                per == Per::kHour &&
+                std::any_of(result.changes.begin(), result.changes.end(), isRateOrBatching);
+        if (isSame && !costsOtherwise) return std::nullopt;
+    }
+    return result;
+}
+
+std::set<ProfileKey> keysOf(const Side& before, const Side& after) {
+    std::set<ProfileKey> keys;
+    for (const Side* side : {&before, &after}) {
+        for (const Profile& profile : *side) {
+            for (const auto& [key, row] : profile.rows) keys.insert(key);
+        }
+    }
+    return keys;
+}
+
+/** All that a person would call the same sensor has. */
+auto identityOf(const trace::Sensor& sensor) {
+    return std::tie(sensor.mode, sensor.wakeUp, sensor.minRate, sensor.maxRate);
+}
+
+std::vector<SensorDifference> compareSensors(const Profile& before, const Profile& after) {
+    using Key = std::pair<std::string, int32_t>;
+    std::map<Key, SensorDifference> sensors;
+    for (const trace::Sensor& sensor : before.sensors) {
+        auto& each = sensors[{sensor.name, sensor.type}];
+        if (!each.before) each.before = sensor;
+    }
+    for (const trace::Sensor& sensor : after.sensors) {
+        auto& each = sensors[{sensor.name, sensor.type}];
+        if (!each.after) each.after = sensor;
+    }
+    std::vector<SensorDifference> differences;
+    // Where one side has no list at all, nothing is known of its sensors.
+    if (before.sensors.empty() || after.sensors.empty()) return differences;
+    for (auto& [key, each] : sensors) {
+        const bool isSame =
+                each.before && each.after && identityOf(*each.before) == identityOf(*each.after);
+        if (!isSame) differences.push_back(std::move(each));
+    }
+    return differences;
+}
+
+std::vector<PropertyDifference> compareProperties(const Profile& before, const Profile& after) {
+    std::map<std::string, PropertyDifference> properties;
+    for (const auto& [name, value] : before.properties) properties[name].before = value;
+    for (const auto& [name, value] : after.properties) properties[name].after = value;
+    std::vector<PropertyDifference> differences;
+    for (auto& [name, each] : properties) {
+        if (each.before == each.after) continue;
+        each.name = name;
+        differences.push_back(std::move(each));
+    }
+    return differences;
+}
+
+}  // namespace
+
+Comparison compare(const Side& before, const Side& after) {
+    Comparison result;
+    for (const Per per : kAll) {
+        result.isCovered[static_cast<size_t>(per)] =
+                isCovered(before, per) && isCovered(after, per);
+    }
+    for (const ProfileKey& key : keysOf(before, after)) {
+        for (const Per per : kAll) {
+            if (auto difference = differenceOf(before, after, key, per)) {
+                result.differences.push_back(std::move(*difference));
+            }
+        }
+    }
+    // Stable: the same rows in the same order whichever side comes first.
+    std::stable_sort(result.differences.begin(), result.differences.end(),
+                     [](const Difference& a, const Difference& b) {
+                         return std::fabs(a.size) > std::fabs(b.size);
+                     });
+    result.sensors = compareSensors(before.back(), after.back());
+    result.properties = compareProperties(before.back(), after.back());
+    return result;
+}
+
+}  // namespace day

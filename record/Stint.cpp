@@ -1,0 +1,7 @@
+#include "record/Stint.h"
+
+namespace record {
+
+thread_local Stint* Stint::tCurrent = nullptr;
+
+}  // namespace record

@@ -1,0 +1,75 @@
+#include "report/ChargeText.h"
+
+#include <algorithm>
+#include <cmath>
+#include <vector>
+
+#include "base/Calendar.h"
+#include "day/Coverage.h"
+#include "report/AppNames.h"
+#include "report/SensorNames.h"
+
+namespace report {
+
+namespace {
+
+std::string formatPercent(std::optional<int64_t> part, std::optional<int64_t> whole) {
+    if (!part || !whole || *whole <= 0) return {};
+    const double percent = static_cast<double>(*part) * 100 / static_cast<double>(*whole);
+    return std::to_string(std::lround(percent)) + " %";
+}
+
+std::string nameSensorOf(const trace::ChargeRow& row, const day::Notes& notes) {
+    if (row.handle == trace::kGpsHandle) return "GPS";
+    const auto* sensor =
+            row.handle < 0 ? nullptr : notes.sensorOf(static_cast<uint32_t>(row.handle));
+    if (sensor != nullptr) return nameSensor(sensor->type, sensor->name);
+    return "handle " + std::to_string(row.handle);
+}
+
+std::string describeRow(const trace::ChargeRow& row) {
+    std::string before = row.count == 0 ? "on since before the last charge" : "";
+    if (!row.shared) return before;
+    return before.empty() ? "shared" : "shared, " + before;
+}
+
+std::string describeCoverage(const day::Journal& journal, size_t capture) {
+    const auto& charge = *journal.captures()[capture].taken()->sinceCharge;
+    const day::BatteryCoverage coverage = batteryCoverage(journal, capture);
+    std::string text = std::string("The registrations cover ") +
+                       (coverage.isUpperBound ? "at most " : "") +
+                       base::formatDuration(std::chrono::nanoseconds(coverage.seen));
+    if (!charge.onBatteryMs) return text + " of the time on battery.";
+    return text + " of the " +
+           base::formatDuration(std::chrono::milliseconds(*charge.onBatteryMs)) + " on battery.";
+}
+
+}  // namespace
+
+ChargeText describeSinceCharge(const day::Journal& journal, size_t capture, size_t limit) {
+    const auto& charge = *journal.captures()[capture].taken()->sinceCharge;
+    ChargeText text{describeCoverage(journal, capture),
+                    Table({{"App", Table::Column::kCut},
+                           {"Sensor", Table::Column::kCut},
+                           {"Time", Table::Column::kRight},
+                           {"Of battery time", Table::Column::kRight},
+                           {"In background", Table::Column::kRight},
+                           {"Count", Table::Column::kRight},
+                           {""}},
+                          limit)};
+    std::vector<const trace::ChargeRow*> rows;
+    for (const trace::ChargeRow& row : charge.rows) rows.push_back(&row);
+    std::stable_sort(rows.begin(), rows.end(),
+                     [](const auto* a, const auto* b) { return a->ms > b->ms; });
+    for (const trace::ChargeRow* row : rows) {
+        text.rows.add({nameUid(row->uid, journal.captures()[capture].packagesOf(row->uid)),
+                       nameSensorOf(*row, journal.captures()[capture]),
+                       base::formatDuration(std::chrono::milliseconds(row->ms)),
+                       formatPercent(row->ms, charge.onBatteryMs),
+                       formatPercent(row->background, row->ms), std::to_string(row->count),
+                       describeRow(*row)});
+    }
+    return text;
+}
+
+}  // namespace report

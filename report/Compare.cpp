@@ -1,0 +1,259 @@
+#include "report/Compare.h"
+
+#include <chrono>
+#include <cmath>
+#include <utility>
+
+#include "base/Calendar.h"
+#include "base/Json.h"
+#include "report/SensorNames.h"
+#include "report/Text.h"
+
+namespace report {
+
+namespace {
+
+using day::ChangeState;
+using day::Difference;
+using day::Factor;
+using day::Per;
+using day::Profile;
+using day::Spread;
+
+/** By Per: in JSON, in a table's row, and what it takes to compare it. */
+constexpr struct {
+    std::string_view key;
+    std::string_view title;
+    std::string_view missing;
+} kPers[day::kPers] = {
+        {"hour", "hour", "the whole time: less than 10 minutes are seen on one side"},
+        {"displayOff", "hour, display off",
+         "the time with the display off: less than 10 minutes of it are known on one side"},
+        {"battery", "hour on battery",
+         "the battery statistics: one side has none, or less than 10 minutes on battery"},
+};
+
+/** By Factor: in JSON and in words, for more and for less of it. */
+constexpr struct {
+    std::string_view moreKey;
+    std::string_view lessKey;
+    std::string_view more;
+    std::string_view less;
+} kFactors[] = {
+        {"longerUses", "shorterUses", "longer uses", "shorter uses"},
+        {"moreEnables", "fewerEnables", "more enables", "fewer enables"},
+        {"fasterRate", "slowerRate", "faster rate", "slower rate"},
+        {"lessBatching", "moreBatching", "less batching", "more batching"},
+        {"moreDisplayOff", "lessDisplayOff", "more with the display off",
+         "less with the display off"},
+        {"moreBackground", "lessBackground", "more in the background", "less in the background"},
+};
+
+constexpr std::string_view kStates[] = {"changed", "new", "gone", "notCovered"};  // by ChangeState
+
+const auto& wordsOf(Per per) {
+    return kPers[static_cast<size_t>(per)];
+}
+
+std::string_view keyOf(const day::Change& change) {
+    const auto& words = kFactors[static_cast<size_t>(change.factor)];
+    return change.isMore ? words.moreKey : words.lessKey;
+}
+
+std::string_view textOf(const day::Change& change) {
+    const auto& words = kFactors[static_cast<size_t>(change.factor)];
+    return change.isMore ? words.more : words.less;
+}
+
+std::string formatSeconds(double seconds) {
+    return base::formatDuration(std::chrono::seconds(std::llround(seconds)));
+}
+
+std::string formatSpread(const Spread& spread) {
+    std::string text = formatSeconds(spread.median);
+    if (spread.smallest != spread.largest) {
+        text += " (" + formatSeconds(spread.smallest) + " to " + formatSeconds(spread.largest) +
+                ')';
+    }
+    return text;
+}
+
+std::string formatSize(const Difference& difference) {
+    if (difference.state == ChangeState::kNotCovered) return "?";
+    return (difference.size < 0 ? "-" : "+") + formatSeconds(std::fabs(difference.size));
+}
+
+std::string nameOf(const Difference& difference) {
+    if (!difference.key.second) return "GPS";
+    return nameSensor(*difference.key.second, difference.sensor);
+}
+
+std::string describeSide(const char* what, const std::vector<Profile>& side) {
+    std::string text = std::string(what) + ": " + side.front().name;
+    if (side.size() > 1) text += " and " + std::to_string(side.size() - 1) + " more";
+    int64_t covered = 0;
+    int64_t known = 0;
+    int64_t onBattery = 0;
+    for (const Profile& profile : side) {
+        covered += profile.covered;
+        known += profile.displayKnown;
+        onBattery += profile.onBattery;
+    }
+    const auto format = [](int64_t ns) {
+        return base::formatDuration(std::chrono::nanoseconds(ns));
+    };
+    return text + ": " + format(covered) + " seen, display known for " + format(known) +
+           ", battery statistics of " + format(onBattery);
+}
+
+Table differenceTable(size_t limit) {
+    return Table({{"Difference", Table::Column::kRight},
+                  {"Old", Table::Column::kRight},
+                  {"New", Table::Column::kRight},
+                  {"per"},
+                  {"App", Table::Column::kCut},
+                  {"Sensor", Table::Column::kCut},
+                  {"Why", Table::Column::kCut}},
+                 limit);
+}
+
+void addRow(const Difference& difference, Table* table) {
+    std::string why;
+    for (const day::Change& change : difference.changes) {
+        why.append(why.empty() ? "" : ", ").append(textOf(change));
+    }
+    table->add({formatSize(difference), formatSpread(difference.before),
+                formatSpread(difference.after), std::string(wordsOf(difference.per).title),
+                difference.key.first, nameOf(difference), why});
+}
+
+ComparedPart partOf(const day::Comparison& comparison, ChangeState state,
+                    const std::string& heading, size_t limit) {
+    ComparedPart part{heading, differenceTable(limit), {}};
+    for (const Difference& each : comparison.differences) {
+        if (each.state == state) addRow(each, &part.table);
+    }
+    return part;
+}
+
+std::string describe(const std::optional<trace::Sensor>& sensor) {
+    if (!sensor) return "not there";
+    std::string text(trace::nameOf(sensor->mode));
+    if (text.empty()) text = "there";
+    if (sensor->wakeUp && *sensor->wakeUp) text += ", wake-up";
+    if (sensor->maxRate) {
+        text += ", up to ";
+        base::appendFloat(&text, *sensor->maxRate);
+        text += " Hz";
+    }
+    return text;
+}
+
+ComparedPart sensorsPart(const day::Comparison& comparison, size_t limit) {
+    ComparedPart part{"Sensors that differ",
+                      Table({{"Sensor", Table::Column::kCut}, {"Old"}, {"New"}}, limit),
+                      {}};
+    for (const auto& [before, after] : comparison.sensors) {
+        const trace::Sensor& sensor = before ? *before : *after;
+        part.table.add({nameSensor(sensor.type, sensor.name), describe(before), describe(after)});
+    }
+    return part;
+}
+
+ComparedPart propertiesPart(const day::Comparison& comparison, size_t limit) {
+    ComparedPart part{"Stored values that differ",
+                      Table({{"Property", Table::Column::kCut}, {"Old"}, {"New"}}, limit),
+                      {}};
+    for (const auto& [name, before, after] : comparison.properties) {
+        part.table.add({name, before.value_or("not set"), after.value_or("not set")});
+    }
+    return part;
+}
+
+}  // namespace
+
+void Compare::end(bool) {
+    mJournal.end();
+    mSides.add(mJournal);
+}
+
+void ComparedSides::add(const day::Journal& journal) {
+    if (mBaselines == 0) return;
+    (mBefore.size() < mBaselines ? mBefore : mAfter).push_back(day::profileOf(journal));
+}
+
+std::optional<day::Comparison> ComparedSides::compare() const {
+    if (mBefore.empty() || mAfter.empty()) return std::nullopt;
+    return day::compare(mBefore, mAfter);
+}
+
+std::optional<ComparisonText> ComparedSides::layOut(size_t limit) const {
+    const auto compared = compare();
+    if (!compared) return std::nullopt;
+    const day::Comparison& comparison = *compared;
+    ComparisonText text;
+    text.coverage = {describeSide("old", mBefore), describeSide("new", mAfter)};
+    for (size_t per = 0; per < day::kPers; ++per) {
+        if (comparison.isCovered[per]) continue;
+        text.coverage.push_back("not compared: " + std::string(kPers[per].missing));
+    }
+    const std::pair<ChangeState, const char*> kGroups[] = {
+            {ChangeState::kChanged, "Changed: time held in an hour"},
+            {ChangeState::kNew, "New: not held before"},
+            {ChangeState::kGone, "Gone: held before only"},
+            {ChangeState::kNotCovered, "Too little is seen to tell"},
+    };
+    for (const auto& [state, heading] : kGroups) {
+        text.parts.push_back(partOf(comparison, state, heading, limit));
+    }
+    text.parts.push_back(sensorsPart(comparison, limit));
+    text.parts.push_back(propertiesPart(comparison, limit));
+    if (comparison.isEmpty()) text.parts.front().sentence = "Nothing differs.";
+    return text;
+}
+
+void CompareSummary::finish() {
+    const auto text = sides().layOut(mLimit);
+    if (!text) return;
+    for (const std::string& line : text->coverage) mOut->write(safe(line) + '\n');
+    for (const ComparedPart& part : text->parts) {
+        if (part.table.isEmpty() && part.sentence.empty()) continue;
+        mOut->write('\n' + (part.sentence.empty() ? part.heading : part.sentence) + '\n');
+        if (!part.table.isEmpty()) mOut->write(part.table.text(2));
+    }
+    mOut->flush();
+}
+
+void CompareLines::finish() {
+    const auto comparison = sides().compare();
+    if (!comparison) return;
+    const auto rounded = [](double value) {
+        return base::Ms{std::llround(value * 1000) * (base::kNsPerMs / 1000)};
+    };
+    for (const Difference& each : comparison->differences) {
+        std::string line;
+        base::JsonWriter json(&line);
+        json.beginObject().key("compare").beginObject();
+        json.member("app", each.key.first);
+        if (each.key.second) json.member("type", *each.key.second);
+        json.member("sensor", each.key.second ? each.sensor : "GPS");
+        json.member("per", wordsOf(each.per).key);
+        const auto spread = [&](const char* key, const char* range, const Spread& values) {
+            json.member(key, rounded(values.median));
+            if (values.smallest == values.largest) return;
+            json.key(range).beginArray();
+            json.value(rounded(values.smallest)).value(rounded(values.largest)).endArray();
+        };
+        spread("old", "oldRange", each.before);
+        spread("new", "newRange", each.after);
+        if (each.state != ChangeState::kNotCovered) json.member("difference", rounded(each.size));
+        json.key("causes").beginArray();
+        for (const day::Change& change : each.changes) json.value(keyOf(change));
+        json.endArray().member("state", kStates[static_cast<size_t>(each.state)]);
+        json.endObject().endObject();
+        mOut->write(line + '\n');
+    }
+    mOut->flush();
+}
+
+}  // namespace report

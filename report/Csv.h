@@ -1,0 +1,81 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "base/OutputFile.h"
+#include "day/UseTracker.h"
+#include "report/Report.h"
+
+namespace report {
+
+/**
+ * A table of all inputs in a file, as comma-separated values with a header: docs/output.md lists
+ * the columns. What has been gathered of an input is in the file when the input ends, also where
+ * processes share the work.
+ */
+class Csv : public Report {
+public:
+    trace::WantedRecords wanted() const override { return {true, false}; }
+    void begin(const std::string& name) override;
+    void end(bool isWhole) override;
+    const std::optional<base::Failure>& failure() const override { return mFailure; }
+
+protected:
+    /** `file` must outlive this and be new; the header is written to it at once. */
+    Csv(base::OutputFile* file, std::string_view header);
+
+    const std::string& name() const { return mName; }
+
+    /** Rows that are not written yet. */
+    std::string* rows() { return &mRows; }
+    void flushIfLarge();
+
+    virtual void endInput() = 0;
+
+private:
+    void flush();
+
+    base::OutputFile* const mFile;
+    std::string mName;
+    std::string mRows;
+    std::optional<base::Failure> mFailure;
+};
+
+/** A row for each use of a sensor. */
+class UsesCsv : public Csv {
+public:
+    explicit UsesCsv(base::OutputFile* file);
+
+    void begin(const std::string& name) override;
+    void take(const trace::Record& record) override;
+
+private:
+    void endInput() override;
+    void addEnded();
+    void add(const day::Use& use);
+
+    day::UseTracker mTracker;
+    std::vector<day::Use> mEnded;  // at one moment
+    int64_t mAt = 0;
+};
+
+/** A row for each row of the battery statistics since the last charge. */
+class SinceChargeCsv : public Csv {
+public:
+    explicit SinceChargeCsv(base::OutputFile* file);
+
+    void begin(const std::string& name) override;
+    void take(const trace::Record& record) override;
+
+private:
+    void endInput() override {}
+    void add(const day::Notes& notes);
+
+    day::UseTracker mTracker;
+    bool mIsAdded = false;  // the statistics of this capture
+};
+
+}  // namespace report

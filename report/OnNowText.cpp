@@ -1,0 +1,95 @@
+#include "report/OnNowText.h"
+
+#include <optional>
+
+#include "base/Calendar.h"
+#include "report/AppNames.h"
+#include "report/CaptureFacts.h"
+#include "report/DayRows.h"
+#include "report/Text.h"
+
+namespace report {
+
+namespace {
+
+/** Since when a sensor is on: "14:51:32", with the day if that is not the capture's. */
+std::string formatSince(const day::Use& use, const day::Notes& notes) {
+    const int64_t takenDay = *notes.knownTo() / base::kNsPerDay;
+    const int64_t day = use.from / base::kNsPerDay;
+    const std::string time = base::formatTimeOfDay(std::chrono::nanoseconds(use.from));
+    return (use.before ? "before " : "") + (day == takenDay ? time : formatMoment(use.from, notes));
+}
+
+std::string describeRow(const day::OnRow& row) {
+    std::string text;
+    const auto add = [&text](const std::string& more) {
+        text += (text.empty() ? "" : ", ") + more;
+    };
+    if (!row.hasAccess) add("no data access");
+    if (row.wakeLocks > 0) add(count(static_cast<size_t>(row.wakeLocks), "wake lock"));
+    if (row.connections > 1) add(std::to_string(row.connections) + " connections");
+    if (row.use != nullptr && !row.use->periodNs) add("rate unknown");
+    if (row.use == nullptr) add("no line tells of it");
+    return text;
+}
+
+std::string nameRate(int64_t level) {
+    constexpr const char* kNames[] = {"stopped", "normal", "fast", "very fast"};
+    const bool isKnown = level >= 0 && level <= 3;
+    return std::to_string(level) + (isKnown ? std::string(" (") + kNames[level] + ")" : "");
+}
+
+std::string describeChannel(const trace::DirectChannel& channel, const day::Notes& notes) {
+    const auto* packages = channel.uid ? notes.packagesOf(*channel.uid) : nullptr;
+    const bool isNamed = channel.package.empty() && packages != nullptr;
+    std::string text = "Direct channel of " +
+                       (isNamed ? nameUid(*channel.uid, packages) : channel.package) + ": " +
+                       count(static_cast<size_t>(channel.sensors), "sensor");
+    const char* gap = channel.rates.size() == 1 ? ", rate level " : ", rate levels ";
+    for (const int64_t rate : channel.rates) {
+        text += gap + nameRate(rate);
+        gap = ", ";
+    }
+    return safe(text);
+}
+
+}  // namespace
+
+OnNowText describeOnNow(const day::Journal& journal, size_t capture, size_t limit) {
+    const day::Notes& notes = journal.captures()[capture];
+    const day::OnNow on = whatIsOn(journal, capture);
+    OnNowText text{{},
+                   Table({{"App", Table::Column::kCut},
+                          {"Sensor", Table::Column::kCut},
+                          {"Since"},
+                          {"Hz", Table::Column::kRight},
+                          {"Batch", Table::Column::kRight},
+                          {"Wake"},
+                          {""}},
+                         limit),
+                   {}};
+    for (const day::OnRow& row : on.rows) {
+        const day::Use* const use = row.use;
+        text.rows.add({nameApp(row.holder), nameSensor(row.holder),
+                       use != nullptr ? formatSince(*use, notes) : "",
+                       use != nullptr ? formatHz(row.holder, use->periodNs) : "",
+                       use != nullptr ? formatBatch(use->batchUs) : "", formatWake(row.holder),
+                       describeRow(row)});
+    }
+    if (on.rows.empty()) text.before.emplace_back("Nothing is on.");
+    if (!on.isFromConnections) {
+        text.before.emplace_back(
+                "The capture has no table of connections: the registrations tell it.");
+    }
+    if (const auto& taken = notes.taken()) {
+        if (taken->operatingMode) {
+            text.after.push_back("Operating mode: " + safe(*taken->operatingMode));
+        }
+        for (const trace::DirectChannel& each : taken->direct) {
+            text.after.push_back(describeChannel(each, notes));
+        }
+    }
+    return text;
+}
+
+}  // namespace report

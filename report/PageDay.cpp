@@ -1,0 +1,224 @@
+#include "report/PageDay.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <map>
+#include <utility>
+#include <vector>
+
+#include "base/Calendar.h"
+#include "base/Json.h"
+#include "day/Samples.h"
+#include "report/CaptureFacts.h"
+#include "report/DayRows.h"
+#include "report/EventText.h"
+#include "report/Text.h"
+#include "report/page/TableOf.h"
+#include "trace/TraceTime.h"
+
+namespace report {
+
+namespace {
+
+using day::Span;
+using day::Use;
+
+std::string timeOfDay(int64_t at) {
+    return base::formatTimeOfDay(std::chrono::nanoseconds(at));
+}
+
+std::string durationOf(int64_t ns) {
+    return base::formatDuration(std::chrono::nanoseconds(ns));
+}
+
+std::string rateText(const Use& use) {
+    if (use.mode == trace::SensorMode::kOneShot) return "one-shot";
+    if (!use.periodNs) return "rate not known";
+    return *use.periodNs > 0 ? formatRate(*use.periodNs) + " Hz" : "fastest";
+}
+
+std::string batchOf(int64_t us) {
+    if (us < 0) return ", batched as long as possible";
+    return us == 0 ? std::string() : ", batched " + base::formatMs(us * 1000) + " ms";
+}
+
+/** All of a use, in words, but the app and the sensor. */
+std::string factsOf(const Use& use) {
+    std::string text =
+            (use.before ? "before " : "") + timeOfDay(use.from) + " to " + timeOfDay(use.to);
+    const int64_t days = use.to / base::kNsPerDay - use.from / base::kNsPerDay;
+    if (days == 1) text += " of the next day";
+    if (days > 1) text += ", " + count(static_cast<size_t>(days), "day") + " later";
+    text += ", " + durationOf(use.to - use.from) + ", " + rateText(use);
+    if (use.batchUs) text += batchOf(*use.batchUs);
+    if (use.wakeUp.value_or(false)) text += ", wake-up";
+    if (use.enables.size() > 1) text += ", " + count(use.enables.size(), "enable");
+    switch (use.end) {
+        case day::End::kOff:
+            return text;
+        case day::End::kFired:
+            return text + ", fired";
+        case day::End::kUnseen:
+            return text + ", its end was not seen";
+        case day::End::kOn:
+            return text + ", still on";
+    }
+    return text;
+}
+
+/** A day while it is made. */
+class DayMaker {
+public:
+    DayMaker(const day::Journal& journal, const day::Day& day)
+          : mJournal(journal),
+            mDay(day),
+            mBoot(journal.boots()[static_cast<size_t>(day.boot)]),
+            mNotes(mBoot.capture ? &journal.captures()[*mBoot.capture] : nullptr),
+            mMidnight(day.number * base::kNsPerDay) {}
+
+    page::Day make() {
+        mResult.name = nameDay(mJournal, mDay);
+        const auto known = mNotes != nullptr ? mNotes->known() : std::nullopt;
+        mResult.display = bandOf(mJournal.display(), known ? &known->display : nullptr, 1, 1);
+        mResult.charge = bandOf(mJournal.charge(), known ? &known->charge : nullptr, 1, 3);
+        addUnseen();
+        addMarks();
+        addUses();
+        return std::move(mResult);
+    }
+
+private:
+    static constexpr Span kDay{0, base::kNsPerDay};
+
+    static bool isEmpty(Span span) { return span.from >= span.to; }
+    static Span cut(Span span, Span to) {
+        return {std::max(span.from, to.from), std::min(span.to, to.to)};
+    }
+
+    /** What of a span of the clock lies in the day, counted from its midnight. */
+    Span inDay(Span span) const { return cut({span.from - mMidnight, span.to - mMidnight}, kDay); }
+
+    /** Of a note, which may hold any number. */
+    static int64_t toNs(int64_t ms) {
+        return std::clamp<int64_t>(ms, 0, trace::kMaxTimeMs) * base::kNsPerMs;
+    }
+
+    Span inDay(const trace::Interval& each) const {
+        return inDay(Span{toNs(each.from), toNs(each.to)});
+    }
+
+    /** A state that is on from `first` to `last`. `known` bounds what is known; null: nothing does.
+     */
+    page::Band bandOf(const std::vector<day::StateSpan>& states,
+                      const std::vector<trace::Interval>* known, int64_t first,
+                      int64_t last) const {
+        std::vector<Span> bounds{kDay};
+        if (known != nullptr) {
+            bounds.clear();
+            for (const trace::Interval& each : *known) bounds.push_back(inDay(each));
+        }
+        page::Band band;
+        int64_t end = 0;  // of what is made
+        for (const Span& bound : bounds) {
+            for (const day::StateSpan& state : states) {
+                if (state.boot != mDay.boot) continue;
+                const Span span = cut(inDay(state.span), bound);
+                if (isEmpty(span)) continue;
+                if (span.from > end) band.unknown.push_back({end, span.from});
+                if (state.value >= first && state.value <= last) {
+                    band.on.push_back({span.from, span.to});
+                }
+                end = span.to;
+            }
+        }
+        if (end < kDay.to) band.unknown.push_back({end, kDay.to});
+        return band;
+    }
+
+    void addUnseen(Span span) {
+        if (!isEmpty(span)) mResult.unseen.push_back({span.from, span.to});
+    }
+
+    void addUnseen() {
+        int64_t from = mBoot.span.from;
+        int64_t to = mBoot.span.to;
+        if (mNotes != nullptr) {
+            from = toNs(mNotes->capture()->from);
+            to = std::min(to, mNotes->knownTo().value_or(to));
+        }
+        addUnseen(cut({0, from - mMidnight}, kDay));
+        if (mNotes != nullptr) {
+            for (const trace::Interval& gap : mNotes->gaps()) addUnseen(inDay(gap));
+        }
+        addUnseen(cut({to - mMidnight, base::kNsPerDay}, kDay));
+    }
+
+    void addMarks() {
+        for (const day::Event* event : mJournal.eventsOf(mDay)) {
+            auto& marks = event->isAhead ? mResult.ahead : mResult.reports;
+            const char* const lead = event->isAhead ? "if nothing changed: " : "";
+            marks.push_back({event->at - mMidnight, lead + layOutEvent(*event, 0).title});
+        }
+        const auto end = mNotes != nullptr ? mNotes->knownTo() : std::nullopt;
+        if (!end || *end / base::kNsPerDay != mDay.number) return;
+        mResult.taken = page::Mark{*end - mMidnight, "known up to " + timeOfDay(*end)};
+    }
+
+    void addUses() {
+        const auto rows = mJournal.table().rowsOf(mDay);
+        if (rows.empty()) return;
+        mResult.uses =
+                page::tableOf(dayTable(rows, Table::kAllRows), "uses", "Who held which sensor");
+        std::map<day::HolderKey, std::vector<const Use*>> byRow;
+        for (const Use& use : mJournal.uses()) {
+            if (use.boot != mDay.boot || use.from >= mMidnight + base::kNsPerDay) continue;
+            if (use.to < mMidnight) continue;
+            byRow[keyOf(use)].push_back(&use);
+        }
+        for (size_t i = 0; i < rows.size(); ++i) {
+            const auto& cells = mResult.uses->rows[i];
+            page::Lane lane{cells[0].text, cells[1].text, {}};
+            for (const Use* use : byRow[keyOf(rows[i].holder)]) {
+                if (const auto part = partOf(*use)) lane.uses.push_back(*part);
+            }
+            std::stable_sort(lane.uses.begin(), lane.uses.end(), [](const auto& a, const auto& b) {
+                return a.span.from < b.span.from;
+            });
+            mResult.lanes.push_back(std::move(lane));
+        }
+    }
+
+    /** What of a use lies in the day, if anything. */
+    std::optional<page::Use> partOf(const Use& use) const {
+        const Span span = inDay(Span{use.from, use.to});
+        if (span.from > span.to || (isEmpty(span) && use.from != use.to)) return {};
+        page::Use part;
+        part.span = {span.from, span.to};
+        part.isBefore = use.before && use.from >= mMidnight;
+        const bool isEnd = use.to <= mMidnight + base::kNsPerDay;
+        if (isEnd && use.end == day::End::kUnseen) part.end = page::Use::End::kUnseen;
+        if (isEnd && use.end == day::End::kOn) part.end = page::Use::End::kOn;
+        if (isContinuous(use)) part.rate = day::rateOf(use);
+        for (const day::Enable& enable : use.enables) {
+            if (enable.at / base::kNsPerDay != mDay.number) continue;
+            part.enables.push_back(enable.at - mMidnight);
+        }
+        part.facts = factsOf(use);
+        return part;
+    }
+
+    const day::Journal& mJournal;
+    const day::Day mDay;
+    const day::Boot& mBoot;
+    const day::Notes* const mNotes;  // of the capture, if there is one
+    const int64_t mMidnight;
+    page::Day mResult;
+};
+
+}  // namespace
+
+page::Day pageDay(const day::Journal& journal, const day::Day& day) {
+    return DayMaker(journal, day).make();
+}
+
+}  // namespace report

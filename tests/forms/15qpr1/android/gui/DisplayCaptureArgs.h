@@ -1,0 +1,9 @@
+#pragma once
+
+#include "tests/forms/Requests.h"
+
+namespace android::gui {
+
+using DisplayCaptureArgs = form::PLATFORM_FORM::DisplayCaptureArgs;
+
+}  // namespace android::gui

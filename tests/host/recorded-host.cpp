@@ -1,0 +1,281 @@
+/**
+ * Hosts that go wrong in one way each, as the first argument says, with the recorder in front of
+ * the library. RecordedHostTest runs them and reads what they have left. Each prints what it has
+ * seen.
+ */
+
+#include <cerrno>
+#include <condition_variable>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <functional>
+#include <map>
+#include <mutex>
+#include <string>
+#include <thread>
+
+#include <android/log.h>
+#include <cutils/properties.h>
+#include <fcntl.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <time.h>
+#include <unistd.h>
+
+#include "core/SDCImpl.h"
+#include "exception/FlowingDataException.h"
+#include "platform/Telemetry.h"
+#include "rgb/RgbShotManager.h"
+
+namespace {
+
+using namespace android;
+
+/** What telemetry does, on the thread that sends. */
+std::function<void(const std::string& id)> gTelemetry = [](const std::string&) {};
+
+/** Sends the event N273|10004 on this thread. */
+void report() {
+    FlowingDataException::getInstance()->setSensorException(1, 3);
+}
+
+void enable(bool on, int type, const std::string& pkg, const std::string& opPkg) {
+    SDCImpl::getInstance()->enableSuccess(on, type, pkg, opPkg, 20000);
+}
+
+int64_t realMs() {
+    timespec now{};
+    clock_gettime(CLOCK_MONOTONIC_RAW, &now);
+    return int64_t{now.tv_sec} * 1000 + now.tv_nsec / 1'000'000;
+}
+
+void passMs(int64_t ms) {
+    for (const int64_t end = realMs() + ms; realMs() < end;) usleep(1000);
+}
+
+std::string recordPath() {
+    return std::string(std::getenv("SENSOR_PRIV_RECORD")) + "/sensor-priv.jsonl";
+}
+
+off_t recordSize() {
+    struct stat status {};
+    return stat(recordPath().c_str(), &status) == 0 ? status.st_size : -1;
+}
+
+/** Runs `meanwhile` while a call hangs in telemetry. */
+void hangWhile(const std::function<void()>& meanwhile) {
+    std::mutex mutex;
+    std::condition_variable changed;
+    bool hangs = false;
+    bool isOver = false;
+    gTelemetry = [&](const std::string&) {
+        std::unique_lock lock(mutex);
+        if (std::exchange(hangs, true)) return;
+        changed.notify_all();
+        changed.wait(lock, [&] { return isOver; });
+    };
+    std::thread caller(report);
+    {
+        std::unique_lock lock(mutex);
+        changed.wait(lock, [&] { return hangs; });
+    }
+    meanwhile();
+    {
+        const std::lock_guard lock(mutex);
+        isOver = true;
+    }
+    changed.notify_all();
+    caller.join();
+}
+
+void hang() {
+    hangWhile([] {
+        passMs(20);
+        const auto begin = RgbShotManager::getInstance()->getCurrentMs();
+        passMs(300);
+        const auto seen = RgbShotManager::getInstance()->getCurrentMs() - begin;
+        std::printf("the clock goes: %s\n", seen >= 295 && seen < 500 ? "yes" : "no");
+    });
+}
+
+/** More than is held back meanwhile. */
+void hangLong() {
+    hangWhile([] {
+        for (int i = 0; i < 4000; ++i) report();
+        std::printf("written meanwhile: %s\n", recordSize() > 200'000 ? "yes" : "no");
+    });
+}
+
+/** The file may not grow for the time of one call. */
+void full() {
+    report();
+    rlimit limit{};
+    getrlimit(RLIMIT_FSIZE, &limit);
+    const rlim_t usual = std::exchange(limit.rlim_cur, static_cast<rlim_t>(recordSize()) + 1100);
+    setrlimit(RLIMIT_FSIZE, &limit);
+    report();
+    limit.rlim_cur = usual;
+    setrlimit(RLIMIT_FSIZE, &limit);
+    report();
+}
+
+/** The file may not grow any more. */
+void fullToTheEnd() {
+    report();
+    rlimit limit{};
+    getrlimit(RLIMIT_FSIZE, &limit);
+    limit.rlim_cur = static_cast<rlim_t>(recordSize()) + 1100;
+    setrlimit(RLIMIT_FSIZE, &limit);
+    for (int i = 0; i < 9; ++i) report();
+}
+
+void removed() {
+    report();
+    unlink(recordPath().c_str());
+    report();
+}
+
+/** The host closes what it does not know, and opens something else. */
+void closesAll() {
+    report();
+    for (int fd = 3; fd < 64; ++fd) close(fd);
+    const int own = open("own", O_RDWR | O_CREAT | O_APPEND, 0600);
+    report();
+    struct stat status {};
+    fstat(own, &status);
+    std::printf("own file: %d bytes\n", static_cast<int>(status.st_size));
+}
+
+void forks() {
+    report();
+    const pid_t child = fork();
+    if (child == 0) {
+        report();
+        report();
+        _exit(0);
+    }
+    waitpid(child, nullptr, 0);
+    report();
+}
+
+/** While other threads call and send, too. */
+void forksInTelemetry() {
+    std::atomic<bool> isOver{false};
+    std::atomic<int> children{0};
+    std::thread others[2];
+    for (std::thread& other : others) {
+        other = std::thread([&] {
+            while (!isOver) enable(true, 4, "com.example.a", "com.example.b");
+        });
+    }
+    bool isChild = false;
+    gTelemetry = [&](const std::string&) {
+        const pid_t child = fork();
+        isChild = child == 0;
+        if (isChild) alarm(20);
+        int status = 1;
+        if (!isChild && waitpid(child, &status, 0) == child && status == 0) ++children;
+    };
+    for (int i = 0; i < 20; ++i) {
+        report();
+        if (isChild) _exit(0);
+    }
+    isOver = true;
+    for (std::thread& other : others) other.join();
+    std::printf("children: %d\n", children.load());
+}
+
+void callsFromLog() {
+    static thread_local bool tIsLogging = false;
+    __android_log_set_logger([](const __android_logger_data*, const char*) {
+        if (std::exchange(tIsLogging, true)) return;
+        RgbShotManager::getInstance()->skipLux();
+        tIsLogging = false;
+    });
+    report();
+    RgbShotManager::getInstance()->isTestMode();
+    __android_log_set_logger([](const __android_logger_data*, const char*) {});
+}
+
+void callsFromTelemetry() {
+    gTelemetry = [](const std::string&) {
+        property_set("persist.zuno.rgb.shot.count", "77");
+        RgbShotManager::getInstance()->onTouchChange();
+    };
+    report();
+}
+
+/** Names that are hard to replace, in a list that is reported. */
+void names() {
+    const std::string odd[] = {"1",
+                               "a/b",
+                               "quote\"back\\slash",
+                               "\xC3\xA4\xE2\x82\xAC\xF0\x9F\x98\x80",
+                               "tab\tline\n",
+                               "secret-bad\xFF\xC3",
+                               std::string("secret-nul\0secret-end", 21),
+                               "&time:2&pkg:secret"};
+    for (const std::string& name : odd) {
+        for (const std::string& opPkg : {name, std::string("com.example")}) {
+            enable(true, 3, name, opPkg);
+            enable(false, 3, name, opPkg);
+        }
+    }
+    std::mutex mutex;
+    std::condition_variable changed;
+    bool isSent = false;
+    gTelemetry = [&](const std::string& id) {
+        const std::lock_guard lock(mutex);
+        isSent |= id == "N273|10012";
+        changed.notify_all();
+    };
+    SDCImpl::getInstance()->notifySdcClock(23);
+    std::unique_lock lock(mutex);
+    changed.wait(lock, [&] { return isSent; });
+    lock.unlock();
+    SDCImpl::getInstance()->notifySdcClock(1);
+    passMs(50);  // the worker ends its message
+}
+
+void leavesItsFolder() {
+    if (chdir("/") != 0) std::perror("/");
+    report();
+}
+
+/** Until it is killed. */
+void calls() {
+    for (int i = 0;; ++i) {
+        enable(i % 2 == 0, 1, "com.example.application.with.a.name" + std::to_string(i % 9),
+               "com.example");
+        if (i % 5 == 0) report();
+    }
+}
+
+const std::map<std::string, void (*)()> kHosts{
+        {"hang", hang},
+        {"hang-long", hangLong},
+        {"full", full},
+        {"full-to-the-end", fullToTheEnd},
+        {"removed", removed},
+        {"closes-all", closesAll},
+        {"forks", forks},
+        {"forks-in-telemetry", forksInTelemetry},
+        {"calls-from-log", callsFromLog},
+        {"calls-from-telemetry", callsFromTelemetry},
+        {"names", names},
+        {"leaves-its-folder", leavesItsFolder},
+        {"calls", calls},
+};
+
+}  // namespace
+
+int main(int count, char** values) {
+    const auto host = kHosts.find(count > 1 ? values[1] : "");
+    if (host == kHosts.end()) return 2;
+    platform::observeEvents([](const char*, const char* id, const char*) { gTelemetry(id); });
+    host->second();
+    std::fflush(nullptr);
+    _exit(0);  // the library's worker lives as long as the process
+}
