@@ -1,6 +1,7 @@
 #include "trace/JsonReader.h"
 
 #include <algorithm>
+#include <array>
 #include <charconv>
 #include <unordered_set>
 
@@ -15,6 +16,7 @@ using simdjson::dom::object;
 namespace {
 
 constexpr std::string_view kDigits = "0123456789";
+constexpr size_t kFewKeys = 8;  // are compared with each other faster than they are hashed
 
 /** Takes the characters of `set` off the front of `text`; whether there were any. */
 bool take(std::string_view* text, std::string_view set) {
@@ -117,10 +119,21 @@ Error read(element json, std::vector<int32_t>* value) {
 }
 
 Error checkKeys(object json) {
-    if (json.size() < 2) return {};
-    std::unordered_set<std::string_view> keys;
+    const auto twice = [](std::string_view key) {
+        return "the key " + base::toJson(key) + " twice";
+    };
+    if (json.size() > kFewKeys) {
+        std::unordered_set<std::string_view> keys;
+        for (const auto field : json) {
+            if (!keys.insert(field.key).second) return twice(field.key);
+        }
+        return {};
+    }
+    std::array<std::string_view, kFewKeys> keys;
+    auto end = keys.begin();
     for (const auto field : json) {
-        if (!keys.insert(field.key).second) return "the key " + base::toJson(field.key) + " twice";
+        if (std::find(keys.begin(), end, field.key) != end) return twice(field.key);
+        *end++ = field.key;
     }
     return {};
 }
