@@ -32,7 +32,7 @@ PropertyStore::PropertyStore(std::shared_ptr<const StoreFile> file, const std::s
     // No sync: the kernel keeps what a killed process has written. Only a power cut loses writes.
     run("PRAGMA synchronous = OFF");
     prepareFormat();
-    switchToLog();
+    if (mFile != nullptr) switchToLog();
     mGet = prepare("SELECT value FROM properties WHERE name = ?1");
     mAdd = prepare("INSERT INTO properties VALUES (?1, ?2) ON CONFLICT (name) DO NOTHING");
     mSet =
@@ -105,6 +105,10 @@ void PropertyStore::restore(const std::vector<unsigned char>& bytes) {
  * becomes of the log. Also finds out whether the file can be written.
  */
 void PropertyStore::prepareFormat() {
+    if (mFile == nullptr) {  // a store in memory is new, and has no pages to damage
+        run(sqlToCurrent(StoreFormat::kEmpty).c_str());
+        return;
+    }
     run("BEGIN IMMEDIATE");
     if (mError) return;
     int status = SQLITE_OK;
