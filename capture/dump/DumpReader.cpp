@@ -293,10 +293,11 @@ void DumpReader::takeServiceLine(std::string_view text, int64_t lineNumber) {
 
 bool DumpReader::startSection(std::string_view text, int64_t lineNumber) {
     const bool isReport = startsWith(text, kReportSection);
+    const std::string_view indented = trimmed(text);
     for (const Section& section : kSections) {
         if (isReport != (section.place == Place::kReport) || !mayBegin(section)) continue;
-        const bool isIndented = section.place == Place::kSensors;
-        if (!section.begin(isIndented ? trimmed(text) : text, lineNumber, &mDump)) continue;
+        const bool mayIndent = section.place == Place::kSensors;
+        if (!section.begin(mayIndent ? indented : text, lineNumber, &mDump)) continue;
         if (section.place != Place::kHead) mSection = &section;
         return true;
     }

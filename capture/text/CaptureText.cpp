@@ -9,14 +9,6 @@ constexpr std::string_view kMark = "\xEF\xBB\xBF";
 
 }  // namespace
 
-bool isDigit(char c) {
-    return c >= '0' && c <= '9';
-}
-
-bool startsWith(std::string_view text, std::string_view prefix) {
-    return text.substr(0, prefix.size()) == prefix;
-}
-
 bool endsWith(std::string_view text, std::string_view suffix) {
     return text.size() >= suffix.size() && text.substr(text.size() - suffix.size()) == suffix;
 }
@@ -37,12 +29,6 @@ std::string_view unquoted(std::string_view line) {
         takePrefix(&line, " ");
     }
     return line.substr(0, line.find_last_not_of(kBlanks) + 1);
-}
-
-bool takePrefix(std::string_view* text, std::string_view prefix) {
-    if (!startsWith(*text, prefix)) return false;
-    text->remove_prefix(prefix.size());
-    return true;
 }
 
 std::string_view takeWord(std::string_view* text) {

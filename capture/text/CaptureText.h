@@ -12,8 +12,14 @@ namespace capture {
 
 // What the readers of a capture's lines share. Blanks are blanks, tabs and carriage returns.
 
-bool isDigit(char c);
-bool startsWith(std::string_view text, std::string_view prefix);
+constexpr bool isDigit(char c) {
+    return c >= '0' && c <= '9';
+}
+
+constexpr bool startsWith(std::string_view text, std::string_view prefix) {
+    return text.substr(0, prefix.size()) == prefix;
+}
+
 bool endsWith(std::string_view text, std::string_view suffix);
 
 /** Without the blanks at both ends. */
@@ -26,7 +32,11 @@ std::string_view trimmed(std::string_view text);
 std::string_view unquoted(std::string_view line);
 
 /** Takes `prefix` off `text`; false if `text` does not start with it. */
-bool takePrefix(std::string_view* text, std::string_view prefix);
+constexpr bool takePrefix(std::string_view* text, std::string_view prefix) {
+    if (!startsWith(*text, prefix)) return false;
+    text->remove_prefix(prefix.size());
+    return true;
+}
 
 /** Takes what stands before the next blank off `text`, and the blanks around it. */
 std::string_view takeWord(std::string_view* text);
