@@ -211,7 +211,7 @@ void FlowingDataException::setProxEnable(std::string pkg, std::string opPkg) {
     const nsecs_t now = systemTime(SYSTEM_TIME_MONOTONIC);
     Mutex::Autolock lock(mProxLock);
     ProxInfo& info = mProxInfoMap[connectionKey(pkg, opPkg)];
-    // Each nesting loses the fraction of a second, on purpose.
+    // [sic] Each nesting loses the fraction of a second: reported durations are made of such sums.
     if (info.startTime != 0) {
         info.duration = addWrapped(info.duration, secondsBetween(info.startTime, now));
     }

@@ -11,7 +11,7 @@
 
 namespace replay {
 
-/** An input, opened, of which the first line that says something has been read. */
+/** An opened input, positioned behind its first line that is neither blank nor a comment. */
 struct InputFile {
     std::string name;  // as it was given; "-" is standard input
     std::unique_ptr<base::LineReader> lines;

@@ -37,7 +37,7 @@ void RegisterConnectionList::handleEnable(const std::string& pkg, const std::str
     Mutex::Autolock lock(mLock);
 
     // Of those at the current rate, the first in the table earns the time. The others restart
-    // without credit, on purpose.
+    // without credit: the report tells who keeps the sensor fast, not who holds it.
     bool credited = false;
     for (auto& [key, info] : mConnections) {
         if (info.beginTime == 0) continue;
@@ -94,7 +94,7 @@ void RegisterConnectionList::handleDisable(const std::string& pkg, const std::st
 }
 
 void RegisterConnectionList::setDisplayState(int state) {
-    // Compared and stored before the lock, on purpose.
+    // Compared and stored before the lock, so that the same state again costs nothing.
     if (state == mDisplayState) return;
     mDisplayState = state;
     handleDisplayStateChanged();
