@@ -24,14 +24,18 @@ constexpr std::array<std::string_view, 2> kHows{"fired", "unseen"};
 
 // What each record of a note holds, for the writer and the reader below.
 
+/** `T` as `Fields` visits it: the writer takes it const. */
+template <typename Fields, typename T>
+using As = typename Fields::template As<T>;
+
 template <typename Fields>
-void visit(Fields& fields, Interval& interval) {
+void visit(Fields& fields, As<Fields, Interval>& interval) {
     fields("from", interval.from);
     fields("to", interval.to);
 }
 
 template <typename Fields>
-void visit(Fields& fields, Sensor& sensor) {
+void visit(Fields& fields, As<Fields, Sensor>& sensor) {
     fields("handle", sensor.handle);
     fields("name", sensor.name);
     fields("type", sensor.type);
@@ -42,7 +46,7 @@ void visit(Fields& fields, Sensor& sensor) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, CaptureNote& capture) {
+void visit(Fields& fields, As<Fields, CaptureNote>& capture) {
     fields("files", capture.files);
     fields("taken", capture.taken);
     fields("midnight", capture.midnight);
@@ -55,7 +59,7 @@ void visit(Fields& fields, CaptureNote& capture) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, KnownStates& known) {
+void visit(Fields& fields, As<Fields, KnownStates>& known) {
     fields("display", known.display);
     fields("charge", known.charge);
     fields("camera", known.camera);
@@ -63,20 +67,20 @@ void visit(Fields& fields, KnownStates& known) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, UidPackages& packages) {
+void visit(Fields& fields, As<Fields, UidPackages>& packages) {
     fields("uid", packages.uid);
     fields("names", packages.names);
 }
 
 template <typename Fields>
-void visit(Fields& fields, Client& client) {
+void visit(Fields& fields, As<Fields, Client>& client) {
     fields("pkg", client.pkg);
     fields("uid", client.uid);
     fields("handle", client.handle);
 }
 
 template <typename Fields>
-void visit(Fields& fields, RegistrationNote& registration) {
+void visit(Fields& fields, As<Fields, RegistrationNote>& registration) {
     fields("handle", registration.handle);
     fields("uid", registration.uid);
     fields("batchUs", registration.batchUs);
@@ -86,14 +90,14 @@ void visit(Fields& fields, RegistrationNote& registration) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, EndNote& end) {
+void visit(Fields& fields, As<Fields, EndNote>& end) {
     visit(fields, end.client);
     fields("how", end.how, kHows);
     fields("at", end.at);
 }
 
 template <typename Fields>
-void visit(Fields& fields, Connection& connection) {
+void visit(Fields& fields, As<Fields, Connection>& connection) {
     visit(fields, connection.client);
     fields("count", connection.count);
     fields("hasAccess", connection.hasAccess);
@@ -101,7 +105,7 @@ void visit(Fields& fields, Connection& connection) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, DirectChannel& channel) {
+void visit(Fields& fields, As<Fields, DirectChannel>& channel) {
     fields("package", channel.package);
     fields("uid", channel.uid);
     fields("sensors", channel.sensors);
@@ -109,14 +113,14 @@ void visit(Fields& fields, DirectChannel& channel) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, RefusedNote& refused) {
+void visit(Fields& fields, As<Fields, RefusedNote>& refused) {
     visit(fields, refused.client);
     fields("count", refused.count);
     fields("result", refused.result);
 }
 
 template <typename Fields>
-void visit(Fields& fields, ChargeRow& row) {
+void visit(Fields& fields, As<Fields, ChargeRow>& row) {
     fields("uid", row.uid);
     fields("handle", row.handle);
     fields("ms", row.ms);
@@ -126,14 +130,14 @@ void visit(Fields& fields, ChargeRow& row) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, SinceCharge& charge) {
+void visit(Fields& fields, As<Fields, SinceCharge>& charge) {
     fields("onBatteryMs", charge.onBatteryMs);
     fields("startMs", charge.startMs);
     fields("rows", charge.rows);
 }
 
 template <typename Fields>
-void visit(Fields& fields, TakenNote& taken) {
+void visit(Fields& fields, As<Fields, TakenNote>& taken) {
     fields("connections", taken.connections);
     fields("direct", taken.direct);
     fields("operatingMode", taken.operatingMode);
@@ -142,20 +146,20 @@ void visit(Fields& fields, TakenNote& taken) {
 }
 
 template <typename Fields>
-void visit(Fields& fields, LostNote& lost) {
+void visit(Fields& fields, As<Fields, LostNote>& lost) {
     fields("from", lost.from);
     fields("to", lost.to);
     fields("why", lost.why);
 }
 
 template <typename Fields>
-void visit(Fields& fields, HangNote& hang) {
+void visit(Fields& fields, As<Fields, HangNote>& hang) {
     fields("from", hang.from);
 }
 
 /** The registration's members stand in the note itself: they tell of the line. */
 template <typename Fields>
-void visit(Fields& fields, Note& note) {
+void visit(Fields& fields, As<Fields, Note>& note) {
     fields("capture", note.capture);
     fields("sensors", note.sensors);
     fields("packages", note.packages);
@@ -170,34 +174,37 @@ void visit(Fields& fields, Note& note) {
 /** Writes members; those without a value are left out. */
 class Writer {
 public:
+    template <typename T>
+    using As = const T;
+
     explicit Writer(base::JsonWriter* json) : mJson(*json) {}
 
     template <typename T>
-    void operator()(std::string_view key, T& value) {
+    void operator()(std::string_view key, const T& value) {
         mJson.key(key);
         write(value);
     }
 
     template <typename T>
-    void operator()(std::string_view key, std::optional<T>& value) {
+    void operator()(std::string_view key, const std::optional<T>& value) {
         if (!value) return;
         mJson.key(key);
         write(*value);  // an empty list, too: it is known to be empty
     }
 
     template <typename T>
-    void operator()(std::string_view key, std::vector<T>& list) {
+    void operator()(std::string_view key, const std::vector<T>& list) {
         if (list.empty()) return;
         mJson.key(key);
         write(list);
     }
 
-    void operator()(std::string_view key, bool& value, bool usual) {
+    void operator()(std::string_view key, bool value, bool usual) {
         if (value != usual) mJson.member(key, value);
     }
 
     template <typename Enum, size_t Size>
-    void operator()(std::string_view key, Enum& value,
+    void operator()(std::string_view key, const Enum& value,
                     const std::array<std::string_view, Size>& words) {
         const std::string_view word = words[static_cast<size_t>(value)];
         if (!word.empty()) mJson.member(key, word);
@@ -205,7 +212,7 @@ public:
 
 private:
     template <typename T>
-    void write(T& value) {
+    void write(const T& value) {
         if constexpr (std::is_arithmetic_v<T> || std::is_same_v<T, std::string>) {
             mJson.value(value);
         } else {
@@ -216,9 +223,9 @@ private:
     }
 
     template <typename T>
-    void write(std::vector<T>& list) {
+    void write(const std::vector<T>& list) {
         mJson.beginArray();
-        for (T& item : list) write(item);
+        for (const T& item : list) write(item);
         mJson.endArray();
     }
 
@@ -228,6 +235,9 @@ private:
 /** Reads members of an object; those that are missing or of another form stay as they are. */
 class Reader {
 public:
+    template <typename T>
+    using As = T;
+
     explicit Reader(element object) : mObject(object) {}
 
     bool has(std::string_view key) const { return !mObject.at_key(key).error(); }
@@ -317,12 +327,10 @@ SensorMode parseMode(std::string_view word) {
 }
 
 void writeNote(const Note& note, base::JsonWriter* json) {
-    // One `visit` serves the reader too, so that it takes what it may change.
-    Note copy = note;
     Writer writer(json);
     json->beginObject();
-    visit(writer, copy);
-    if (copy.registration) visit(writer, *copy.registration);
+    visit(writer, note);
+    if (note.registration) visit(writer, *note.registration);
     json->endObject();
 }
 
