@@ -88,10 +88,8 @@ base::Result<ImportedCapture> TraceBuilder::build() {
     readStates();
     warnOfStrangers();
     warnOfLeftOut();
-    ImportedCapture result;
-    result.trace = traceOf(mDay);
-    result.warnings = std::move(mDay.warnings);
-    return result;
+    std::string trace = traceOf(mDay);
+    return ImportedCapture{mDay.start, std::move(trace), std::move(mDay.warnings)};
 }
 
 std::optional<base::Failure> TraceBuilder::joinDumps() {

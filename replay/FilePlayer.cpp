@@ -9,6 +9,7 @@
 #include <unistd.h>
 
 #include "base/FileIo.h"
+#include "base/Json.h"
 #include "base/Result.h"
 #include "platform/PropertyService.h"
 #include "report/Check.h"
@@ -207,13 +208,15 @@ std::optional<Failure> FilePlayer::printMerged() {
 
 std::optional<Failure> FilePlayer::printCapture(const Import& imported) {
     if (auto failure = tell(imported)) return failure;
-    const std::string& text = imported->trace;
     if (mPrintedTrace) {
         // The next device's clock starts at its first line's time.
-        mOut.write(text.substr(0, text.find(',')) + ", \"boot\": \"device\"}\n");
+        std::string line;
+        base::JsonWriter json(&line);
+        json.beginObject().member("at", imported->start).member("boot", "device").endObject();
+        mOut.write(line + '\n');
     }
     mPrintedTrace = true;
-    mOut.write(text);
+    mOut.write(imported->trace);
     mOut.flush();
     return {};
 }
