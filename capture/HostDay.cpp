@@ -1,6 +1,7 @@
 #include "capture/HostDay.h"
 
 #include <algorithm>
+#include <iterator>
 
 #include "base/Json.h"
 #include "capture/dump/WallTime.h"
@@ -11,26 +12,6 @@ namespace {
 
 constexpr int64_t kResetDelay = 10 * kMsPerSecond;  // from an hour's reports to its resets
 constexpr int64_t kEndOfDay = 23 * kMsPerHour + 20 * kMsPerSecond;
-
-/** The list by which a host tells a state: its kind, zeros, and the value at the end. */
-struct Notification {
-    int kind;
-    int zeros;
-};
-
-Notification notificationOf(State state) {
-    switch (state) {
-        case State::kDisplay:
-            return {2, 1};
-        case State::kCamera:
-            return {10, 10};
-        case State::kCall:
-            return {7, 6};
-        case State::kCharge:
-            break;  // has a call of its own
-    }
-    return {};
-}
 
 }  // namespace
 
@@ -49,11 +30,13 @@ void HostDay::writeStart() {
 void HostDay::writeState(int64_t at, State state, int value) {
     writeTicksUpTo(at);
     if (state == State::kCharge) return writeCall(at, "SDCImpl.sendChargeState", value);
-    const Notification notification = notificationOf(state);
+    const auto* notification =
+            std::find_if(std::begin(trace::kNotifications), std::end(trace::kNotifications),
+                         [&](const trace::Notification& each) { return each.state == state; });
     base::JsonWriter json(mTrace);
     json.beginObject().member("at", at).member("call", "SDCImpl.setNotification");
-    json.key("args").beginArray().beginArray().value(notification.kind);
-    for (int i = 0; i < notification.zeros; ++i) json.value(0);
+    json.key("args").beginArray().beginArray().value(notification->kind);
+    for (size_t i = 1; i < notification->element; ++i) json.value(0);
     json.value(value).endArray().endArray().endObject();
     *mTrace += '\n';
 }

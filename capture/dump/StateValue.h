@@ -4,13 +4,15 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "trace/Words.h"
+
 namespace capture {
 
-/** What a host tells the library of the device, in the order in which it does. */
-enum class State { kDisplay, kCharge, kCamera, kCall };
+using State = trace::DeviceState;
 
-inline constexpr std::array<State, 4> kStates = {State::kDisplay, State::kCharge, State::kCamera,
-                                                 State::kCall};
+/** In the order in which a host tells them. */
+inline constexpr std::array<State, trace::kDeviceStates> kStates = {State::kDisplay, State::kCharge,
+                                                                    State::kCamera, State::kCall};
 
 // Values as the calls take them. The camera and a call are 1 (on) or 0.
 
