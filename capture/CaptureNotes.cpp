@@ -80,10 +80,7 @@ std::vector<trace::UidPackages> packagesOf(const JoinedDay& day, const trace::Ta
 /** Adds a connection to one of its sensors; those of one client are one entry. */
 void addConnection(const ClientConnection& connection, const trace::Client& client,
                    std::vector<trace::Connection>* all) {
-    const auto isSame = [&](const trace::Connection& known) {
-        return known.client.handle == client.handle && known.client.uid == client.uid &&
-               known.client.pkg == client.pkg;
-    };
+    const auto isSame = [&](const trace::Connection& known) { return known.client == client; };
     const auto known = std::find_if(all->begin(), all->end(), isSame);
     if (known == all->end()) {
         all->push_back({client, 1, connection.hasAccess, connection.wakeLocks});

@@ -4,12 +4,6 @@
 
 namespace capture {
 
-namespace {
-
-constexpr int32_t kSystemUid = 1000;
-
-}  // namespace
-
 ClientTable::ClientTable(const std::vector<NamedDump>& dumps, const JoinedLines& joined,
                          const std::vector<Part>& parts)
       : mOfLine(joined.lines.size()) {

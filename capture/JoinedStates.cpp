@@ -11,17 +11,13 @@ namespace capture {
 
 namespace {
 
-int64_t cut(int64_t time) {
-    return wholeUnits(time, kMsPerSecond) * kMsPerSecond;
-}
-
 void addChangesFrom(int64_t start, const std::vector<StateValue>& values,
                     std::vector<StateValue>* changes) {
     std::optional<int> told;
     for (auto value = values.begin(); value != values.end(); ++value) {
-        const int64_t at = std::max(cut(value->at), start);
+        const int64_t at = std::max(cutToSecond(value->at), start);
         const auto next = std::next(value);
-        const bool isLast = next == values.end() || std::max(cut(next->at), start) > at;
+        const bool isLast = next == values.end() || std::max(cutToSecond(next->at), start) > at;
         if (!isLast || told == value->value) continue;
         told = value->value;
         changes->push_back({at, value->state, value->value});
@@ -52,7 +48,7 @@ void JoinedStates::add(State state, const StateCourse& course, int64_t end) {
     if (before) take(mEnd, *before);
     if (mHasEnd && !before) goIdle(state);
     for (const StateValue& value : course.of(state)) {
-        const int64_t at = cut(value.at);
+        const int64_t at = cutToSecond(value.at);
         if ((!mHasEnd || at > mEnd) && at <= end) take(at, value.value);
     }
     if (!from) return;

@@ -22,10 +22,6 @@ int64_t lastUpTo(int64_t timeOfDay, int64_t time) {
     return wholeUnits(time - timeOfDay, kMsPerDay) * kMsPerDay + timeOfDay;
 }
 
-int64_t cutToSecond(int64_t time) {
-    return wholeUnits(time, kMsPerSecond) * kMsPerSecond;
-}
-
 /**
  * "Captured at" follows the newest registration as a further line would: a fall of the time of day
  * by an hour or less is a clock that was set back.

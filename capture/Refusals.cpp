@@ -18,11 +18,6 @@ struct Count {
     const Registration* line = nullptr;
 };
 
-bool isOf(const trace::RefusedNote& note, const Registration& line) {
-    return note.client.handle == line.handle && note.client.uid == line.uid &&
-           note.client.pkg == line.package && note.result == line.refusal;
-}
-
 }  // namespace
 
 // Refused lines do not join dumps. Their place among those that do tells which of them are the
@@ -48,11 +43,11 @@ std::vector<trace::RefusedNote> refusalsOf(const std::vector<NamedDump>& dumps,
     std::vector<trace::RefusedNote> notes;
     for (const auto& [place, count] : all) {
         const Registration& line = *count.line;
-        auto note = std::find_if(notes.begin(), notes.end(),
-                                 [&](const auto& known) { return isOf(known, line); });
-        if (note == notes.end()) {
-            note = notes.insert(note, {{line.package, line.uid, line.handle}, 0, line.refusal});
-        }
+        const trace::Client client{line.package, line.uid, line.handle};
+        auto note = std::find_if(notes.begin(), notes.end(), [&](const auto& known) {
+            return known.client == client && known.result == line.refusal;
+        });
+        if (note == notes.end()) note = notes.insert(note, {client, 0, line.refusal});
         note->count += count.count;
     }
     return notes;

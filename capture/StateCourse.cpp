@@ -99,7 +99,7 @@ private:
 }  // namespace
 
 std::optional<int> StateCourse::at(State state, int64_t at) const {
-    const int64_t end = (wholeUnits(at, kMsPerSecond) + 1) * kMsPerSecond;
+    const int64_t end = cutToSecond(at) + kMsPerSecond;
     const auto& values = of(state);
     const auto next = std::partition_point(values.begin(), values.end(),
                                            [&](const StateValue& v) { return v.at < end; });

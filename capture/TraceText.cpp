@@ -10,8 +10,6 @@ namespace capture {
 
 namespace {
 
-constexpr int32_t kSystemUid = 1000;
-
 // The library tests an app's package. A client's tag is mostly the name of one of its classes.
 std::string opPackageOf(const JoinedDay& day, const trace::Client& client, size_t part) {
     if (client.uid == kSystemUid) return "android";

@@ -109,9 +109,7 @@ private:
         mSteps.push_back(step);
     }
 
-    static int64_t secondOf(const Firing& firing) {
-        return wholeUnits(firing.at, kMsPerSecond) * kMsPerSecond;
-    }
+    static int64_t secondOf(const Firing& firing) { return cutToSecond(firing.at); }
 
     bool hasFiring() const { return mFiring != mSources.firings.end(); }
 

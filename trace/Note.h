@@ -73,6 +73,10 @@ struct Client {
     uint32_t handle = 0;
 };
 
+inline bool operator==(const Client& a, const Client& b) {
+    return a.handle == b.handle && a.uid == b.uid && a.pkg == b.pkg;
+}
+
 /** What the line of an enable or a disable says besides. */
 struct RegistrationNote {
     uint32_t handle = 0;

@@ -67,8 +67,7 @@ bool Connections::takeSensor(std::string_view nameAndHandle) {
 
 std::optional<int64_t> parseCount(std::string_view heading, std::string_view words) {
     const std::string_view number = takeWord(&heading);
-    const bool isNumber = number.find_first_not_of("0123456789") == std::string_view::npos;
-    return isNumber && heading == words ? parseNumber<int64_t>(number) : std::nullopt;
+    return areDigits(number) && heading == words ? parseNumber<int64_t>(number) : std::nullopt;
 }
 
 }  // namespace capture

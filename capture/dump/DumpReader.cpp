@@ -131,8 +131,10 @@ bool beginSensors(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
     return true;
 }
 
-bool takeSensors(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
-    dump->service.sensors.takeLine(text);
+/** Hands a line to a reader of the sensor service's text. */
+template <auto kReader>
+bool takeBy(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
+    (dump->service.*kReader).takeLine(text);
     return true;
 }
 
@@ -142,19 +144,9 @@ bool beginDevice(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
     return true;
 }
 
-bool takeDevice(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
-    dump->service.device.takeLine(text);
-    return true;
-}
-
 bool beginEvents(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
     if (!provesService(text == "Recent Sensor events:", dump)) return false;
     dump->service.events = {};
-    return true;
-}
-
-bool takeEvents(std::string_view text, int64_t /*lineNumber*/, Dump* dump) {
-    dump->service.events.takeLine(text);
     return true;
 }
 
@@ -198,18 +190,18 @@ constexpr Section kSections[] = {
         {Place::kReport, beginLog, takeLog},
         {Place::kReport, beginStatistics, takeStatistics},
         {Place::kBattery, beginHistory, takeHistory},
-        {Place::kSensors, beginCapturedAt, takeSensors},
+        {Place::kSensors, beginCapturedAt, takeBy<&SensorService::sensors>},
         {Place::kSensors, beginNoSensors, takeNothing},
-        {Place::kSensors, beginSensors, takeSensors},
-        {Place::kSensors, beginDevice, takeDevice},
-        {Place::kSensors, beginEvents, takeEvents},
+        {Place::kSensors, beginSensors, takeBy<&SensorService::sensors>},
+        {Place::kSensors, beginDevice, takeBy<&SensorService::device>},
+        {Place::kSensors, beginEvents, takeBy<&SensorService::events>},
         {Place::kSensors, beginConnections, takeConnections},
         {Place::kSensors, beginDirect, takeDirect},
         {Place::kSensors, beginRegistrations, takeNothing},
 };
 
 /** The list of sensors of a text that has lost its headings. */
-constexpr Section kBareSensors = {Place::kSensors, nullptr, takeSensors};
+constexpr Section kBareSensors = {Place::kSensors, nullptr, takeBy<&SensorService::sensors>};
 
 }  // namespace
 

@@ -15,10 +15,6 @@ struct Entry {
     std::string_view value;
 };
 
-bool isNumber(std::string_view word) {
-    return !word.empty() && word.find_first_not_of("0123456789") == std::string_view::npos;
-}
-
 bool isLevel(std::string_view word) {
     return word.size() == 1 && word[0] >= 'A' && word[0] <= 'Z';
 }
@@ -33,7 +29,7 @@ std::optional<Entry> parseEntry(std::string_view text) {
         level = takeWord(&text);
     }
     const size_t colon = text.find(':');
-    if (!isNumber(first) || !isNumber(second) || !isLevel(level) ||
+    if (!areDigits(first) || !areDigits(second) || !isLevel(level) ||
         colon == std::string_view::npos) {
         return std::nullopt;
     }
@@ -53,7 +49,7 @@ std::optional<int> parseCharge(std::string_view status) {
         status.remove_prefix(comma + 1);
     }
     const std::string_view plugged = trimmed(status.substr(0, status.find_first_of(",]")));
-    const auto number = isNumber(plugged) ? parseNumber<int>(plugged) : std::nullopt;
+    const auto number = areDigits(plugged) ? parseNumber<int>(plugged) : std::nullopt;
     return number ? std::optional(chargeOf(*number)) : std::nullopt;
 }
 

@@ -12,10 +12,6 @@ namespace {
 
 using Kind = HistoryLine::Kind;
 
-bool areDigits(std::string_view text) {
-    return !text.empty() && std::all_of(text.begin(), text.end(), isDigit);
-}
-
 bool areHexDigits(std::string_view text) {
     constexpr std::string_view kHexDigits = "0123456789abcdefABCDEF";
     return text.find_first_not_of(kHexDigits) == std::string_view::npos;

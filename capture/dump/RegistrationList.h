@@ -39,7 +39,6 @@ public:
     const std::vector<Registration>& registrations() const { return mRegistrations; }
 
     /** Enables of which nothing came, newest first. */
-    std::vector<RefusedLine>& refused() { return mRefused; }
     const std::vector<RefusedLine>& refused() const { return mRefused; }
 
     /** Look like registrations, but cannot be read. */

@@ -16,6 +16,11 @@ using base::kMsPerMinute;
 using base::kMsPerSecond;
 using base::wholeUnits;
 
+/** `time` without its fraction of a second. */
+constexpr int64_t cutToSecond(int64_t time) {
+    return wholeUnits(time, kMsPerSecond) * kMsPerSecond;
+}
+
 /** "2018-04-25 11:45:07" at the start of `text`; nothing if there is no such moment. */
 std::optional<int64_t> parseStamp(std::string_view text);
 

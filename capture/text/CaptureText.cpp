@@ -1,5 +1,7 @@
 #include "capture/text/CaptureText.h"
 
+#include <algorithm>
+
 namespace capture {
 
 namespace {
@@ -11,6 +13,10 @@ constexpr std::string_view kMark = "\xEF\xBB\xBF";
 
 bool endsWith(std::string_view text, std::string_view suffix) {
     return text.size() >= suffix.size() && text.substr(text.size() - suffix.size()) == suffix;
+}
+
+bool areDigits(std::string_view text) {
+    return !text.empty() && std::all_of(text.begin(), text.end(), isDigit);
 }
 
 std::string_view trimmed(std::string_view text) {

@@ -22,6 +22,9 @@ constexpr bool startsWith(std::string_view text, std::string_view prefix) {
 
 bool endsWith(std::string_view text, std::string_view suffix);
 
+/** Whether `text` is a number without a sign. */
+bool areDigits(std::string_view text);
+
 /** Without the blanks at both ends. */
 std::string_view trimmed(std::string_view text);
 

@@ -4,11 +4,12 @@
 #include <climits>
 #include <utility>
 
+#include "capture/text/Block.h"
+
 namespace capture {
 
 namespace {
 
-constexpr size_t kBlock = size_t{64} << 10;
 constexpr int kGzipOnly = 16;  // as inflateInit2 has it
 constexpr Bytef kMagic = 0x1F;
 constexpr char kDamaged[] = "the gzip file is damaged: ";

@@ -9,6 +9,7 @@
 #include <unistd.h>
 
 #include "base/FileIo.h"
+#include "capture/text/Block.h"
 #include "capture/text/GzipSource.h"
 #include "capture/text/PeekedSource.h"
 #include "capture/text/Utf16Source.h"
@@ -20,7 +21,6 @@ namespace {
 
 using Source = std::unique_ptr<base::ByteSource>;
 
-constexpr size_t kBlock = size_t{64} << 10;
 constexpr int kMostPackings = 2;  // a zip or gzip in another
 
 /** A temporary file without a name that holds all of `source`. */

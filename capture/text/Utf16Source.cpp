@@ -5,11 +5,12 @@
 
 #include <unistr.h>
 
+#include "capture/text/Block.h"
+
 namespace capture {
 
 namespace {
 
-constexpr size_t kBlock = size_t{64} << 10;
 constexpr size_t kLongest = 4;  // bytes of a character, in either encoding
 constexpr uint16_t kNoCharacter = 0xFFFD;
 

@@ -7,13 +7,13 @@
 #include <archive_entry.h>
 #include <unistd.h>
 
+#include "capture/text/Block.h"
 #include "capture/text/CaptureText.h"
 
 namespace capture {
 
 namespace {
 
-constexpr size_t kBlock = size_t{64} << 10;
 constexpr char kMainEntry[] = "main_entry.txt";
 
 std::string nameOf(archive_entry* entry) {
