@@ -49,14 +49,6 @@ std::vector<std::optional<int64_t>> baseDays(const JoinedLines& joined,
 
 }  // namespace
 
-int64_t Dating::traceTime(int64_t wallTime) const {
-    return wallTime - *firstDay * kMsPerDay;
-}
-
-int64_t Dating::wallTime(int64_t traceTime) const {
-    return traceTime + *firstDay * kMsPerDay;
-}
-
 Dating dateLines(const JoinedLines& joined, const std::vector<std::optional<int64_t>>& taken) {
     const std::vector<int64_t> midnights = countMidnights(joined.lines);
     const auto bases = baseDays(joined, midnights, taken);

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "capture/DumpJoin.h"
+#include "capture/dump/WallTime.h"
 
 namespace capture {
 
@@ -17,10 +18,10 @@ struct Dating {
     std::vector<size_t> setBack;      // lines that keep the time of the line before them
 
     /** A wall time on the trace's clock. There must be a first day. */
-    int64_t traceTime(int64_t wallTime) const;
+    int64_t traceTime(int64_t wallTime) const { return wallTime - *firstDay * kMsPerDay; }
 
     /** The reverse. */
-    int64_t wallTime(int64_t traceTime) const;
+    int64_t wallTime(int64_t traceTime) const { return traceTime + *firstDay * kMsPerDay; }
 };
 
 /**

@@ -43,11 +43,7 @@ int chargeOf(int plugged) {
 /** "[status,health,present,plugged,technology]" */
 std::optional<int> parseCharge(std::string_view status) {
     if (!takePrefix(&status, "[")) return std::nullopt;
-    for (int i = 0; i < 3; ++i) {
-        const size_t comma = status.find(',');
-        if (comma == std::string_view::npos) return std::nullopt;
-        status.remove_prefix(comma + 1);
-    }
+    for (int i = 0; i < 3; ++i) takePart(&status, ',');
     const std::string_view plugged = trimmed(status.substr(0, status.find_first_of(",]")));
     const auto number = areDigits(plugged) ? parseNumber<int>(plugged) : std::nullopt;
     return number ? std::optional(chargeOf(*number)) : std::nullopt;
