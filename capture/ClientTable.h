@@ -19,7 +19,8 @@ namespace capture {
 inline constexpr int32_t kSystemUid = 1000;
 
 /**
- * Whose each registration and each connection is. A client is a tag with its uid, on one sensor.
+ * Tells to which client each registration and each connection belongs. A client is a tag with its
+ * uid, on one sensor.
  * Clients are numbered in the order in which they come.
  */
 class ClientTable {

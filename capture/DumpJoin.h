@@ -56,7 +56,7 @@ private:
     struct Match {
         size_t length = 0;  // of the run
         size_t piece = 0;
-        bool isOlder = false;  // the piece is
+        bool isOlder = false;  // that piece is the older one
         size_t at = 0;         // where the run begins in the older one
     };
 

@@ -12,7 +12,7 @@ namespace capture {
 
 /**
  * The course of a device's states by one or several dumps of it. Each dump tells what happened
- * since the one before. Where knowledge ends, what was known goes idle.
+ * since the one before. A state that was known goes idle where that knowledge ends.
  */
 class JoinedStates {
 public:

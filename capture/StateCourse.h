@@ -11,7 +11,7 @@
 
 namespace capture {
 
-/** How the states of a device went, by what is known of them. */
+/** The values that a device's states had over time, as far as they are known. */
 class StateCourse {
 public:
     /** Adds a value; times must not go back. */

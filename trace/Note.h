@@ -85,9 +85,9 @@ struct RegistrationNote {
     bool before = false;             // on before anything is seen; this line stands for it
     bool rateKnown = true;           // false: the rate of the call is a guess
 
-    // How many enables of the client are on behind this line, where that is not one more, or one
-    // less, than before it. So it is behind a firing or a gap, when older enables still await the
-    // disables that mean them.
+    // How many enables of the client are on behind this line. Left out where an enable adds one and
+    // a disable takes one away. It differs behind a firing or a gap: those end a use, but disables
+    // of the enables before them are still to come.
     std::optional<int64_t> level;
 };
 
@@ -160,8 +160,7 @@ struct LostNote {
     std::string why;
 };
 
-/** Work that began at `from` hangs: what it does later stands later in a record than in a replay.
- */
+/** Work that began at `from` hangs. A record tells what it does later than a replay would. */
 struct HangNote {
     int64_t from = 0;
 };

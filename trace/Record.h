@@ -22,8 +22,8 @@ struct Record {
         kOver,      // the process ends here; `number`: 1 if its last line did something
         kExpect,    // what the recorded device did: an entry; `at` is the line's, `number` too
         kTorn,      // the trace ends before a torn line, whose number is `number`
-        kNote,      // the note of a line, as JSON; those of enables and disables stand in these;
-                    // `number`: the line's
+        kNote,      // the note of a line, as JSON; `number`: the line's. Enables and disables have
+                    // theirs in their own records
 
         // Calls that are about to be made. Only if they are wanted, or have notes.
         kEnable,   // pkg, opPkg, note; `value`: the sensor's type, `number`: the period, ns

@@ -18,7 +18,7 @@ namespace capture {
 
 /** What the text of the sensor service says beside the registrations. */
 struct SensorService {
-    std::optional<int64_t> footer;      // when it had been asked; a wall time
+    std::optional<int64_t> footer;      // when its answer ended; a wall time
     std::optional<int64_t> capturedAt;  // when it answered: a time of day, whole seconds
     SensorList sensors;
     SensorDevice device;

@@ -18,7 +18,8 @@ struct RecentEvent {
 /** The newest events of each sensor, by "Recent Sensor events:". */
 class RecentEvents {
 public:
-    /** Takes "NAME: last N events" or "1 (ts=248642.173971992, wall=10:43:45.967) ..."; or not. */
+    /** Takes "NAME: last N events" or "1 (ts=248642.173971992, wall=10:43:45.967) ..."; ignores
+     * others. */
     void takeLine(std::string_view text);
 
     /** By the sensor's name. Sensors of one name share a list. */

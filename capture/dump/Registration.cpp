@@ -25,7 +25,7 @@ std::optional<Action> takeAction(std::string_view* text) {
     return std::nullopt;
 }
 
-/** What stands behind the first of `keys` that `text` holds, up to the next blank but one. */
+/** The number behind `key`, or behind `olderKey` if `text` does not hold `key`. */
 std::optional<int64_t> parsePeriod(std::string_view text, std::string_view key,
                                    std::string_view olderKey) {
     auto period = valueOf(text, key);
@@ -41,7 +41,8 @@ struct ResultForm {
     std::string_view package;
 };
 
-/** A form in which the package stands first has no result: names may hold anything. */
+/** In older forms the package stands first. Such a line has no result, even if its names hold one.
+ */
 std::optional<ResultForm> parseResult(std::string_view text) {
     const size_t begin = text.find(" result=");
     if (begin == std::string_view::npos || text.find(" package=") < begin) return std::nullopt;
