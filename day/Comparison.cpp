@@ -33,7 +33,7 @@ bool isCovered(const Side& side, Per per) {
 }
 
 /** By the inputs that cover enough; where none does, by all that cover anything. */
-Spread spreadOf(const Side& side, const ProfileKey& key, Per per) {
+std::optional<Spread> spreadOf(const Side& side, const ProfileKey& key, Per per) {
     const bool wantsEnough = isCovered(side, per);
     std::vector<double> values;
     for (const Profile& profile : side) {
@@ -42,12 +42,12 @@ Spread spreadOf(const Side& side, const ProfileKey& key, Per per) {
         values.push_back(static_cast<double>(heldPer(rowOf(profile, key), per)) /
                          static_cast<double>(coverage) * kSecondsPerHour);
     }
-    if (values.empty()) return {};
+    if (values.empty()) return std::nullopt;
     std::sort(values.begin(), values.end());
     const size_t half = values.size() / 2;
     const double median =
             values.size() % 2 == 1 ? values[half] : (values[half - 1] + values[half]) / 2;
-    return {median, values.front(), values.back()};
+    return Spread{median, values.front(), values.back()};
 }
 
 /** A key's uses in all inputs of a side. */
@@ -122,30 +122,29 @@ bool isRateOrBatching(const Change& change) {
 /** What differs for a key, if anything does. */
 std::optional<Difference> differenceOf(const Side& before, const Side& after, const ProfileKey& key,
                                        Per per) {
-    Difference result{key,
-                      {},
-                      per,
-                      ChangeState::kChanged,
-                      spreadOf(before, key, per),
-                      spreadOf(after, key, per),
-                      0,
-                      {}};
     const SideSum sumBefore = sumOf(before, key);
     const SideSum sumAfter = sumOf(after, key);
-    result.sensor = sumAfter.row.sensor.empty() ? sumBefore.row.sensor : sumAfter.row.sensor;
-    const double size = result.after.median - result.before.median;
+    ProfileRow both = sumBefore.row;
+    add(sumAfter.row, &both);
+    Difference result{key, both.sensor, per, ChangeState::kChanged, {}, {}, 0, {}};
+    result.before = spreadOf(before, key, per);
+    result.after = spreadOf(after, key, per);
+    const Spread old = result.before.value_or(Spread());
+    const Spread now = result.after.value_or(Spread());
+    if (old.largest == 0 && now.largest == 0) return std::nullopt;
+    const double size = now.median - old.median;
     const bool isSame = std::fabs(size) < kLeastDifference &&
-                        std::fabs(result.after.largest - result.before.largest) < kLeastDifference;
+                        std::fabs(now.smallest - old.smallest) < kLeastDifference &&
+                        std::fabs(now.largest - old.largest) < kLeastDifference;
     if (!isCovered(before, per) || !isCovered(after, per)) {
         if (isSame) return std::nullopt;
         result.state = ChangeState::kNotCovered;
         return result;
     }
     if (!isSame) result.size = size;
-    if (result.before.largest == 0 && result.after.largest == 0) return std::nullopt;
-    if (result.before.largest == 0) {
+    if (old.largest == 0) {
         result.state = ChangeState::kNew;
-    } else if (result.after.largest == 0) {
+    } else if (now.largest == 0) {
         result.state = ChangeState::kGone;
     } else {
         result.changes = changesOf(sumBefore, sumAfter, per, result.size);

@@ -47,8 +47,8 @@ struct Difference {
     std::string sensor;  // a name of it; may be empty
     Per per;
     ChangeState state;
-    Spread before;
-    Spread after;
+    std::optional<Spread> before;  // nothing if nothing at all is covered
+    std::optional<Spread> after;
     double size = 0;  // median after less median before; 0 if that is not covered
     std::vector<Change> changes;
 };

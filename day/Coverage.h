@@ -7,15 +7,8 @@
 
 namespace day {
 
-// Spans stand in order and apart from each other.
-
-/** When a capture tells who holds what: from its first line on, but for its gaps. */
+/** When a capture tells who holds what, all its boots together. */
 std::vector<Span> seenOf(const Journal& journal, size_t capture);
-
-/** What lies in both. */
-std::vector<Span> commonOf(const std::vector<Span>& a, const std::vector<Span>& b);
-
-int64_t lengthOf(const std::vector<Span>& spans);
 
 /** The part of a capture's time on battery in which it is known who held what. */
 struct BatteryCoverage {

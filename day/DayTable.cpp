@@ -30,7 +30,7 @@ void DayTable::add(const Use& use, const UseTracker& tracker) {
         const auto [found, isNew] = mRows[{use.boot, number}].try_emplace(keyOf(use));
         DayRow& row = found->second;
         row.holder = use;
-        const auto samples = isContinuous(use) ? samplesOf(use, span.to - span.from) : std::nullopt;
+        const auto samples = samplesOf(use, span.to - span.from);
         if (isNew) {
             row.samples = samples;
         } else {

@@ -4,15 +4,9 @@
 #include <optional>
 #include <vector>
 
-#include "trace/Note.h"
+#include "day/Spans.h"
 
 namespace day {
-
-/** From `from` to `to`, in nanoseconds of the clock. */
-struct Span {
-    int64_t from = 0;
-    int64_t to = 0;
-};
 
 /** For how much of a span the display is known, and for how much of that it was on; ns. */
 struct DisplayTime {

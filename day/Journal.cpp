@@ -72,39 +72,36 @@ void Journal::take(const Record& record) {
 
 void Journal::end() {
     mTracker.end();
-    endBoot();
+    endBoot(true);
     keepCapture();
 }
 
 void Journal::startBoot(const Record& record) {
-    endBoot();
-    if (record.value == static_cast<int32_t>(trace::BootKind::kDevice)) keepCapture();
+    const bool isDeviceBoot = record.value == static_cast<int32_t>(trace::BootKind::kDevice);
+    endBoot(isDeviceBoot);
+    if (isDeviceBoot) keepCapture();
     mBoots.emplace_back().span = {record.at, record.at};
 }
 
-void Journal::endBoot() {
+void Journal::endBoot(bool isLast) {
     if (mBoots.empty()) return;
-    mBoots.back().firstDay = mTracker.notes().firstDay();
-    measure(&mBoots.back());
+    const Notes& notes = mTracker.notes();
+    Boot& last = mBoots.back();
+    last.firstDay = notes.firstDay();
+    // What is on when the capture is taken may be known for longer than the trace lasts.
+    int64_t to = notes.knownTo().value_or(last.span.to);
+    if (!isLast) to = std::min(to, last.span.to);
+    last.seen = without({last.span.from, to}, spansOf(notes.gaps()));
+    for (const Span& span : last.seen) {
+        const DisplayTime display = mTracker.displayIn(span);
+        last.display.known += display.known;
+        last.display.on += display.on;
+    }
     const auto boot = static_cast<int64_t>(mBoots.size()) - 1;
     for (auto* spans : {&mDisplay, &mCharge}) {
         if (!spans->empty() && spans->back().boot == boot) {
-            spans->back().span.to = mBoots.back().span.to;
+            spans->back().span.to = last.span.to;
         }
-    }
-}
-
-void Journal::measure(Boot* boot) const {
-    const Notes& notes = mTracker.notes();
-    const Span seen{boot->span.from, notes.knownTo().value_or(boot->span.to)};
-    boot->covered = std::max<int64_t>(seen.to - seen.from, 0);
-    boot->display = mTracker.displayIn(seen);
-    for (const trace::Interval& gap : notes.gaps()) {
-        const Span missing{gap.from * base::kNsPerMs, gap.to * base::kNsPerMs};
-        boot->covered -= missing.to - missing.from;
-        const DisplayTime display = mTracker.displayIn(missing);
-        boot->display.known -= display.known;
-        boot->display.on -= display.on;
     }
 }
 

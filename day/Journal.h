@@ -34,8 +34,8 @@ struct Boot {
     Span span;
     std::optional<int64_t> firstDay;  // the date of the clock's 0, in days since 1970-01-01
     std::optional<size_t> capture;    // that it is of, in `captures()`
-    int64_t covered = 0;  // ns for which holdings are seen: without gaps, up to what is known
-    DisplayTime display;  // within that, but for gaps
+    std::vector<Span> seen;           // when it is known who holds what: without gaps
+    DisplayTime display;              // within `seen`
 };
 
 /** What happened in one input, gathered from its records. Nothing is kept that no view shows. */
@@ -84,9 +84,9 @@ public:
 
 private:
     void startBoot(const trace::Record& record);
-    void endBoot();
+    /** `isLast`: of the device. */
+    void endBoot(bool isLast);
     void keepCapture();
-    void measure(Boot* boot) const;
     void takeState(const trace::Record& record);
 
     std::string mName;

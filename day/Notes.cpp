@@ -1,29 +1,10 @@
 #include "day/Notes.h"
 
-#include <algorithm>
-
 #include "base/Calendar.h"
-#include "trace/TraceTime.h"
 
 namespace day {
 
 using trace::Bound;
-
-int64_t toClock(int64_t ms) {
-    return std::clamp<int64_t>(ms, 0, trace::kMaxTimeMs) * base::kNsPerMs;
-}
-
-std::vector<Span> spansOf(const std::vector<trace::Interval>& intervals) {
-    std::vector<Span> spans;
-    int64_t end = 0;
-    for (const trace::Interval& each : intervals) {
-        const Span span{std::max(toClock(each.from), end), toClock(each.to)};
-        if (span.from >= span.to) continue;
-        spans.push_back(span);
-        end = span.to;
-    }
-    return spans;
-}
 
 void Notes::take(const trace::Note& note, int64_t at) {
     if (note.capture) {
@@ -67,6 +48,16 @@ bool Notes::isAhead(int64_t at) const {
 const trace::Sensor* Notes::sensorOf(uint32_t handle) const {
     const auto found = mByHandle.find(handle);
     return found == mByHandle.end() ? nullptr : &mSensors[found->second];
+}
+
+const trace::Sensor* Notes::sensorOf(const trace::ChargeRow& row) const {
+    return row.handle < 0 ? nullptr : sensorOf(static_cast<uint32_t>(row.handle));
+}
+
+std::string Notes::nameOf(const trace::ChargeRow& row) const {
+    if (row.handle == trace::kGpsHandle) return "GPS";
+    const trace::Sensor* sensor = sensorOf(row);
+    return sensor == nullptr ? std::string() : sensor->name;
 }
 
 const std::vector<std::string>* Notes::packagesOf(int32_t uid) const {

@@ -6,16 +6,11 @@
 #include <string>
 #include <vector>
 
-#include "day/DisplayTime.h"
+#include "day/Spans.h"
 #include "day/Use.h"
 #include "trace/Note.h"
 
 namespace day {
-
-/** Intervals of a note in order and apart from each other, whatever it says. */
-std::vector<Span> spansOf(const std::vector<trace::Interval>& intervals);
-/** A time of a note, which may be any number of ms, as the clock has it, ns. */
-int64_t toClock(int64_t ms);
 
 /** What the notes of a trace tell of a device, up to a boot of it that sets the clock back. */
 class Notes {
@@ -46,6 +41,12 @@ public:
     bool namesSensors() const { return mNamesSensors; }
     const std::vector<trace::Sensor>& sensors() const { return mSensors; }
     const trace::Sensor* sensorOf(uint32_t handle) const;
+
+    /** The sensor of a row of the battery statistics; null for GPS. */
+    const trace::Sensor* sensorOf(const trace::ChargeRow& row) const;
+
+    /** Its name, also of GPS; empty if it is not known. */
+    std::string nameOf(const trace::ChargeRow& row) const;
 
     /** The packages of a uid; null if they are not known. */
     const std::vector<std::string>* packagesOf(int32_t uid) const;

@@ -2,8 +2,6 @@
 
 #include <algorithm>
 
-#include "base/Calendar.h"
-
 namespace day {
 
 namespace {
@@ -20,12 +18,6 @@ std::string keyApp(const Use& use) {
     return use.packages.empty() ? withoutNumber(use.pkg) : use.packages.front();
 }
 
-/** The shorter batching is the one that costs; -1 is the longest. */
-bool isLessBatching(int64_t a, int64_t b) {
-    if (a < 0 || b < 0) return b < 0 && a >= 0;
-    return a < b;
-}
-
 void add(const Use& use, Profile* profile) {
     ProfileRow row;
     row.sensor = use.sensor;
@@ -40,20 +32,20 @@ void add(const Use& use, Profile* profile) {
 }
 
 void add(const trace::SinceCharge& charge, const Notes& notes, Profile* profile) {
-    profile->onBattery += charge.onBatteryMs.value_or(0) * base::kNsPerMs;
+    profile->onBattery += toClock(charge.onBatteryMs.value_or(0));
     for (const trace::ChargeRow& each : charge.rows) {
         const auto* packages = notes.packagesOf(each.uid);
-        const trace::Sensor* sensor =
-                each.handle < 0 ? nullptr : notes.sensorOf(static_cast<uint32_t>(each.handle));
+        const trace::Sensor* sensor = notes.sensorOf(each);
         const std::string app = packages == nullptr || packages->empty()
                                         ? "uid " + std::to_string(each.uid)
                                         : packages->front();
         ProfileRow row;
-        if (sensor != nullptr) row.sensor = sensor->name;
-        row.heldOnBattery = each.ms * base::kNsPerMs;
-        row.background = each.background.value_or(0) * base::kNsPerMs;
-        add(row,
-            &profile->rows[{app, sensor == nullptr ? std::nullopt : std::optional(sensor->type)}]);
+        row.sensor = notes.nameOf(each);
+        row.heldOnBattery = toClock(each.ms);
+        row.background = toClock(each.background.value_or(0));
+        ProfileKey key{app, sensor == nullptr ? 0 : sensor->type};
+        if (each.handle == trace::kGpsHandle) key.second.reset();
+        add(row, &profile->rows[key]);
     }
 }
 
@@ -64,7 +56,10 @@ int64_t Profile::coverage(Per per) const {
 }
 
 void add(const ProfileRow& other, ProfileRow* row) {
-    if (row->sensor.empty()) row->sensor = other.sensor;
+    // The same one whatever is added first.
+    if (row->sensor.empty() || (!other.sensor.empty() && other.sensor < row->sensor)) {
+        row->sensor = other.sensor;
+    }
     row->held += other.held;
     row->displayKnown += other.displayKnown;
     row->heldOff += other.heldOff;
@@ -73,9 +68,7 @@ void add(const ProfileRow& other, ProfileRow* row) {
     if (other.periodNs) {
         row->periodNs = std::min(row->periodNs.value_or(*other.periodNs), *other.periodNs);
     }
-    if (other.batchUs && (!row->batchUs || isLessBatching(*other.batchUs, *row->batchUs))) {
-        row->batchUs = other.batchUs;
-    }
+    row->batchUs = shorterBatch(row->batchUs, other.batchUs);
     row->heldOnBattery += other.heldOnBattery;
     row->background += other.background;
 }
@@ -90,7 +83,7 @@ Profile profileOf(const Journal& journal) {
     profile.properties = journal.properties();
     for (const Use& use : journal.uses()) add(use, &profile);
     for (const Boot& boot : journal.boots()) {
-        profile.covered += boot.covered;
+        profile.covered += lengthOf(boot.seen);
         profile.displayKnown += boot.display.known;
         profile.displayOff += boot.display.known - boot.display.on;
     }

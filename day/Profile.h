@@ -36,7 +36,7 @@ struct ProfileRow {
 
 /**
  * An app, by its first package where that is known, else by its clients' tag without what changes
- * from build to build ("$1" at its end); and a type of sensor, none for GPS.
+ * from build to build ("$1" at its end); and a type of sensor: none for GPS, 0 if it is not known.
  */
 using ProfileKey = std::pair<std::string, std::optional<int32_t>>;
 

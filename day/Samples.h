@@ -42,11 +42,13 @@ inline std::optional<double> rateOf(const Use& use) {
     return rateOf(use, use.periodNs);
 }
 
-/** The samples of a use, or of a part of it that takes `timeNs`; nothing if its rate is not known.
+/**
+ * The samples of a use, or of a part of it that takes `timeNs`. Nothing if its rate is not known,
+ * or if the sensor does not take samples all the time.
  */
 inline std::optional<double> samplesOf(const Use& use, int64_t timeNs) {
     const auto rate = rateOf(use);
-    if (!rate) return {};
+    if (!rate || !isContinuous(use)) return {};
     return *rate * static_cast<double>(timeNs) / 1e9;
 }
 

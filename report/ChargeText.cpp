@@ -20,11 +20,9 @@ std::string formatPercent(std::optional<int64_t> part, std::optional<int64_t> wh
 }
 
 std::string nameSensorOf(const trace::ChargeRow& row, const day::Notes& notes) {
-    if (row.handle == trace::kGpsHandle) return "GPS";
-    const auto* sensor =
-            row.handle < 0 ? nullptr : notes.sensorOf(static_cast<uint32_t>(row.handle));
-    if (sensor != nullptr) return nameSensor(sensor->type, sensor->name);
-    return "handle " + std::to_string(row.handle);
+    if (const auto* sensor = notes.sensorOf(row)) return nameSensor(sensor->type, sensor->name);
+    const std::string name = notes.nameOf(row);
+    return name.empty() ? "handle " + std::to_string(row.handle) : name;
 }
 
 std::string describeRow(const trace::ChargeRow& row) {

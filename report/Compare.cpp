@@ -69,13 +69,12 @@ std::string formatSeconds(double seconds) {
     return base::formatDuration(std::chrono::seconds(std::llround(seconds)));
 }
 
-std::string formatSpread(const Spread& spread) {
-    std::string text = formatSeconds(spread.median);
-    if (spread.smallest != spread.largest) {
-        text += " (" + formatSeconds(spread.smallest) + " to " + formatSeconds(spread.largest) +
-                ')';
-    }
-    return text;
+std::string formatSpread(const std::optional<Spread>& spread) {
+    if (!spread) return "?";
+    std::string text = formatSeconds(spread->median);
+    if (spread->smallest == spread->largest) return text;
+    return text + " (" + formatSeconds(spread->smallest) + " to " + formatSeconds(spread->largest) +
+           ')';
 }
 
 std::string formatSize(const Difference& difference) {
@@ -84,8 +83,9 @@ std::string formatSize(const Difference& difference) {
 }
 
 std::string nameOf(const Difference& difference) {
-    if (!difference.key.second) return "GPS";
-    return nameSensor(*difference.key.second, difference.sensor);
+    if (!difference.key.second) return difference.sensor;  // GPS
+    const bool isKnown = *difference.key.second != 0 || !difference.sensor.empty();
+    return isKnown ? nameSensor(*difference.key.second, difference.sensor) : "unknown sensor";
 }
 
 std::string describeSide(const char* what, const std::vector<Profile>& side) {
@@ -236,13 +236,15 @@ void CompareLines::finish() {
         json.beginObject().key("compare").beginObject();
         json.member("app", each.key.first);
         if (each.key.second) json.member("type", *each.key.second);
-        json.member("sensor", each.key.second ? each.sensor : "GPS");
+        json.member("sensor", each.sensor);
         json.member("per", wordsOf(each.per).key);
-        const auto spread = [&](const char* key, const char* range, const Spread& values) {
-            json.member(key, rounded(values.median));
-            if (values.smallest == values.largest) return;
+        const auto spread = [&](const char* key, const char* range,
+                                const std::optional<Spread>& values) {
+            if (!values) return;
+            json.member(key, rounded(values->median));
+            if (values->smallest == values->largest) return;
             json.key(range).beginArray();
-            json.value(rounded(values.smallest)).value(rounded(values.largest)).endArray();
+            json.value(rounded(values->smallest)).value(rounded(values->largest)).endArray();
         };
         spread("old", "oldRange", each.before);
         spread("new", "newRange", each.after);

@@ -1,6 +1,5 @@
 #include "report/Csv.h"
 
-#include <algorithm>
 #include <cstdio>
 #include <utility>
 
@@ -74,14 +73,6 @@ std::string seconds(int64_t ns) {
     return asDecimal(ns / base::kNsPerMs);
 }
 
-/** The sensor of a row of the battery statistics; empty if it is not known. */
-std::string nameCharged(int32_t handle, const day::Notes& notes) {
-    if (handle == trace::kGpsHandle) return "GPS";
-    const trace::Sensor* sensor =
-            handle < 0 ? nullptr : notes.sensorOf(static_cast<uint32_t>(handle));
-    return sensor == nullptr ? std::string() : sensor->name;
-}
-
 std::string firstOf(const std::vector<std::string>& packages) {
     return packages.empty() ? std::string() : packages.front();
 }
@@ -113,7 +104,7 @@ void Csv::flush() {
 
 UsesCsv::UsesCsv(base::OutputFile* file)
       : Csv(file, kUses),
-        mTracker([this](const day::Use& use) { mEnded.push_back(use); }) {}
+        mTracker([this](const day::Use& use) { mEnded.add(use); }) {}
 
 void UsesCsv::begin(const std::string& name) {
     Csv::begin(name);
@@ -123,20 +114,18 @@ void UsesCsv::begin(const std::string& name) {
 void UsesCsv::take(const trace::Record& record) {
     if (record.kind == trace::Record::Kind::kExpect) return;  // its time is the recorded device's
     mTracker.take(record);
-    if (record.at > mAt || record.kind == trace::Record::Kind::kBoot) addEnded();
-    mAt = record.at;
+    // A boot of the device forgets the notes that its uses need.
+    const bool isOver = record.kind == trace::Record::Kind::kOver;
+    addEnded(isOver ? day::EndedUses::kAll : record.at);
 }
 
 void UsesCsv::endInput() {
     mTracker.end();
-    addEnded();
+    addEnded(day::EndedUses::kAll);
 }
 
-/** In the order of the lines that tell of uses. */
-void UsesCsv::addEnded() {
-    std::sort(mEnded.begin(), mEnded.end(), day::isToldBefore);
-    for (const day::Use& use : mEnded) add(use);
-    mEnded.clear();
+void UsesCsv::addEnded(int64_t before) {
+    mEnded.tell(before, [this](const day::Use& use) { add(use); });
 }
 
 void UsesCsv::add(const day::Use& use) {
@@ -194,7 +183,7 @@ void SinceChargeCsv::add(const day::Notes& notes) {
         base::CsvWriter row(rows());
         row.field(name()).field(takenOf(notes)).field(each.uid);
         row.field(names == nullptr ? "" : firstOf(*names)).field(packages).field(each.handle);
-        row.field(nameCharged(each.handle, notes)).field(each.ms).field(each.count);
+        row.field(notes.nameOf(each)).field(each.ms).field(each.count);
         row.field(ifKnown(each.background)).field(flag(each.shared));
         row.field(ifKnown(charge.onBatteryMs));
         row.endRow();

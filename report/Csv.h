@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "base/OutputFile.h"
+#include "day/EndedUses.h"
 #include "day/UseTracker.h"
 #include "report/Report.h"
 
@@ -54,12 +55,11 @@ public:
 
 private:
     void endInput() override;
-    void addEnded();
+    void addEnded(int64_t before);
     void add(const day::Use& use);
 
     day::UseTracker mTracker;
-    std::vector<day::Use> mEnded;  // at one moment
-    int64_t mAt = 0;
+    day::EndedUses mEnded;
 };
 
 /** A row for each row of the battery statistics since the last charge. */

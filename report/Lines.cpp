@@ -1,7 +1,5 @@
 #include "report/Lines.h"
 
-#include <algorithm>
-#include <limits>
 #include <string_view>
 
 #include "day/Payload.h"
@@ -18,7 +16,7 @@ using trace::Record;
 namespace {
 
 constexpr int64_t kNsPerUs = 1000;
-constexpr int64_t kAll = std::numeric_limits<int64_t>::max();  // the end of time
+using day::EndedUses;
 
 /** Writes a member whose value is known. */
 template <typename T>
@@ -43,7 +41,7 @@ bool isShown(Record::Kind kind) {
 JsonLines::JsonLines(Stdout* out, bool withFile)
       : mOut(out),
         mWithFile(withFile),
-        mTracker([this](const day::Use& use) { mEnded.push_back(use); }) {}
+        mTracker([this](const day::Use& use) { mEnded.add(use); }) {}
 
 void JsonLines::begin(const std::string& name) {
     mName = name;
@@ -55,9 +53,7 @@ void JsonLines::take(const Record& record) {
     if (record.kind == Record::Kind::kExpect) return;  // its time is the recorded device's
     mTracker.take(record);
     const bool isBoot = record.kind == Record::Kind::kBoot;
-    if (isBoot) writeEnded(kAll);
-    if (record.at > mAt) writeEnded(record.at);
-    mAt = record.at;
+    writeEnded(isBoot ? EndedUses::kAll : record.at);
     if (isBoot && record.value == static_cast<int32_t>(trace::BootKind::kDevice)) {
         mHasTold = false;
         mIsClosed = false;
@@ -65,7 +61,7 @@ void JsonLines::take(const Record& record) {
     if (isShown(record.kind)) {
         writeRecord(record);
     } else if (record.kind == Record::Kind::kOver) {
-        writeEnded(kAll);
+        writeEnded(EndedUses::kAll);
     } else if (record.kind >= Record::Kind::kNote) {
         mHasNotes = true;
         writeCapture(record.at);
@@ -74,7 +70,7 @@ void JsonLines::take(const Record& record) {
 
 void JsonLines::end(bool) {
     mTracker.end();
-    writeEnded(kAll);
+    writeEnded(EndedUses::kAll);
 }
 
 template <typename Write>
@@ -134,12 +130,9 @@ void JsonLines::writeCapture(int64_t at) {
 }
 
 void JsonLines::writeEnded(int64_t before) {
-    std::sort(mEnded.begin(), mEnded.end(), day::isToldBefore);
-    auto use = mEnded.begin();
-    for (; use != mEnded.end() && use->to < before; ++use) {
-        if (mTracker.notes().namesSensors()) writeUse(*use);
-    }
-    mEnded.erase(mEnded.begin(), use);
+    mEnded.tell(before, [this](const day::Use& use) {
+        if (mTracker.notes().namesSensors()) writeUse(use);
+    });
     const auto& taken = mTracker.notes().taken();
     if (!taken || !mTracker.isClosed() || mIsClosed) return;
     mIsClosed = true;
@@ -180,14 +173,12 @@ void JsonLines::writeTaken(const trace::TakenNote& taken, int64_t at) {
     const day::Notes& notes = mTracker.notes();
     for (const trace::ChargeRow& row : taken.sinceCharge->rows) {
         const auto* packages = notes.packagesOf(row.uid);
-        const auto* sensor =
-                row.handle < 0 ? nullptr : notes.sensorOf(static_cast<uint32_t>(row.handle));
+        const std::string sensor = notes.nameOf(row);
         writeLine(at, [&](JsonWriter* json) {
             json->key("sinceCharge").beginObject().member("uid", row.uid);
             if (packages != nullptr) packagesMember(json, *packages);
             json->member("handle", row.handle);
-            if (row.handle == trace::kGpsHandle) json->member("sensor", "GPS");
-            if (sensor != nullptr) json->member("sensor", sensor->name);
+            if (!sensor.empty()) json->member("sensor", sensor);
             json->member("ms", row.ms).member("count", row.count);
             optionalMember(json, "backgroundMs", row.background);
             json->member("shared", row.shared);

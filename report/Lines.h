@@ -4,6 +4,7 @@
 #include <vector>
 
 #include "base/Json.h"
+#include "day/EndedUses.h"
 #include "day/UseTracker.h"
 #include "report/Report.h"
 #include "report/Stdout.h"
@@ -40,8 +41,7 @@ private:
     std::string mName;
     std::string mLine;
     day::UseTracker mTracker;
-    std::vector<day::Use> mEnded;  // and not told yet
-    int64_t mAt = 0;               // the clock, ns
+    day::EndedUses mEnded;
     bool mHasNotes = false;
     bool mHasTold = false;   // the capture, of the present device
     bool mIsClosed = false;  // what stands at the end of what is known has been told

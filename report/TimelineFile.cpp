@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "base/Calendar.h"
-#include "day/Coverage.h"
 #include "day/Payload.h"
 #include "report/AppNames.h"
 #include "report/DayRows.h"
