@@ -41,7 +41,7 @@ int memoryFile(const std::string& text) {
 FilePlayer::FilePlayer(const Options& options, Progress* progress)
       : mOptions(options),
         mProgress(progress) {
-    const size_t rows = options.all ? report::Table::kAllRows : report::Table::kShownRows;
+    const report::Looks looks{options.all, options.colours, options.columns};
     if (options.check) {
         add(std::make_unique<report::Check>(&mOut));
     } else if (!options.baseline.empty()) {
@@ -49,15 +49,14 @@ FilePlayer::FilePlayer(const Options& options, Progress* progress)
         if (options.json) {
             add(std::make_unique<report::CompareLines>(&mOut, baselines));
         } else {
-            add(std::make_unique<report::CompareSummary>(&mOut, baselines, rows));
+            add(std::make_unique<report::CompareSummary>(&mOut, baselines, looks));
         }
     } else if (options.json) {
         add(std::make_unique<report::JsonLines>(&mOut, options.inputs() > 1));
     } else if (options.log) {
         add(std::make_unique<report::LogLines>(&mOut));
     } else {
-        add(std::make_unique<report::Summary>(&mOut, options.all, options.colours,
-                                              options.columns));
+        add(std::make_unique<report::Summary>(&mOut, looks));
     }
 }
 

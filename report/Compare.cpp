@@ -102,8 +102,9 @@ std::string describeSide(const char* what, const std::vector<Profile>& side) {
     const auto format = [](int64_t ns) {
         return base::formatDuration(std::chrono::nanoseconds(ns));
     };
-    return text + ": " + format(covered) + " seen, display known for " + format(known) +
-           ", battery statistics of " + format(onBattery);
+    return text + ": " + format(covered) + " seen, " +
+           (known > 0 ? "display known for " + format(known) : "display not known") + ", " +
+           (onBattery > 0 ? "battery statistics of " + format(onBattery) : "no battery statistics");
 }
 
 Table differenceTable(size_t limit) {
@@ -215,11 +216,11 @@ std::optional<ComparisonText> ComparedSides::layOut(size_t limit) const {
 void CompareSummary::finish() {
     const auto text = sides().layOut(mLimit);
     if (!text) return;
-    for (const std::string& line : text->coverage) mOut->write(safe(line) + '\n');
+    for (const std::string& line : text->coverage) mTerminal.sentence(safe(line), 0);
     for (const ComparedPart& part : text->parts) {
         if (part.table.isEmpty() && part.sentence.empty()) continue;
-        mOut->write('\n' + (part.sentence.empty() ? part.heading : part.sentence) + '\n');
-        if (!part.table.isEmpty()) mOut->write(part.table.text(2));
+        mTerminal.heading(part.sentence.empty() ? part.heading : part.sentence);
+        if (!part.table.isEmpty()) mTerminal.table(part.table, 2);
     }
     mOut->flush();
 }

@@ -10,6 +10,7 @@
 #include "report/Report.h"
 #include "report/Stdout.h"
 #include "report/Table.h"
+#include "report/Terminal.h"
 
 namespace report {
 
@@ -66,16 +67,17 @@ private:
 /** The comparison for a person. */
 class CompareSummary : public Compare {
 public:
-    /** Tables show `limit` rows. */
-    CompareSummary(Stdout* out, size_t baselines, size_t limit)
+    CompareSummary(Stdout* out, size_t baselines, const Looks& looks)
           : Compare(baselines),
             mOut(out),
-            mLimit(limit) {}
+            mTerminal(out, looks),
+            mLimit(looks.rows()) {}
 
     void finish() override;
 
 private:
     Stdout* const mOut;
+    Terminal mTerminal;
     const size_t mLimit;
 };
 

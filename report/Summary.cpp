@@ -17,12 +17,6 @@
 
 namespace report {
 
-Summary::Summary(Stdout* out, bool showsAll, bool hasColours, std::optional<size_t> columns)
-      : mOut(out),
-        mLimit(showsAll ? Table::kAllRows : Table::kShownRows),
-        mHasColours(hasColours),
-        mColumns(columns) {}
-
 void Summary::begin(const std::string& name) {
     mJournal.begin(name);
     mStarted = realTime();
@@ -39,46 +33,45 @@ void Summary::end(bool isWhole) {
     printReports();
     printCauses();
     if (!mJournal.properties().empty()) {
-        printHeading("Stored at the end");
-        printTable(propertyTable(mJournal.properties()), 2);
+        mTerminal.heading("Stored at the end");
+        mTerminal.table(propertyTable(mJournal.properties()), 2);
     }
     printEnd(isWhole);
 }
 
 void Summary::printCaptures() {
-    const std::string name = safe(mJournal.name());
-    mOut->write(emphasised(mColumns ? cut(name, *mColumns) : name) + '\n');
-    for (const std::string& line : describeCaptures(mJournal)) printSentence(line, 2);
+    mTerminal.title(safe(mJournal.name()));
+    for (const std::string& line : describeCaptures(mJournal)) mTerminal.sentence(line, 2);
 }
 
 void Summary::printFindings() {
     if (!hasFindings(mJournal)) return;
-    printHeading("Findings");
+    mTerminal.heading("Findings");
     for (const std::string& sentence : describeFindings(mJournal)) {
-        printSentence("- " + sentence, 2);
+        mTerminal.sentence("- " + sentence, 2);
     }
 }
 
 void Summary::printOnNow(size_t capture) {
     const OnNowText text = describeOnNow(mJournal, capture, mLimit);
-    printHeading(kOnNowHeading);
-    for (const std::string& line : text.before) printSentence(line, 2);
-    if (!text.rows.isEmpty()) printTable(text.rows, 2);
-    for (const std::string& line : text.after) printSentence(line, 2);
+    mTerminal.heading(kOnNowHeading);
+    for (const std::string& line : text.before) mTerminal.sentence(line, 2);
+    if (!text.rows.isEmpty()) mTerminal.table(text.rows, 2);
+    for (const std::string& line : text.after) mTerminal.sentence(line, 2);
 }
 
 void Summary::printDay(const day::Day& day) {
-    printHeading(nameDay(mJournal, day));
-    printTable(dayTable(mJournal.table().rowsOf(day), mLimit), 2);
+    mTerminal.heading(nameDay(mJournal, day));
+    mTerminal.table(dayTable(mJournal.table().rowsOf(day), mLimit), 2);
 }
 
 void Summary::printSinceCharge(size_t capture) {
     const auto& taken = mJournal.captures()[capture].taken();
     if (!taken || !taken->sinceCharge) return;
     const ChargeText text = describeSinceCharge(mJournal, capture, mLimit);
-    printHeading(kChargeHeading);
-    printSentence(text.line, 2);
-    if (!text.rows.isEmpty()) printTable(text.rows, 2);
+    mTerminal.heading(kChargeHeading);
+    mTerminal.sentence(text.line, 2);
+    if (!text.rows.isEmpty()) mTerminal.table(text.rows, 2);
 }
 
 void Summary::printReports() {
@@ -88,14 +81,14 @@ void Summary::printReports() {
         (event.isAhead ? ahead : known).push_back(&event);
     }
     if (known.empty()) {
-        printHeading("The device reports nothing");
+        mTerminal.heading("The device reports nothing");
     } else {
-        printHeading("The device reports");
+        mTerminal.heading("The device reports");
         printEvents(known);
     }
     if (ahead.empty()) return;
-    printHeading("Would report, if nothing changed");
-    for (const std::string& line : describeBounds(mJournal)) printSentence(line, 2);
+    mTerminal.heading("Would report, if nothing changed");
+    for (const std::string& line : describeBounds(mJournal)) mTerminal.sentence(line, 2);
     printEvents(ahead);
 }
 
@@ -104,7 +97,7 @@ void Summary::printEvents(const std::vector<const day::Event*>& events) {
     std::optional<day::Day> last;
     for (const day::Event* event : events) {
         const day::Day day{event->boot, event->at / base::kNsPerDay};
-        if (!last || *last < day) printName(nameDay(mJournal, day), 2);
+        if (!last || *last < day) mTerminal.name(nameDay(mJournal, day), 2);
         last = day;
         printEvent(*event);
     }
@@ -112,19 +105,19 @@ void Summary::printEvents(const std::vector<const day::Event*>& events) {
 
 void Summary::printEvent(const day::Event& event) {
     const EventText text = layOutEvent(event, mLimit);
-    printName(text.title, 4);
-    for (const auto& [what, value] : text.values) printName(what + ": " + value, 6);
-    for (const Table& list : text.lists) printTable(list, 6);
+    mTerminal.name(text.title, 4);
+    for (const auto& [what, value] : text.values) mTerminal.name(what + ": " + value, 6);
+    for (const Table& list : text.lists) mTerminal.table(list, 6);
 }
 
 void Summary::printCauses() {
     const auto causes = describeCauses(mJournal.causes());
     if (causes.empty()) return;
-    printHeading("Why times held and times reported differ");
+    mTerminal.heading("Why times held and times reported differ");
     for (const auto& [text, names] : causes) {
-        printSentence(text + ":", 2);
+        mTerminal.sentence(text + ":", 2);
         const size_t shown = std::min(names.size(), mLimit);
-        for (size_t i = 0; i < shown; ++i) printName(safe(names[i]), 4);
+        for (size_t i = 0; i < shown; ++i) mTerminal.name(safe(names[i]), 4);
         if (shown < names.size()) {
             mOut->write("    and " + std::to_string(names.size() - shown) + " more\n");
         }
@@ -139,30 +132,6 @@ void Summary::printEnd(bool isWhole) {
                 count(mJournal.boots().size(), "boot") + ", " +
                 base::formatDuration(std::chrono::nanoseconds(mJournal.played())) +
                 " of the device's time, in " + seconds + " s.\n\n");
-}
-
-void Summary::printHeading(const std::string& text) {
-    mOut->write('\n' + emphasised(text) + '\n');
-}
-
-void Summary::printTable(const Table& table, size_t indent) {
-    mOut->write(table.text(indent, mColumns));
-}
-
-void Summary::printName(const std::string& text, size_t indent) {
-    mOut->write(std::string(indent, ' ') + (mColumns ? cut(text, *mColumns - indent) : text) +
-                '\n');
-}
-
-void Summary::printSentence(const std::string& text, size_t indent) {
-    const auto lines = mColumns ? wrap(text, *mColumns - indent - 2) : std::vector{text};
-    for (const std::string& line : lines) {
-        mOut->write(std::string(&line == lines.data() ? indent : indent + 2, ' ') + line + '\n');
-    }
-}
-
-std::string Summary::emphasised(const std::string& text) const {
-    return mHasColours ? "\x1b[1m" + text + "\x1b[0m" : text;
 }
 
 }  // namespace report

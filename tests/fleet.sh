@@ -42,7 +42,9 @@ diff - used <<'END'
 END
 
 # The same of uses: those of `--uses` are those of the lines.
-grep -v broken list | tr '\n' '\0' >sound
+mkdir -p reports/16/2024-03-05
+cp "$folder/examples/what-is-on.capture.txt" reports/16/2024-03-05/new.txt
+find reports -type f ! -name broken.txt -print0 | sort -z >sound
 xargs -0 bin/sensor-replay --uses uses.csv <sound >/dev/null
 xargs -0 bin/sensor-replay --json <sound >lines.jsonl
 askUses() {
@@ -50,11 +52,29 @@ askUses() {
 }
 printf '.mode list\n.headers off\nselect count(*) from use_day;\n' | askUses >counted
 grep -c '"use": ' lines.jsonl | diff - counted
+# One that is on through a night, and one that is just not.
+printf 'reports/%s,,,night,n,,Clock,1,,,,n,2024-03-%s,2024-03-%s,,,0,off,1,,,,1,0,,\r\n' \
+    9/x/a 01T23:00:00 02T04:00:00 8/x/b 02T02:00:01 03T03:59:59 >>uses.csv
 awk '/^```sql uses$/ { name = NR ".uses"; next } /^```$/ { name = "" } name { print > name }' \
     "$folder/docs/many-captures.md"
 for question in *.uses; do
-    askUses <"$question" >answer || { printf 'no answer to line %s\n' "${question%.uses}" && exit 1; }
-done
+    printf '.headers off\n.mode list\n' | cat - "$question" | askUses
+done >answers
+diff - answers <<'END'
+com.example.chat|Example Accelerometer|1|0.38
+com.example.fitness|Example Step Counter|1|0.38
+com.example.game|Example Gyroscope|1|0.38
+android|Example Motion Detector|1|0.24
+com.example.map|Example Accelerometer|1|0.14
+android|Example Proximity|1|0.0
+16|com.example.chat|Example Accelerometer|0.38
+16|com.example.fitness|Example Step Counter|0.38
+16|com.example.game|Example Gyroscope|0.38
+16|android|Example Motion Detector|0.24
+16|com.example.map|Example Accelerometer|0.14
+16|android|Example Proximity|0.0
+9|Clock|1
+END
 
 # Each question of the page has an answer.
 awk '/^```sql$/ { name = NR ".sql"; next } /^```$/ { name = "" } name { print > name }' \
