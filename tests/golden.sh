@@ -1,7 +1,9 @@
 #!/bin/sh
 # Plays examples with the tool and compares what it makes of them with the golden files beside each:
 #   golden.sh [--update] TOOL EXAMPLE...
-# NAME.golden is there for each example. NAME.summary, NAME.timeline and NAME.page are there for some.
+# NAME.golden is there for each example. NAME.summary, NAME.timeline, NAME.page, NAME.uses and
+# NAME.since-charge are there for some. Of X.after.Y, X.after.Y.compared holds it against X.before.Y,
+# and X.after.Y.timelines has both.
 # With --update a golden file that differs is replaced, and named.
 set -eu
 update=
@@ -41,5 +43,20 @@ for example; do
         sed -i -e '/^<style>/,/^<\/style>/d' -e '/^<script type="module">/,/^<\/script>/d' \
             -e "s|sha256-[^']*|sha256-...|g" "$made"
         compare "$name.page"
+    fi
+    for table in uses since-charge; do
+        [ -f "$name.$table" ] || continue
+        "$tool" "--$table" "$made" "$name" >/dev/null
+        compare "$name.$table"
+    done
+    before=${name%%.after.*}.before.${name#*.after.}
+    if [ -f "$name.compared" ]; then
+        "$tool" --baseline "$before" "$name" >"$made"
+        "$tool" --json --baseline "$before" "$name" >>"$made"
+        compare "$name.compared"
+    fi
+    if [ -f "$name.timelines" ]; then
+        "$tool" --timeline "$made" "$before" "$name" >/dev/null
+        compare "$name.timelines"
     fi
 done
