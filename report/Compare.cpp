@@ -108,12 +108,12 @@ std::string describeSide(const char* what, const std::vector<Profile>& side) {
 }
 
 Table differenceTable(size_t limit) {
-    return Table({{"Difference", Table::Column::kRight},
+    return Table({{"App", Table::Column::kCut},
+                  {"Sensor", Table::Column::kCut},
                   {"Old", Table::Column::kRight},
                   {"New", Table::Column::kRight},
-                  {"per"},
-                  {"App", Table::Column::kCut},
-                  {"Sensor", Table::Column::kCut},
+                  {"Difference", Table::Column::kRight},
+                  {"Per"},
                   {"Why", Table::Column::kCut}},
                  limit);
 }
@@ -123,14 +123,14 @@ void addRow(const Difference& difference, Table* table) {
     for (const day::Change& change : difference.changes) {
         why.append(why.empty() ? "" : ", ").append(textOf(change));
     }
-    table->add({formatSize(difference), formatSpread(difference.before),
-                formatSpread(difference.after), std::string(wordsOf(difference.per).title),
-                difference.key.first, nameOf(difference), why});
+    table->add({difference.key.first, nameOf(difference), formatSpread(difference.before),
+                formatSpread(difference.after), formatSize(difference),
+                std::string(wordsOf(difference.per).title), why});
 }
 
 ComparedPart partOf(const day::Comparison& comparison, ChangeState state,
                     const std::string& heading, size_t limit) {
-    ComparedPart part{heading, differenceTable(limit), {}};
+    ComparedPart part{heading, "Time held in an hour", differenceTable(limit), {}};
     for (const Difference& each : comparison.differences) {
         if (each.state == state) addRow(each, &part.table);
     }
@@ -152,6 +152,7 @@ std::string describe(const std::optional<trace::Sensor>& sensor) {
 
 ComparedPart sensorsPart(const day::Comparison& comparison, size_t limit) {
     ComparedPart part{"Sensors that differ",
+                      "What the device's lists say",
                       Table({{"Sensor", Table::Column::kCut}, {"Old"}, {"New"}}, limit),
                       {}};
     for (const auto& [before, after] : comparison.sensors) {
@@ -163,6 +164,7 @@ ComparedPart sensorsPart(const day::Comparison& comparison, size_t limit) {
 
 ComparedPart propertiesPart(const day::Comparison& comparison, size_t limit) {
     ComparedPart part{"Stored values that differ",
+                      "Properties",
                       Table({{"Property", Table::Column::kCut}, {"Old"}, {"New"}}, limit),
                       {}};
     for (const auto& [name, before, after] : comparison.properties) {

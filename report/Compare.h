@@ -17,6 +17,7 @@ namespace report {
 /** A part of a comparison: a heading, and a table or a sentence. */
 struct ComparedPart {
     std::string heading;
+    std::string caption;  // of the table
     Table table;
     std::string sentence;  // where the table is empty
 };

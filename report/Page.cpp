@@ -78,7 +78,7 @@ page::Section comparisonSection(const ComparisonText& text) {
         if (part.table.isEmpty()) continue;
         page::Section& shown = section.parts.emplace_back();
         shown.heading = part.heading;
-        shown.tables.push_back(page::tableOf(part.table, "compared", part.heading));
+        shown.tables.push_back(page::tableOf(part.table, "compared", part.caption));
     }
     return section;
 }

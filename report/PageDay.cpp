@@ -14,7 +14,6 @@
 #include "report/EventText.h"
 #include "report/Text.h"
 #include "report/page/TableOf.h"
-#include "trace/TraceTime.h"
 
 namespace report {
 
@@ -66,6 +65,30 @@ std::string factsOf(const Use& use) {
     return text;
 }
 
+/** The last row of a day's table: what of the others can be added up. */
+std::vector<page::Cell> totalOf(const std::vector<day::DayRow>& rows, const page::Table& table) {
+    day::DayRow total;
+    for (const day::DayRow& row : rows) {
+        total.held += row.held;
+        total.display.known += row.display.known;
+        total.display.on += row.display.on;
+        total.enables += row.enables;
+        total.isBefore = total.isBefore || row.isBefore;
+        total.isUnseen = total.isUnseen || row.isUnseen;
+        total.samples = total.samples.value_or(0) + row.samples.value_or(0);
+    }
+    std::vector<page::Cell> cells;
+    for (const page::Column& column : table.columns) {
+        cells.push_back({column.key == "app"       ? "In all"
+                         : column.key == "held"    ? formatHeld(total)
+                         : column.key == "display" ? formatDisplay(total.display)
+                         : column.key == "enables" ? std::to_string(total.enables)
+                         : column.key == "samples" ? formatSamples(total.samples)
+                                                   : ""});
+    }
+    return cells;
+}
+
 /** A day while it is made. */
 class DayMaker {
 public:
@@ -98,15 +121,6 @@ private:
     /** What of a span of the clock lies in the day, counted from its midnight. */
     Span inDay(Span span) const { return cut({span.from - mMidnight, span.to - mMidnight}, kDay); }
 
-    /** Of a note, which may hold any number. */
-    static int64_t toNs(int64_t ms) {
-        return std::clamp<int64_t>(ms, 0, trace::kMaxTimeMs) * base::kNsPerMs;
-    }
-
-    Span inDay(const trace::Interval& each) const {
-        return inDay(Span{toNs(each.from), toNs(each.to)});
-    }
-
     /** A state that is on from `first` to `last`. `known` bounds what is known; null: nothing does.
      */
     page::Band bandOf(const std::vector<day::StateSpan>& states,
@@ -115,7 +129,7 @@ private:
         std::vector<Span> bounds{kDay};
         if (known != nullptr) {
             bounds.clear();
-            for (const trace::Interval& each : *known) bounds.push_back(inDay(each));
+            for (const Span& each : day::spansOf(*known)) bounds.push_back(inDay(each));
         }
         page::Band band;
         int64_t end = 0;  // of what is made
@@ -135,22 +149,12 @@ private:
         return band;
     }
 
-    void addUnseen(Span span) {
-        if (!isEmpty(span)) mResult.unseen.push_back({span.from, span.to});
-    }
-
     void addUnseen() {
-        int64_t from = mBoot.span.from;
-        int64_t to = mBoot.span.to;
-        if (mNotes != nullptr) {
-            from = toNs(mNotes->capture()->from);
-            to = std::min(to, mNotes->knownTo().value_or(to));
+        std::vector<Span> seen;
+        for (const Span& span : mBoot.seen) seen.push_back(inDay(span));
+        for (const Span& span : day::without(kDay, seen)) {
+            mResult.unseen.push_back({span.from, span.to});
         }
-        addUnseen(cut({0, from - mMidnight}, kDay));
-        if (mNotes != nullptr) {
-            for (const trace::Interval& gap : mNotes->gaps()) addUnseen(inDay(gap));
-        }
-        addUnseen(cut({to - mMidnight, base::kNsPerDay}, kDay));
     }
 
     void addMarks() {
@@ -169,6 +173,7 @@ private:
         if (rows.empty()) return;
         mResult.uses =
                 page::tableOf(dayTable(rows, Table::kAllRows), "uses", "Who held which sensor");
+        if (rows.size() > 1) mResult.uses->total = totalOf(rows, *mResult.uses);
         std::map<day::HolderKey, std::vector<const Use*>> byRow;
         for (const Use& use : mJournal.uses()) {
             if (use.boot != mDay.boot || use.from >= mMidnight + base::kNsPerDay) continue;

@@ -1,6 +1,6 @@
 #!/bin/sh
-# Checks the page, its script and its looks, in a real browser: browser.sh TOOL EXAMPLE...
-# The first example is phone-day.jsonl. The packages that this takes from npm come to the folder
+# Checks the page, its script and its looks, in a real browser: browser.sh TOOL DAY BEFORE AFTER
+# DAY is phone-day.jsonl, the others are captures to compare. The packages that this takes from npm come to the folder
 # page-tools beside TOOL, and are no part of the project.
 set -eu
 tests=$(cd "$(dirname "$0")" && pwd)

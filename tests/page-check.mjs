@@ -1,6 +1,7 @@
 // Works with the page in chromium as a person would: page-check.mjs TOOL AXE FOLDER EXAMPLE...
-// TOOL is sensor-replay, AXE the file axe.js, FOLDER an empty one. The first example must be
-// phone-day.jsonl, of which it is known what the page shows. Runs on Node 18.
+// TOOL is sensor-replay, AXE the file axe.js, FOLDER an empty one. The examples must be
+// phone-day.jsonl, of which it is known what the page shows, and two captures: of before an update
+// and of after it. Runs on Node 18.
 import assert from 'node:assert/strict';
 import {execFileSync} from 'node:child_process';
 import {readFileSync, writeFileSync} from 'node:fs';
@@ -12,10 +13,11 @@ import {Browser} from './page-browser.mjs';
 const [tool, axeFile, folder, ...examples] = process.argv.slice(2).map((path) => resolve(path));
 const axe = readFileSync(axeFile, 'utf8');
 
-/** Makes the page of an input, and a copy that has no script; their addresses. */
-function makePage(input) {
-  const path = join(folder, `${basename(input)}.html`);
-  execFileSync(tool, ['--page', path, basename(input)], {cwd: dirname(input)});
+/** Makes the page of inputs of one folder, and a copy that has no script; their addresses. */
+function makePage(name, inputs, ...options) {
+  const path = join(folder, `${name}.html`);
+  execFileSync(tool, ['--page', path, ...options, ...inputs.map((input) => basename(input))],
+    {cwd: dirname(inputs[0])});
   const html = readFileSync(path, 'utf8');
   const still = html.replace(/<script type="module">.*?<\/script>/s, '');
   assert.notEqual(still, html);
@@ -44,6 +46,8 @@ function makeBusyDay() {
 // Bodies of functions that run in the page.
 const CELLS = `return [...document.querySelectorAll('caption, tbody tr:not(.out), tfoot tr')]
   .map((each) => [...each.cells || [each]].map((cell) => cell.textContent).join(' | '))`;
+const TOTALS = `return [...document.querySelectorAll('.day tfoot tr')].map((row) =>
+  [...row.cells].map((cell) => cell.textContent).join(' | '))`;
 const ROWS = `return [...document.querySelectorAll('.day')].map((day) =>
   [...day.querySelectorAll('tbody tr:not(.out)')].map((row) =>
     [...row.cells].slice(0, 3).map((cell) => cell.textContent).join(' | ')))`;
@@ -142,6 +146,47 @@ async function checkKeys(browser, page) {
     document.querySelectorAll('.lane.use .track')[1]`), true);
 }
 
+/** What was on between nine and a quarter past ten, from the start of the page by keys alone. */
+async function checkKeysAlone(browser, page) {
+  for (const width of [1280, 390]) {
+    await browser.open(page.live, {width});
+    await browser.type('\uE004\uE0049\uE00410:15\uE007');  // past the filter; Enter
+    await browser.until('times', `location.hash.includes('to=10%3A15')`);
+    assert.equal(await browser.run(TOLD), 'Shown: 09:00:00 to 10:15:00');
+    assert.deepEqual((await browser.run(ROWS))[0],
+      ['com.example.run | accelerometer | 1:15:00', '<script>alert("x")</script>& | accelerometer | 0:30:00']);
+    assert.match((await browser.run(TOTALS))[0], /^In all \|  \| 1:45:00 \|/);
+    assert.match((await browser.run(CELLS)).join(), /09:00:00 to 10:15:00, 0:00:00 seen, 0 of/);
+  }
+}
+
+/** Several inputs have a table of contents; the comparison with a baseline stands before them. */
+async function checkSeveral(browser, [before, after]) {
+  const page = makePage('compared', [after], '--baseline', basename(before));
+  await checkLooks(browser, page, 'compared');
+  await browser.open(page.live);
+  const ask = (selector) => browser.run(`return [...document.querySelectorAll('${selector}')]
+    .map((each) => each.textContent)`);
+  assert.deepEqual(await ask('nav a'), [basename(before), basename(after)]);
+  assert.deepEqual(await ask('main h2'), ['Old against new', basename(before), basename(after)]);
+  await browser.click('nav li:nth-child(2) a');
+  assert.ok(Math.abs(await browser.run(
+    `return document.getElementById('input-2').getBoundingClientRect().top`)) < 120);
+
+  // Sorted by the difference, upwards: what fell most comes first.
+  const gone = 'main > table:nth-of-type(3)';
+  const differences = () => ask(`${gone} tbody td:nth-child(5)`);
+  assert.deepEqual(await differences(), ['-0:04:54', '-0:04:40', '-0:04:40', '-0:04:12']);
+  await browser.run(`document.querySelector('${gone} th[data-key=difference] button').click()`);
+  await browser.run(`document.querySelector('${gone} th[data-key=difference] button').click()`);
+  assert.equal((await differences())[0], '-0:04:12');
+
+  // One filter for all inputs.
+  await browser.type('/game');
+  await browser.until('filter', `location.hash.includes('filter=game')`);
+  assert.deepEqual((await browser.run(ROWS)).map((rows) => rows.length), [0, 1]);
+}
+
 /** Points on the track of the accelerometer's lane, by their shares of its width. */
 async function trackOf(browser) {
   const [x, y, width] = await browser.run(`const track = document.querySelector(
@@ -214,12 +259,14 @@ async function checkPrint(browser, page) {
 
 const browser = await Browser.start(join(folder, 'profile'));
 try {
-  const pages = examples.map(makePage);
-  for (const check of [checkFilter, checkTimes, checkKeys, checkPointers, checkHostile, checkPrint]) {
-    await check(browser, pages[0]);
+  const page = makePage('day', [examples[0]]);
+  for (const check of [checkFilter, checkTimes, checkKeys, checkKeysAlone, checkPointers,
+    checkHostile, checkPrint]) {
+    await check(browser, page);
   }
-  for (const [i, page] of pages.entries()) await checkLooks(browser, page, basename(examples[i]));
-  await checkBusyDay(browser, makePage(makeBusyDay()));
+  await checkLooks(browser, page, 'day');
+  await checkSeveral(browser, examples.slice(1));
+  await checkBusyDay(browser, makePage('busy', [makeBusyDay()]));
 } finally {
   await browser.stop();
 }

@@ -77,8 +77,8 @@ public:
             mId("input-" + std::to_string(number)) {}
 
     std::string make() {
-        mHtml = "<section class=\"input\"" + attribute("aria-labelledby", mId) + ">\n" +
-                element("h2", mInput.name, attribute("id", mId));
+        mHtml = "<section class=\"input\"" + attribute("aria-labelledby", mId) + ">\n" + "<h2" +
+                attribute("id", mId) + '>' + breakable(mInput.name) + "</h2>\n";
         for (const std::string& line : mInput.lines) {
             mHtml += element("p", line, " class=\"facts-of-file\"");
         }
@@ -108,7 +108,7 @@ private:
 
     void addList(const std::vector<std::string>& items) {
         mHtml += "<ul>\n";
-        for (const std::string& item : items) mHtml += element("li", item);
+        for (const std::string& item : items) mHtml += "<li>" + breakable(item) + "</li>\n";
         mHtml += "</ul>\n";
     }
 
@@ -172,16 +172,6 @@ private:
                      tag + '>';
         }
         mHtml += "</tr>\n";
-    }
-
-    /** A name as markup that may break where its parts meet. */
-    static std::string breakable(const std::string& name) {
-        std::string html;
-        for (const char c : escape(name)) {
-            html += c;
-            if (c == '.' || c == '/' || c == '$') html += "<wbr>";
-        }
-        return html;
     }
 
     static std::string classOf(const Column& column) {

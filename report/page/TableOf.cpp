@@ -28,14 +28,15 @@ std::string keyOf(std::string_view title) {
 std::optional<double> valueOf(const std::string& text) {
     const size_t start = text.find_first_of("0123456789");
     if (start == std::string::npos) return {};
+    const int sign = text[0] == '-' ? -1 : 1;
     const char* at = text.c_str() + start;
     double value = 0;
     while (true) {
         char* end = nullptr;
         value += std::strtod(at, &end);
-        if (*end == 'k') return value * 1e3;
-        if (*end == 'M') return value * 1e6;
-        if (*end != ':') return value;
+        if (*end == 'k') return sign * value * 1e3;
+        if (*end == 'M') return sign * value * 1e6;
+        if (*end != ':') return sign * value;
         value *= 60;
         at = end + 1;
     }

@@ -14,8 +14,8 @@ let chosen = {};  // lane and index of the slice whose facts are told
 
 const byId = (id) => document.getElementById(id);
 const clamp = (value, low, high) => Math.min(Math.max(value, low), high);
-const isHome = () => view.from === home.from && view.to === home.to;
 const length = () => view.to - view.from;
+const isHome = () => length() === home.to - home.from;
 const isOutside = (from, to) => from >= view.to || (from < view.from && to <= view.from);
 const is = (slice, style) => slice.style.split(' ').includes(style);
 const tell = (text) => { byId('telling').textContent = text; };
@@ -64,15 +64,14 @@ function takeTable(element) {
     const names = [...row.querySelectorAll('.who')].map((cell) => cell.textContent);
     return {element: row, names, words: names.join(' ').toLowerCase()};
   });
-  const {kind} = element.dataset;
+  const {caption, dataset: {kind}} = element;
   const keys = heads.map((cell) => cell.dataset.key);
   heads.forEach((cell, i) => {
     const button = make('button', {type: 'button'}, cell.textContent);
     button.onclick = () => sortBy(kind, keys[i]);
     cell.replaceChildren(button);
   });
-  const caption = element.caption.textContent;
-  tables.push({element, heads, rows, order: rows, kind, keys, caption});
+  tables.push({element, heads, rows, order: rows, kind, keys, caption: caption.textContent});
 }
 
 // How much of the time up to a moment the spans cover, which are in order.
@@ -101,7 +100,7 @@ function takeDay(data, section) {
   const table = tables.find((each) => each.element === section.querySelector('table'));
   const day = {data, back, axis, bands, table, shown: [], lanes: section.querySelector('.lanes'),
     leftOut: section.querySelector('.left-out'), isOn: coverage(data.on),
-    isUnknown: coverage(data.unknown)};
+    isUnknown: coverage(data.unknown), isUnseen: coverage(data.unseen)};
   days.push(day);
   if (!table) return;
   table.day = day;
@@ -128,7 +127,7 @@ function openLane(lane) {
   }
   lane.element.lane = lane;
   const track = lane.element.querySelector('.track');
-  put(track, {'tabindex': 0, 'role': 'application',
+  put(track, {tabindex: 0, role: 'application',
     'aria-label': `${lane.name}: ${lane.slices.length}, arrow keys lead from one to the next`});
   lane.svg = track.firstElementChild;
   watcher.observe(lane.element);
@@ -199,18 +198,19 @@ function drawDay({data, back, axis}) {
 // The view. A change is drawn at once; totals and the address follow when it is over.
 
 let [frame, timer] = [0, 0];
-
 function change() {
   frame = frame || requestAnimationFrame(drawAll);
   clearTimeout(timer);
   timer = setTimeout(settle, 120);
 }
 
+const lanesOf = (day) => [...day.bands, ...day.shown];
+
 function drawAll() {
   frame = 0;
   for (const day of days) {
     drawDay(day);
-    [...day.bands, ...day.shown].filter((lane) => lane.isSeen).forEach(drawLane);
+    lanesOf(day).filter((lane) => lane.isSeen).forEach(drawLane);
   }
 }
 
@@ -260,7 +260,7 @@ function addUp(day, slices) {
 function write(table, row, sum) {
   for (const [key, column] of Object.entries(COLUMNS)) {
     const cell = row.cells[table.keys.indexOf(key)];
-    if (!cell || sum[key] === undefined) continue;
+    if (!cell) continue;
     const [text, value] = column(sum);
     if (cell.textContent !== text) cell.textContent = text;
     cell.dataset.value = value;
@@ -268,13 +268,12 @@ function write(table, row, sum) {
 }
 
 function total(table) {
-  const all = {held: 0, enables: 0, samples: 0, marks: 0};
+  const all = {held: 0, known: 0, on: 0, enables: 0, samples: 0, marks: 0};
   for (const row of table.rows) {
     row.sum = addUp(table.day, row.lane.slices);
-    write(table, row.element, {...row.sum, display: true});
+    write(table, row.element, row.sum);
     if (!row.isFound) continue;
-    for (const key of ['held', 'enables']) all[key] += row.sum[key];
-    all.samples += row.sum.samples || 0;
+    for (const key of ['held', 'known', 'on', 'enables', 'samples']) all[key] += row.sum[key] || 0;
     all.marks |= row.sum.marks;
   }
   if (table.element.tFoot) write(table, table.element.tFoot.rows[0], all);
@@ -311,13 +310,17 @@ function settleTable(table) {
   const shown = order.filter(isShown).length;
   for (const row of order) row.element.classList.toggle('out', !isShown(row));
   const parts = [table.caption];
-  if (table.day && !isHome()) parts.push(`${clock(view.from)} to ${clock(view.to)}`);
+  if (table.day && !isHome()) {
+    const unseen = table.day.isUnseen(view.to) - table.day.isUnseen(view.from);
+    parts.push(`${clock(view.from)} to ${clock(view.to)}`);
+    if (unseen) parts.push(`${duration(length() - unseen)} seen`);
+  }
   if (shown < table.rows.length) parts.push(`${shown} of ${table.rows.length} rows`);
   table.element.caption.textContent = parts.join(', ');
 }
 
 function settleDay(day) {
-  const found = day.table ? day.table.order.filter((row) => row.isFound) : [];
+  const found = (day.table?.order || []).filter((row) => row.isFound);
   const lanes = found.slice(0, MOST_LANES).map((row) => row.lane);
   if (lanes.length !== day.shown.length || lanes.some((lane, i) => lane !== day.shown[i])) {
     day.lanes.replaceChildren(...lanes.map((lane) => lane.element || openLane(lane).element));
@@ -325,16 +328,14 @@ function settleDay(day) {
   }
   lanes.forEach(findBars);
   const drawn = lanes.flatMap((lane) => lane.bars);
-  const bars = drawn.length;
   const slices = drawn.reduce((sum, bar) => sum + bar.last - bar.first + 1, 0);
   const more = found.length - lanes.length;
-  const close = `${slices} uses are drawn as ${bars} bars, too close to tell apart: zoom in. `;
+  const close = `${slices} uses are drawn as ${drawn.length} bars, too close to tell apart. `;
   const many = `${more} more rows are not drawn: filter or sort.`;
-  day.leftOut.textContent = (slices > bars ? close : '') + (more > 0 ? many : '');
+  day.leftOut.textContent = (slices > drawn.length ? close : '') + (more > 0 ? many : '');
 }
 
 function settle() {
-  clearTimeout(timer);
   tables.forEach(settleTable);
   days.forEach(settleDay);
   for (const id of ['from', 'to']) put(byId(id), {'aria-invalid': false}).value = clock(view[id]);
@@ -361,8 +362,7 @@ function readAddress() {
     const key = state.get(`sort-${kind}`);
     if (key && keys.includes(key.replace('-', ''))) sorts.set(kind, key);
   }
-  if (from < to) show(from, to);
-  else show(home.from, home.to);
+  show(...(from < to ? [from, to] : [home.from, home.to]));
 }
 
 // A click sorts upwards, the next one downwards, the third not at all.
@@ -385,12 +385,12 @@ function choose(lane, index) {
 
 function step(lane, by) {
   const bar = chosen.lane === lane && barAt(lane, chosen.index);
-  const outmost = lane.bars[by > 0 ? 0 : lane.bars.length - 1] || {first: 0};
+  const outmost = lane.bars.at(by > 0 ? 0 : -1) || {first: 0};
   const next = by > 0 ? bar.last + 1 : bar.first - 1;
   choose(lane, clamp(bar ? next : outmost.first, 0, lane.slices.length - 1));
 }
 
-const laneOf = (element) => element.closest('.track') && element.closest('.lane').lane;
+const laneOf = (element) => element.closest('.track')?.parentElement.lane;
 
 const ACTIONS = {
   in: () => zoom(1 / 2),
@@ -409,13 +409,13 @@ function takeKey(event) {
   const by = {ArrowLeft: -1, ArrowRight: 1}[event.key];
   if (event.key === '/') byId('filter').focus();
   else if (lane && by) step(lane, by);
-  else if (KEYS[event.key]) act(KEYS[event.key]);
+  else if (KEYS[event.key]) act(ACTIONS[KEYS[event.key]]);
   else return;
   event.preventDefault();
 }
 
-function act(name) {
-  ACTIONS[name]();
+function act(action) {
+  action();
   tell(`Shown: ${clock(view.from)} to ${clock(view.to)}`);
 }
 
@@ -427,7 +427,7 @@ let hasMoved = false;
 function drag(lane, {pointerId, clientX}, before, momentAt, width) {
   if (!hasMoved && Math.abs(clientX - before) < 4) return;
   hasMoved = true;
-  lane.svg.parentElement.setPointerCapture(pointerId);
+  lane.svg.setPointerCapture(pointerId);
   pointers.set(pointerId, clientX);
   const other = [...pointers].find(([id]) => id !== pointerId);
   const apart = (x) => Math.max(Math.abs(x - other[1]), 10);
@@ -464,7 +464,7 @@ function takeTimes() {
   const [from, to] = ['from', 'to'].map((id) => moment(byId(id).value));
   put(byId('from'), {'aria-invalid': isNaN(from)});
   put(byId('to'), {'aria-invalid': !(to > from)});
-  if (from < to) show(from, to);
+  if (from < to) act(() => show(from, to));
 }
 
 function start() {
@@ -478,8 +478,8 @@ function start() {
     data.days.forEach((day, i) => takeDay(day, sections[i]));
   }
   document.documentElement.classList.add('live');
-  for (const each of document.querySelectorAll('.controls, .keys')) each.hidden = days.length === 0;
-  for (const name of Object.keys(ACTIONS)) byId(name).onclick = () => act(name);
+  for (const each of document.querySelectorAll('.controls, .keys')) each.hidden = !days.length;
+  for (const name of Object.keys(ACTIONS)) byId(name).onclick = () => act(ACTIONS[name]);
   byId('controls').onsubmit = (event) => event.preventDefault();
   byId('filter').oninput = ({target}) => {
     view.words = target.value;
@@ -491,7 +491,7 @@ function start() {
     document.addEventListener(type, takePointer, {passive: false});
   }
   window.onhashchange = readAddress;
-  window.onbeforeprint = () => days.forEach((day) => day.shown.forEach(drawLane));
+  window.onbeforeprint = () => days.flatMap(lanesOf).forEach(drawLane);
   show(home.from, home.to);
   readAddress();
   settle();
