@@ -252,7 +252,7 @@ function addUp(day, slices) {
     sum.enables += use.enables.filter((at) => !isOutside(at, at)).length;
     sum.samples += use.rate === null ? NaN : (to - from) / 1000 * use.rate;
     if (use.from >= view.from && is(use, 'before')) sum.marks |= 1;
-    if (use.to <= view.to && is(use, 'unseen')) sum.marks |= 2;
+    if (is(use, 'unseen')) sum.marks |= 2;
   }
   return sum;
 }
