@@ -201,7 +201,7 @@ private:
         part.span = {span.from, span.to};
         part.isBefore = use.before && use.from >= mMidnight;
         const bool isEnd = use.to <= mMidnight + base::kNsPerDay;
-        if (isEnd && use.end == day::End::kUnseen) part.end = page::Use::End::kUnseen;
+        if (use.end == day::End::kUnseen) part.end = page::Use::End::kUnseen;
         if (isEnd && use.end == day::End::kOn) part.end = page::Use::End::kOn;
         if (isContinuous(use)) part.rate = day::rateOf(use);
         for (const day::Enable& enable : use.enables) {

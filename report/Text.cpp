@@ -81,22 +81,20 @@ std::string cut(const std::string& text, size_t columns) {
 
 std::vector<std::string> wrap(const std::string& text, size_t columns) {
     std::vector<std::string> lines;
-    std::string_view rest = text;
-    while (width(rest) > columns) {
-        std::string_view next = rest;
-        size_t end = 0;    // of what fits
-        size_t blank = 0;  // the last one in it
-        for (size_t passed = 0;; end = rest.size() - next.size()) {
-            if (end > 0 && rest[end] == ' ') blank = end;
-            passed += columnsOf(takeCharacter(&next));
-            if (passed > columns) break;
+    size_t room = 0;  // in the last line
+    for (size_t start = 0; start <= text.size();) {
+        const size_t end = std::min(text.find(' ', start), text.size());
+        const std::string word = cut(text.substr(start, end - start), columns);
+        const size_t needed = width(word);
+        if (!lines.empty() && needed < room) {
+            lines.back().append(" ").append(word);
+            room -= needed + 1;
+        } else {
+            lines.push_back(word);
+            room = columns - needed;
         }
-        if (blank > 0) end = blank;
-        lines.emplace_back(rest.substr(0, std::max<size_t>(end, 1)));
-        rest.remove_prefix(std::max<size_t>(end, 1));
-        if (blank > 0) rest.remove_prefix(1);
+        start = end + 1;
     }
-    lines.emplace_back(rest);
     return lines;
 }
 

@@ -21,8 +21,8 @@ size_t width(std::string_view text);
 std::string cut(const std::string& text, size_t columns);
 
 /**
- * `text`, made by `safe`, as lines of at most `columns` columns: broken at blanks, and where there
- * is none.
+ * `text`, made by `safe`, as lines of at most `columns` columns: broken at blanks. A longer word
+ * loses its middle.
  */
 std::vector<std::string> wrap(const std::string& text, size_t columns);
 

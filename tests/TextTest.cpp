@@ -110,8 +110,8 @@ TEST(TextTest, ASentenceIsBrokenAtItsBlanks) {
             {"", {""}},
             {"one two", {"one two"}},
             {"one two three", {"one two", "three"}},
-            {"one twothreefour", {"one", "twothre", "efour"}},
-            {"\u4e00\u4e8c\u4e09\u56db", {"\u4e00\u4e8c\u4e09", "\u56db"}},
+            {"one twothreefour 5", {"one", "two\u2026our", "5"}},
+            {"\u4e00\u4e8c\u4e09\u56db", {"\u4e00\u2026\u56db"}},
     };
     for (const auto& [text, lines] : kCases) EXPECT_EQ(wrap(text, 7), lines) << text;
 }

@@ -60,7 +60,7 @@ struct Section {
 struct Use {
     enum class End {
         kSeen,    // it ended, or it goes on in the next day
-        kUnseen,  // it ended at `span.to` at the latest
+        kUnseen,  // it ended at `span.to` at the latest, or perhaps in the next day
         kOn,      // it was on when the capture was taken, or when the trace ended
     };
 
