@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include "day/Journal.h"
+#include "day/Profile.h"
 #include "day/Samples.h"
 #include "report/EventText.h"
 
@@ -223,6 +224,32 @@ TEST(DayTest, ATableSplitsUsesAtMidnightAndKeepsSensorsOfOneTypeApart) {
     }
     EXPECT_EQ(shown, "0: 20 10 1 open\n0: 5 5 1 open\n1: 30 30 0\n1: 5 5 0\n");
     EXPECT_EQ(journal.played(), kDay + 30 * kSecond);
+}
+
+TEST(DayTest, WhatIsSeenAndHeldOnBatteryIsCountedOnce) {
+    day::Journal journal;
+    journal.begin("input");
+    journal.take(at(0, Kind::kBoot));
+    journal.take(note(0, R"({"capture": {"files": ["f"], "registrations": 1, "from": 0, "to": 90000,
+        "knownTo": 100000, "bound": "stamp"}, "gaps": [{"from": 10000, "to": 20000}],
+        "sensors": [{"handle": 1, "name": "A", "type": 1}], "taken": {"sinceCharge":
+        {"onBatteryMs": 9000, "rows": [{"uid": 5, "handle": 1, "ms": 1, "count": 1},
+        {"uid": 5, "handle": 7, "ms": 2, "count": 1}, {"uid": 5, "handle": -10000, "ms": 3,
+        "count": 1}]}}})"));
+    journal.take(displayIs(5, false));
+    journal.take({Kind::kOver, 40 * kSecond});
+    journal.take(at(40, Kind::kBoot, {}, 0, static_cast<int32_t>(trace::BootKind::kProcess)));
+    journal.take({Kind::kOver, 50 * kSecond});
+    journal.end();
+    const day::Profile profile = profileOf(journal);
+    EXPECT_EQ(profile.covered, 90 * kSecond) << "40 and 60 but for the gap";
+    EXPECT_EQ(profile.displayOff, 25 * kSecond) << "the second process was told nothing";
+    std::string rows;
+    for (const auto& [key, row] : profile.rows) {
+        rows += key.first + ' ' + (key.second ? std::to_string(*key.second) : "none") + ' ' +
+                row.sensor + ' ' + std::to_string(row.heldOnBattery / 1'000'000) + '\n';
+    }
+    EXPECT_EQ(rows, "uid 5 none GPS 3\nuid 5 0  2\nuid 5 1 A 1\n");
 }
 
 TEST(DayTest, APayloadIsTakenApartWhateverItsNamesHold) {
