@@ -79,15 +79,21 @@ std::string firstOf(const std::vector<std::string>& packages) {
 
 }  // namespace
 
-Csv::Csv(base::OutputFile* file, std::string_view header) : mFile(file), mRows(header) {
+Csv::Csv(base::OutputFile* file, std::string_view header,
+         std::function<void(const day::Use&)> takeUse)
+      : mFile(file),
+        mRows(header),
+        mTracker(std::move(takeUse)) {
     flush();
 }
 
 void Csv::begin(const std::string& name) {
     mName = name;
+    mTracker.begin();
 }
 
 void Csv::end(bool) {
+    mTracker.end();
     endInput();
     flush();
 }
@@ -103,24 +109,17 @@ void Csv::flush() {
 }
 
 UsesCsv::UsesCsv(base::OutputFile* file)
-      : Csv(file, kUses),
-        mTracker([this](const day::Use& use) { mEnded.add(use); }) {}
-
-void UsesCsv::begin(const std::string& name) {
-    Csv::begin(name);
-    mTracker.begin();
-}
+      : Csv(file, kUses, [this](const day::Use& use) { mEnded.add(use); }) {}
 
 void UsesCsv::take(const trace::Record& record) {
     if (record.kind == trace::Record::Kind::kExpect) return;  // its time is the recorded device's
-    mTracker.take(record);
+    tracker()->take(record);
     // A boot of the device forgets the notes that its uses need.
     const bool isOver = record.kind == trace::Record::Kind::kOver;
     addEnded(isOver ? day::EndedUses::kAll : record.at);
 }
 
 void UsesCsv::endInput() {
-    mTracker.end();
     addEnded(day::EndedUses::kAll);
 }
 
@@ -129,12 +128,12 @@ void UsesCsv::addEnded(int64_t before) {
 }
 
 void UsesCsv::add(const day::Use& use) {
-    const std::optional<int64_t> firstDay = mTracker.notes().firstDay();
+    const std::optional<int64_t> firstDay = tracker()->notes().firstDay();
     const bool hasRate =
             use.periodNs && *use.periodNs > 0 && use.mode != trace::SensorMode::kOneShot;
     const auto samples = day::samplesOf(use);
     base::CsvWriter row(rows());
-    row.field(name()).field(takenOf(mTracker.notes()));
+    row.field(name()).field(takenOf(tracker()->notes()));
     row.field(firstDay ? base::formatDate(*firstDay + use.from / base::kNsPerDay) : "");
     row.field(firstOf(use.packages)).field(use.pkg).field(ifKnown(use.uid));
     row.field(use.sensor).field(use.type).field(trace::nameOf(use.mode));
@@ -153,18 +152,16 @@ void UsesCsv::add(const day::Use& use) {
 }
 
 SinceChargeCsv::SinceChargeCsv(base::OutputFile* file)
-      : Csv(file, kSinceCharge),
-        mTracker([](const day::Use&) {}) {}
+      : Csv(file, kSinceCharge, [](const day::Use&) {}) {}
 
 void SinceChargeCsv::begin(const std::string& name) {
     Csv::begin(name);
-    mTracker.begin();
     mIsAdded = false;
 }
 
 void SinceChargeCsv::take(const trace::Record& record) {
-    mTracker.take(record);
-    const day::Notes& notes = mTracker.notes();
+    tracker()->take(record);
+    const day::Notes& notes = tracker()->notes();
     const bool hasStatistics = notes.taken() && notes.taken()->sinceCharge;
     if (hasStatistics && !mIsAdded) add(notes);
     mIsAdded = hasStatistics;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -25,16 +26,21 @@ public:
     const std::optional<base::Failure>& failure() const override { return mFailure; }
 
 protected:
-    /** `file` must outlive this and be new; the header is written to it at once. */
-    Csv(base::OutputFile* file, std::string_view header);
+    /**
+     * `file` must outlive this and be new; the header is written to it at once. `takeUse` gets each
+     * use when it ends.
+     */
+    Csv(base::OutputFile* file, std::string_view header,
+        std::function<void(const day::Use&)> takeUse);
 
+    day::UseTracker* tracker() { return &mTracker; }
     const std::string& name() const { return mName; }
 
     /** Rows that are not written yet. */
     std::string* rows() { return &mRows; }
     void flushIfLarge();
 
-    virtual void endInput() = 0;
+    virtual void endInput() {}
 
 private:
     void flush();
@@ -42,6 +48,7 @@ private:
     base::OutputFile* const mFile;
     std::string mName;
     std::string mRows;
+    day::UseTracker mTracker;
     std::optional<base::Failure> mFailure;
 };
 
@@ -50,7 +57,6 @@ class UsesCsv : public Csv {
 public:
     explicit UsesCsv(base::OutputFile* file);
 
-    void begin(const std::string& name) override;
     void take(const trace::Record& record) override;
 
 private:
@@ -58,7 +64,6 @@ private:
     void addEnded(int64_t before);
     void add(const day::Use& use);
 
-    day::UseTracker mTracker;
     day::EndedUses mEnded;
 };
 
@@ -71,10 +76,8 @@ public:
     void take(const trace::Record& record) override;
 
 private:
-    void endInput() override {}
     void add(const day::Notes& notes);
 
-    day::UseTracker mTracker;
     bool mIsAdded = false;  // the statistics of this capture
 };
 

@@ -2,14 +2,11 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <optional>
 #include <string>
 #include <vector>
 
 #include "day/Journal.h"
 #include "report/Report.h"
-#include "report/Stdout.h"
-#include "report/Table.h"
 #include "report/Terminal.h"
 
 namespace report {
