@@ -259,7 +259,7 @@ void Recorder::beginCall(Stint* stint, const CallLine& call) {
     appendAny(at, mSurroundings.takeVariables());
     if (call.isSample) appendAny(at, mScreen.take(call.rgb, call.rect));
     append(at, call.body);
-    if (!write()) return;
+    if (!writeUnharmed()) return;
     stint->clockStands = true;
     stint->generation = mGeneration;
     mTimes.beginCall(stint, real);
@@ -436,14 +436,23 @@ void Recorder::startPart(int64_t at) {
 
 /** Whether there is a record to write to. If lines are being lost, tries to go on with it. */
 bool Recorder::isReady(int64_t real) {
-    if (!mLoss) {
-        if (const auto harm = mParts.findHarm()) lose(*harm);
-    }
+    findHarm();
     return !mLoss || goOn(real);
+}
+
+void Recorder::findHarm() {
+    if (mLoss) return;
+    if (const auto harm = mParts.findHarm()) lose(*harm);
 }
 
 /** Writes what was gathered; false if it is lost. */
 bool Recorder::write() {
+    if (!mText.empty()) findHarm();
+    return writeUnharmed();
+}
+
+/** The same where `findHarm` has just been called: it is a system call. */
+bool Recorder::writeUnharmed() {
     if (!mLoss && !mText.empty()) {
         if (const auto error = mParts.write(mText)) {
             lose(*error);
