@@ -74,13 +74,18 @@ std::string hangNote(int64_t from) {
     return body;
 }
 
-std::string lineOf(int64_t at, std::string_view body) {
-    std::string line;
-    base::JsonWriter json(&line);
+void appendLine(std::string* text, int64_t at, std::string_view body) {
+    base::JsonWriter json(text);
     json.beginObject().member("at", base::Ms{at});
     if (!body.empty()) json.raw(body);
     json.endObject();
-    return line += '\n';
+    *text += '\n';
+}
+
+std::string lineOf(int64_t at, std::string_view body) {
+    std::string line;
+    appendLine(&line, at, body);
+    return line;
 }
 
 void log(int level, const std::string& text) {
@@ -254,7 +259,7 @@ void Recorder::beginCall(Stint* stint, const CallLine& call) {
     if (mParts.isFullFor(call.body.size() + kReserve)) startPart(at);
     if (call.reads == Reads::kAll) appendAny(at, mSurroundings.takeProperties());
     if (call.reads == Reads::kTestMode) {
-        appendAny(at, mSurroundings.takeProperties("persist.sys.skip_restrict"));
+        appendAny(at, mSurroundings.takeProperty("persist.sys.skip_restrict"));
     }
     appendAny(at, mSurroundings.takeVariables());
     if (call.isSample) appendAny(at, mScreen.take(call.rgb, call.rect));
@@ -397,7 +402,7 @@ void Recorder::noteProximity(bool enabled, const std::string& client) {
 }
 
 void Recorder::append(int64_t at, std::string_view body) {
-    mText += lineOf(at, body);
+    appendLine(&mText, at, body);
 }
 
 void Recorder::appendAny(int64_t at, std::string_view body) {
