@@ -433,7 +433,9 @@ void Recorder::appendStart(int64_t at, const char* how, const std::string& note)
 }
 
 void Recorder::startPart(int64_t at) {
-    if (const auto error = mParts.startNext()) return lose(*error);
+    if (const auto error = mParts.startNext()) {
+        return lose("cannot go on in a new part: " + *error);
+    }
     mPartBegan = at;
     appendStart(at, "goes on in a new part", {});
     mText += "# end of its start\n";
@@ -489,14 +491,15 @@ bool Recorder::goOn(int64_t real) {
     appendStart(at, "goes on after a loss", lostNote(mLoss->from, at, mLoss->why));
     const std::string text = std::exchange(mText, {});
     if (mParts.resume(text.size())) return false;
-    if (mParts.write(text)) {
+    const bool isFull = mParts.isFullFor(text.size() + kReserve);
+    if ((isFull && mParts.startNext()) || mParts.write(text)) {
         noteLoss(at);
         return false;
     }
     mWrittenTo = mPartBegan = at;
     mLoss.reset();
     ++mGeneration;
-    mSaid += "The record goes on.";
+    mSaid += "The record goes on. ";
     return true;
 }
 
