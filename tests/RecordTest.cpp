@@ -227,18 +227,20 @@ TEST_F(RecordTest, FilesAreForTheirOwnerOnlyAlsoThoseThatWereThere) {
 }
 
 TEST_F(RecordTest, NoSizeThatIsNoPositiveNumberCounts) {
+    // Almost half a MiB is there: with the last of these samples it is too much for 1 MiB.
+    const std::string begin = "# 2018-04-25T11:45:34Z: process 7 begins\n";
+    const std::string before = begin + '#' + std::string(454'900, '-') + '\n';
     std::string trace = "{\"at\": 0, \"call\": \"SDCImpl.getInstance\"}\n";
-    for (int i = 0; i < 8000; ++i) {
+    for (int i = 0; i < 60; ++i) {
         trace += "{\"at\": 1, \"call\": \"RgbShotManager.getScreenPixcel\", \"args\": "
                  "[[0, 0, 9, 9]]}\n";
     }
-    for (const char* size : {"-5", "0", "1x", ""}) {
+    for (const char* size : {"-5", "0", "1x", "", "1"}) {
+        write(kRecord, before);
         record(trace, std::string("SENSOR_PRIV_RECORD_MB=") + size);
-        EXPECT_FALSE(std::filesystem::exists(kOldRecord)) << size;
-        std::filesystem::remove(kRecord);
+        EXPECT_EQ(std::filesystem::exists(kOldRecord), size == std::string("1")) << size;
     }
-    record(trace, "SENSOR_PRIV_RECORD_MB=1");
-    EXPECT_TRUE(std::filesystem::exists(kOldRecord));
+    EXPECT_THAT(read(kOldRecord).substr(before.size()), HasSubstr("getScreenPixcel"));
     // A part begins anew, also with what the display showed for the samples of the part before.
     const std::string part = read(kRecord);
     EXPECT_THAT(part.substr(part.find("# end of its start")),
