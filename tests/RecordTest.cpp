@@ -244,7 +244,23 @@ TEST_F(RecordTest, NoSizeThatIsNoPositiveNumberCounts) {
     // A part begins anew, also with what the display showed for the samples of the part before.
     const std::string part = read(kRecord);
     EXPECT_THAT(part.substr(part.find("# end of its start")),
-                ContainsRegex(R"(^[^\n]*\n[^\n]*"display": \{"size": \[1080, 2400\])"));
+                ContainsRegex("^[^\n]*\n[^\n]*\"display\": \\{\"size\": \\[1080, 2400\\]"));
+}
+
+TEST_F(RecordTest, ARecordThatCannotBeginANewPartKeepsItsSize) {
+    const std::string begin = "# 2018-04-25T11:45:34Z: process 7 begins\n";
+    write(kRecord, begin + '#' + std::string(456'000, '-') + '\n');
+    mkfifo(kOldRecord, 0600);
+    std::string trace;
+    for (int i = 0; i < 60; ++i)
+        trace += R"({"at": 1, "call": "RgbShotManager.skipLux"})"
+                 "\n";
+    record(trace, "SENSOR_PRIV_RECORD_MB=1");
+    const std::string added = read(kRecord).substr(456'000);
+    EXPECT_THAT(added, ContainsRegex("the record cannot go on in a new part: [^\n]*"
+                                     "\\.old\\.jsonl is no regular file\"}}}\n$"));
+    EXPECT_EQ(added.find("lost"), added.rfind("lost"));
+    EXPECT_EQ(std::filesystem::status(kOldRecord).type(), std::filesystem::file_type::fifo);
 }
 
 TEST(PseudonymsTest, TheHashIsTheOneThatItsAuthorsPublished) {
