@@ -156,8 +156,8 @@ Error Parts::startNext() {
             lstat(mPath.c_str(), &named) == 0 && named.st_dev == mDevice && named.st_ino == mNumber;
     if (!isPart(old)) {
         error = complain(mOldPath, "is no part of a record");
-    } else if (hasName && (unlink(mOldPath.c_str()) != 0 ||
-                           rename(mPath.c_str(), mOldPath.c_str()) != 0)) {
+    } else if (hasName &&
+               (unlink(mOldPath.c_str()) != 0 || rename(mPath.c_str(), mOldPath.c_str()) != 0)) {
         // To rename it over a file may first write it to the disk.
         error = complain(mPath, "cannot be renamed", errno);
     } else {
