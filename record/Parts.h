@@ -43,6 +43,7 @@ public:
     void abandon();
 
     void close();
+
     /** Whether what was written is lost: the file was removed or cut. */
     bool isGone() const { return mIsGone; }
 
@@ -60,7 +61,10 @@ public:
     /** Begins a new part. An older part is deleted on a thread of its own: that takes its time. */
     Error startNext();
 
-    /** Adds whole lines. If that fails, none of them is there. */
+    /**
+     * Adds whole lines. If that fails, none of them is there. `findHarm` comes first: the
+     * descriptor may be the host's by now.
+     */
     Error write(std::string_view lines);
 
     /** Adds a note after a failure: one line of up to 1 kB, which `resume` takes back. */

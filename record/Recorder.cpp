@@ -74,13 +74,18 @@ std::string hangNote(int64_t from) {
     return body;
 }
 
-std::string lineOf(int64_t at, std::string_view body) {
-    std::string line;
-    base::JsonWriter json(&line);
+void appendLine(std::string* text, int64_t at, std::string_view body) {
+    base::JsonWriter json(text);
     json.beginObject().member("at", base::Ms{at});
     if (!body.empty()) json.raw(body);
     json.endObject();
-    return line += '\n';
+    *text += '\n';
+}
+
+std::string lineOf(int64_t at, std::string_view body) {
+    std::string line;
+    appendLine(&line, at, body);
+    return line;
 }
 
 void log(int level, const std::string& text) {
@@ -254,12 +259,12 @@ void Recorder::beginCall(Stint* stint, const CallLine& call) {
     if (mParts.isFullFor(call.body.size() + kReserve)) startPart(at);
     if (call.reads == Reads::kAll) appendAny(at, mSurroundings.takeProperties());
     if (call.reads == Reads::kTestMode) {
-        appendAny(at, mSurroundings.takeProperties("persist.sys.skip_restrict"));
+        appendAny(at, mSurroundings.takeProperty("persist.sys.skip_restrict"));
     }
     appendAny(at, mSurroundings.takeVariables());
     if (call.isSample) appendAny(at, mScreen.take(call.rgb, call.rect));
     append(at, call.body);
-    if (!write()) return;
+    if (!writeUnharmed()) return;
     stint->clockStands = true;
     stint->generation = mGeneration;
     mTimes.beginCall(stint, real);
@@ -397,7 +402,7 @@ void Recorder::noteProximity(bool enabled, const std::string& client) {
 }
 
 void Recorder::append(int64_t at, std::string_view body) {
-    mText += lineOf(at, body);
+    appendLine(&mText, at, body);
 }
 
 void Recorder::appendAny(int64_t at, std::string_view body) {
@@ -428,7 +433,9 @@ void Recorder::appendStart(int64_t at, const char* how, const std::string& note)
 }
 
 void Recorder::startPart(int64_t at) {
-    if (const auto error = mParts.startNext()) return lose(*error);
+    if (const auto error = mParts.startNext()) {
+        return lose("cannot go on in a new part: " + *error);
+    }
     mPartBegan = at;
     appendStart(at, "goes on in a new part", {});
     mText += "# end of its start\n";
@@ -436,14 +443,23 @@ void Recorder::startPart(int64_t at) {
 
 /** Whether there is a record to write to. If lines are being lost, tries to go on with it. */
 bool Recorder::isReady(int64_t real) {
-    if (!mLoss) {
-        if (const auto harm = mParts.findHarm()) lose(*harm);
-    }
+    findHarm();
     return !mLoss || goOn(real);
+}
+
+void Recorder::findHarm() {
+    if (mLoss) return;
+    if (const auto harm = mParts.findHarm()) lose(*harm);
 }
 
 /** Writes what was gathered; false if it is lost. */
 bool Recorder::write() {
+    if (!mText.empty()) findHarm();
+    return writeUnharmed();
+}
+
+/** The same where `findHarm` has just been called: it is a system call. */
+bool Recorder::writeUnharmed() {
     if (!mLoss && !mText.empty()) {
         if (const auto error = mParts.write(mText)) {
             lose(*error);
@@ -475,14 +491,15 @@ bool Recorder::goOn(int64_t real) {
     appendStart(at, "goes on after a loss", lostNote(mLoss->from, at, mLoss->why));
     const std::string text = std::exchange(mText, {});
     if (mParts.resume(text.size())) return false;
-    if (mParts.write(text)) {
+    const bool isFull = mParts.isFullFor(text.size() + kReserve);
+    if ((isFull && mParts.startNext()) || mParts.write(text)) {
         noteLoss(at);
         return false;
     }
     mWrittenTo = mPartBegan = at;
     mLoss.reset();
     ++mGeneration;
-    mSaid += "The record goes on.";
+    mSaid += "The record goes on. ";
     return true;
 }
 

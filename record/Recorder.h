@@ -145,7 +145,9 @@ private:
     void appendStart(int64_t at, const char* how, const std::string& note) REQUIRES(mLock);
     void startPart(int64_t at) REQUIRES(mLock);
     bool write() REQUIRES(mLock);
+    bool writeUnharmed() REQUIRES(mLock);
 
+    void findHarm() REQUIRES(mLock);
     void lose(const std::string& why) REQUIRES(mLock);
     bool goOn(int64_t real) REQUIRES(mLock);
     void noteLoss(int64_t to) REQUIRES(mLock);

@@ -1,6 +1,5 @@
 #include "record/Surroundings.h"
 
-#include <cstring>
 #include <type_traits>
 
 #include <cutils/properties.h>
@@ -60,6 +59,7 @@ Surroundings::Surroundings()
 #undef CALL
 #undef VARIABLE
         } {
+    for (const char* name : kProperties) mProperties.push_back({name, std::nullopt, 0});
 }
 
 std::string Surroundings::takeVariables() {
@@ -80,41 +80,55 @@ std::string Surroundings::takeVariables() {
     return bodyOf("set", members);
 }
 
-std::string Surroundings::takeProperties(const char* only) {
+std::string Surroundings::takeProperties() {
     std::string members;
-    base::JsonWriter json(&members);
-    for (const char* name : kProperties) {
-        if (only != nullptr && std::strcmp(name, only) != 0) continue;
-        if (!mBeingWritten.empty() && mBeingWritten.count(name) != 0) continue;
-        char value[PROPERTY_VALUE_MAX] = {};
-        property_get(name, value, "");
-        const auto [known, isNew] = mKnownProperties.try_emplace(name, value);
-        if (!isNew && known->second == value) continue;
-        known->second = value;
-        json.key(name);
-        if (value[0] == '\0') {
-            json.raw("null");
-        } else {
-            json.value(value);
-        }
-    }
+    for (Property& property : mProperties) take(&property, &members);
     return bodyOf("property", members);
 }
 
-void Surroundings::beginWrite(const std::string& name, const std::string& value) {
-    const auto known = mKnownProperties.find(name);
-    if (known != mKnownProperties.end()) known->second = value;
-    mBeingWritten.insert(name);
+std::string Surroundings::takeProperty(std::string_view name) {
+    std::string members;
+    take(find(name), &members);
+    return bodyOf("property", members);
 }
 
-void Surroundings::endWrite(const std::string& name) {
-    const auto written = mBeingWritten.find(name);
-    if (written != mBeingWritten.end()) mBeingWritten.erase(written);
+void Surroundings::take(Property* property, std::string* members) {
+    if (property->writes > 0) return;
+    char value[PROPERTY_VALUE_MAX] = {};
+    property_get(property->name, value, "");
+    if (property->known == value) return;
+    property->known = value;
+    if (!members->empty()) *members += ", ";
+    base::JsonWriter json(members);
+    json.key(property->name);
+    if (value[0] == '\0') {
+        json.raw("null");
+    } else {
+        json.value(value);
+    }
+}
+
+void Surroundings::beginWrite(std::string_view name, const std::string& value) {
+    Property* const property = find(name);
+    if (property == nullptr) return;
+    if (property->known) property->known = value;
+    ++property->writes;
+}
+
+void Surroundings::endWrite(std::string_view name) {
+    if (Property* const property = find(name)) --property->writes;
 }
 
 void Surroundings::forget() {
     for (Variable& variable : mVariables) variable.known.reset();
-    mKnownProperties.clear();
+    for (Property& property : mProperties) property.known.reset();
+}
+
+Surroundings::Property* Surroundings::find(std::string_view name) {
+    for (Property& property : mProperties) {
+        if (property.name == name) return &property;
+    }
+    return nullptr;
 }
 
 }  // namespace record

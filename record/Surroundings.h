@@ -1,10 +1,9 @@
 #pragma once
 
 #include <cstdint>
-#include <map>
 #include <optional>
-#include <set>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace record {
@@ -20,16 +19,15 @@ public:
     /** Looks at the variables. Returns a "set" line's body for those that have changed, or "". */
     std::string takeVariables();
 
-    /**
-     * Looks at the properties, or at the one that is called `only`. Returns a "property" line's
-     * body likewise.
-     */
-    std::string takeProperties(const char* only = nullptr);
+    // Look at the properties, or at one that the library reads. Return a "property" line's body
+    // likewise.
+    std::string takeProperties();
+    std::string takeProperty(std::string_view name);
 
     // The library begins, or ends, to set a property. A replay lets it succeed, whatever the device
     // says. In between nobody knows which value a look at it would find, so none is taken.
-    void beginWrite(const std::string& name, const std::string& value);
-    void endWrite(const std::string& name);
+    void beginWrite(std::string_view name, const std::string& value);
+    void endWrite(std::string_view name);
 
     /** A replay that begins now knows nothing. */
     void forget();
@@ -42,9 +40,17 @@ private:
         std::optional<int32_t> known;
     };
 
+    struct Property {
+        const char* name;
+        std::optional<std::string> known;  // unset: ""
+        int writes;                        // that have begun and not ended
+    };
+
+    void take(Property* property, std::string* members);
+    Property* find(std::string_view name);
+
     std::vector<Variable> mVariables;
-    std::map<std::string, std::string> mKnownProperties;  // unset: ""
-    std::multiset<std::string> mBeingWritten;
+    std::vector<Property> mProperties;
 };
 
 }  // namespace record

@@ -227,22 +227,40 @@ TEST_F(RecordTest, FilesAreForTheirOwnerOnlyAlsoThoseThatWereThere) {
 }
 
 TEST_F(RecordTest, NoSizeThatIsNoPositiveNumberCounts) {
+    // Almost half a MiB is there: with the last of these samples it is too much for 1 MiB.
+    const std::string begin = "# 2018-04-25T11:45:34Z: process 7 begins\n";
+    const std::string before = begin + '#' + std::string(454'900, '-') + '\n';
     std::string trace = "{\"at\": 0, \"call\": \"SDCImpl.getInstance\"}\n";
-    for (int i = 0; i < 8000; ++i) {
+    for (int i = 0; i < 60; ++i) {
         trace += "{\"at\": 1, \"call\": \"RgbShotManager.getScreenPixcel\", \"args\": "
                  "[[0, 0, 9, 9]]}\n";
     }
-    for (const char* size : {"-5", "0", "1x", ""}) {
+    for (const char* size : {"-5", "0", "1x", "", "1"}) {
+        write(kRecord, before);
         record(trace, std::string("SENSOR_PRIV_RECORD_MB=") + size);
-        EXPECT_FALSE(std::filesystem::exists(kOldRecord)) << size;
-        std::filesystem::remove(kRecord);
+        EXPECT_EQ(std::filesystem::exists(kOldRecord), size == std::string("1")) << size;
     }
-    record(trace, "SENSOR_PRIV_RECORD_MB=1");
-    EXPECT_TRUE(std::filesystem::exists(kOldRecord));
+    EXPECT_THAT(read(kOldRecord).substr(before.size()), HasSubstr("getScreenPixcel"));
     // A part begins anew, also with what the display showed for the samples of the part before.
     const std::string part = read(kRecord);
     EXPECT_THAT(part.substr(part.find("# end of its start")),
-                ContainsRegex(R"(^[^\n]*\n[^\n]*"display": \{"size": \[1080, 2400\])"));
+                ContainsRegex("^[^\n]*\n[^\n]*\"display\": \\{\"size\": \\[1080, 2400\\]"));
+}
+
+TEST_F(RecordTest, ARecordThatCannotBeginANewPartKeepsItsSize) {
+    const std::string begin = "# 2018-04-25T11:45:34Z: process 7 begins\n";
+    write(kRecord, begin + '#' + std::string(456'000, '-') + '\n');
+    mkfifo(kOldRecord, 0600);
+    std::string trace;
+    for (int i = 0; i < 60; ++i)
+        trace += R"({"at": 1, "call": "RgbShotManager.skipLux"})"
+                 "\n";
+    record(trace, "SENSOR_PRIV_RECORD_MB=1");
+    const std::string added = read(kRecord).substr(456'000);
+    EXPECT_THAT(added, ContainsRegex("the record cannot go on in a new part: [^\n]*"
+                                     "\\.old\\.jsonl is no regular file\"}}}\n$"));
+    EXPECT_EQ(added.find("lost"), added.rfind("lost"));
+    EXPECT_EQ(std::filesystem::status(kOldRecord).type(), std::filesystem::file_type::fifo);
 }
 
 TEST(PseudonymsTest, TheHashIsTheOneThatItsAuthorsPublished) {

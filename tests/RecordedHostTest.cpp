@@ -38,10 +38,15 @@ TEST_F(RecordedHostTest, WhatIsMissingStandsInTheRecordAndTheRestAgrees) {
             {"hang-long", "written meanwhile: yes\n", met("4001")},
             {"full", "", met("1") + full + met("1")},
             {"full-to-the-end", "", met("1") + full},
+            {"half-written", "",
+             met("1") + lost("the record cannot be written: No space left on device") + met("1")},
             {"removed", "", lost("the record was removed") + met("1")},
-            {"closes-all", "own file: 0 bytes\n",
-             met("1") + lost("the record was closed by the host") + met("1")},
-            {"forks", "",
+            {"closes", "own file: 0 bytes\n",
+             met("1") +
+                     "sensor-priv.jsonl: the process ends at [0-9.]+ ms; the replay does 1 more of "
+                     "that moment\n" +
+                     lost("the record was closed by the host") + met("1")},
+            {"forks", "has the record: 1, its child: 0\n",
              met("2") + lost("process [0-9]+ was forked, and what it calls is not recorded")},
             {"forks-in-telemetry", "children: 20\n", met("20")},
             {"calls-from-log", "", met("1")},
