@@ -9,6 +9,7 @@
 #include "clock/VirtualClock.h"
 #include "platform/PropertyService.h"
 #include "platform/Telemetry.h"
+#include "tests/Locks.h"
 
 namespace {
 
@@ -35,10 +36,13 @@ DeviceTest::DeviceTest() {
     });
     platform::observeEvents([](const char* module, const char* id, const char* payload) {
         EXPECT_STREQ(module, "N273");
+        EXPECT_EQ(locksHeld(), 0);
         note(id, ' ', payload);
     });
-    platform::observePropertySet(
-            [](const char* name, const char* value) { note(name, '=', value); });
+    platform::observePropertySet([](const char* name, const char* value) {
+        EXPECT_EQ(locksHeld(), 0);
+        note(name, '=', value);
+    });
 }
 
 void DeviceTest::advanceTo(double ms) {
@@ -57,4 +61,11 @@ std::string DeviceTest::property(const std::string& name) {
     char value[PROP_VALUE_MAX];
     property_get(name.c_str(), value, "");
     return value;
+}
+
+android::Vector<int> DeviceTest::listOf(const std::vector<int>& values) {
+    android::Vector<int> list;
+    list.setCapacity(values.size());
+    list.appendArray(values.data(), values.size());
+    return list;
 }

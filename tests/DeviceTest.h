@@ -4,12 +4,14 @@
 #include <vector>
 
 #include <gtest/gtest.h>
+#include <utils/Vector.h>
 
 /** What the library did, a line each: see `DeviceTest::taken`. */
 using Lines = std::vector<std::string>;
 
 /**
- * A fresh device with the library on it, in virtual time that starts at 0. Each test needs a
+ * A fresh device with the library on it, in virtual time that starts at 0. Whatever sends an
+ * event or sets a property must hold no lock meanwhile: both are foreign code. Each test needs a
  * process of its own, which CTest gives it. What the test calls holds the worker thread; it runs in
  * `advanceTo`.
  */
@@ -30,4 +32,7 @@ protected:
     /** A property as the device has it. */
     static void setProperty(const std::string& name, const std::string& value);
     static std::string property(const std::string& name);
+
+    /** A list as a host gives it, whose memory ends with it: a sanitizer sees a read behind it. */
+    static android::Vector<int> listOf(const std::vector<int>& values);
 };

@@ -5,6 +5,7 @@
 #include <string>
 #include <utility>
 
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -127,6 +128,30 @@ TEST_F(ReplayOutputTest, AFileThatCannotBeWrittenIsNamedBeforeAnythingIsPlayedIf
     }
     EXPECT_EQ(run("--json good >/dev/full 2>error; echo $?").out, "1\n");
     EXPECT_EQ(contents("error"), "cannot write standard output: No space left on device\n");
+}
+
+TEST_F(ReplayOutputTest, NothingIsWholeThatADiskCutsShort) {
+    // A page or a timeline that is smaller than a buffer fails as late as at its end.
+    for (const char* option : {"--timeline", "--uses", "--since-charge"}) {
+        const Played played = run(std::string(option) + " /dev/full good");
+        EXPECT_EQ(played.status, 2) << option;
+        EXPECT_EQ(played.err, "/dev/full: cannot write: No space left on device\n") << option;
+    }
+    // The kernel writes what fits, and refuses the rest with a signal.
+    rlimit usual{};
+    getrlimit(RLIMIT_FSIZE, &usual);
+    const rlimit small{1000, usual.rlim_max};
+    setrlimit(RLIMIT_FSIZE, &small);
+    const Played cut = run(std::string("--json ") + kThreeBoots);
+    const Played table =
+            run(std::string("--uses uses ") + kThreeBoots + " >/dev/null 2>error; echo $?");
+    setrlimit(RLIMIT_FSIZE, &usual);
+    EXPECT_EQ(cut.status, 1);
+    EXPECT_EQ(cut.out.size(), 1000u);
+    EXPECT_EQ(cut.err, "cannot write standard output: File too large\n");
+    EXPECT_EQ(table.out, "2\n");
+    EXPECT_EQ(contents("error"), "uses: cannot write: File too large\n");
+    EXPECT_EQ(access("uses", F_OK), -1);
 }
 
 TEST_F(ReplayOutputTest, AReplayThatStopsLeavesWhatWasThere) {

@@ -6,31 +6,10 @@
 #include <string>
 #include <vector>
 
-#include <dlfcn.h>
-#include <pthread.h>
-
 #include "core/Log.h"
 #include "rgb/LightSensorState.h"
 #include "tests/DeviceTest.h"
-
-namespace {
-
-/** What another thread does just before this one takes its `locksUntilThen`-th lock from now. */
-thread_local const std::function<void()>* otherThread = nullptr;
-thread_local int locksUntilThen = 0;
-
-}  // namespace
-
-/** The sanitizers' own `pthread_mutex_lock`, in their builds. */
-extern "C" int sanitizersLock(pthread_mutex_t* mutex) asm("__interceptor_pthread_mutex_lock")
-        __attribute__((weak));
-
-extern "C" int pthread_mutex_lock(pthread_mutex_t* mutex) noexcept {
-    static const auto libcLock =
-            reinterpret_cast<int (*)(pthread_mutex_t*)>(dlsym(RTLD_NEXT, "pthread_mutex_lock"));
-    if (locksUntilThen > 0 && --locksUntilThen == 0) (*otherThread)();
-    return sanitizersLock != nullptr ? sanitizersLock(mutex) : libcLock(mutex);
-}
+#include "tests/Locks.h"
 
 namespace android {
 namespace {
@@ -169,10 +148,9 @@ TEST_F(RgbShotManagerTest, NothingIsGrantedIfAnotherThreadIsFasterThanTheTake) {
         EXPECT_EQ(allowedAt(ms, &manager), 5);
         manager.setRgbShotDelay(3, 10);
         const std::function<void()> act = [&] { other.otherThread(&manager); };
-        otherThread = &act;
-        locksUntilThen = 2;
+        beforeLock(2, &act);
         EXPECT_FALSE(manager.allowRgbShot());
-        EXPECT_EQ(locksUntilThen, 0);
+        EXPECT_EQ(locksUntilAct(), 0);
         EXPECT_EQ(manager.stopRgbThread(), other.later == 0);
         EXPECT_EQ(allowedAt(ms += 11, &manager), other.later);
         EXPECT_TRUE(manager.stopRgbThread());
@@ -243,6 +221,7 @@ TEST_F(RgbShotManagerTest, AQueuedEntryIsTakenInOrderAndBecomesDueAlone) {
             {"a raise does not add", 0, "0 =5 0 +3@0 1 ?5 1 =1 1 =3 1 ?3"},
             {"a budget below what is there changes nothing", 0, "0 =2 0 =-9 0 =0 0 ?2"},
             {"no samples and fewer grant nothing", 0, "0 +0@1 0 +-3@1 5 n 5 n 5 ."},
+            {"none is pending as well", 0, "0 +0@1 0 n 0 ! 5 n 5 ."},
             {"a clear leaves the pending one and the budget", 0,
              "0 =1 0 +2@9 0 +4@20 0 y 0 c 5 n 10 ?2 30 n 30 ."},
             {"a clear without a pending one leaves nothing", 0, "0 +2@9 0 c 0 . 30 n"},

@@ -2,13 +2,18 @@
 
 #include <map>
 #include <regex>
+#include <set>
 #include <utility>
 
+#include "clock/VirtualClock.h"
+#include "day/Payload.h"
 #include "exception/FlowingDataException.h"
 #include "exception/UltraException.h"
 #include "exception/WechatProxException.h"
+#include "platform/Telemetry.h"
 #include "rgb/RgbShot.h"
 #include "tests/DeviceTest.h"
+#include "tests/Locks.h"
 
 namespace android {
 namespace {
@@ -21,11 +26,7 @@ protected:
         mSdc->enableSuccess(enabled, type, pkg, "op", 1000);
     }
 
-    void notify(std::initializer_list<int> values) {
-        Vector<int> list;
-        for (const int value : values) list.add(value);
-        mSdc->setNotification(list);
-    }
+    void notify(std::initializer_list<int> values) { mSdc->setNotification(listOf(values)); }
 
     /** Gives every module something to report, from `second` on. */
     void fillModules(double second) {
@@ -133,6 +134,65 @@ TEST_F(SDCImplTest, AnHourlyCallActsAtItsHoursOnly) {
             EXPECT_EQ(letters(taken()), acts ? effect->second.second : "RUFMWAG");
         }
     }
+}
+
+/**
+ * Telemetry is somebody else's code: it may last, and come back. So no lock is held meanwhile, and
+ * what is zeroed, stored or posted for an event comes behind it.
+ */
+TEST_F(SDCImplTest, EveryEventIsSentWithNothingHeldAndBeforeAllThatFollowsIt) {
+    std::set<trace::EventKind> kinds;
+    bool isHosts = true;  // the thread that sends; the worker's otherwise
+    const auto advance = [&](double ms) {
+        isHosts = false;
+        advanceTo(ms);
+        isHosts = true;
+        taken();
+    };
+    platform::observeEvents([&](const char*, const char* id, const char* payload) {
+        SCOPED_TRACE(std::string(id) + ' ' + payload);
+        ASSERT_EQ(locksHeld(), 0);
+        const trace::EventKind kind = day::takeApart(id, payload).kind;
+        // A failure and the day have one form.
+        EXPECT_TRUE(kinds.insert(kind).second || kind == trace::EventKind::kUltrasonic);
+        if (std::exchange(isHosts, false)) {
+            virtual_clock::settle();
+            for (const bool on : {true, false}) mSdc->enableSuccess(on, 3, "b", "op", 0);
+            isHosts = true;
+        }
+        EXPECT_EQ(taken(), Lines{});
+        if (kind == trace::EventKind::kScreenSamples) RgbShot::getInstance()->updateRgbShotCount();
+    });
+    UltraException::getInstance();
+    advance(5000);
+    fillModules(10);
+    setProperty("persist.zuno.flow.detect.count", "1,1,1,1,1,1");
+    FlowingDataException::getInstance()->initDetectCount();
+    notify({7, 0, 0, 0, 0, 0, 0, 1});
+    mSdc->enableSuccess(true, 8, "Call", "com.tencent.mm", 0);
+    sensors_event_t near{};
+    near.type = SENSOR_TYPE_PROXIMITY;
+    mSdc->process(near);
+    advance(3'000'000);
+    mSdc->enableSuccess(false, 8, "Call", "com.tencent.mm", 0);
+    advance(3'100'000);
+    mSdc->sendUsedTime(2);
+    mSdc->enableSuccess(true, 3, "a", "op", 0);
+    mSdc->enableSuccess(false, 3, "a", "op", 0);
+    advance(3'200'000);
+    UltraException::getInstance()->doAction(4, {});
+    advance(4'000'000);
+    mSdc->putRgbShotTally(7);
+    EXPECT_EQ(property("persist.zuno.rgb.shot.count"), "5") << "zeroed only behind the event";
+    taken();
+    mSdc->putPhoneOpenUltraTally(7);
+    for (const int hour : {8, 23}) {
+        advance(4'000'000 + hour * 1000);
+        mSdc->notifySdcClock(hour);
+    }
+    advance(5'000'000);
+    EXPECT_EQ(kinds.size(), std::size(trace::kEventForms));
+    EXPECT_EQ(kinds.count(trace::EventKind::kUnknown), 0u);
 }
 
 TEST_F(SDCImplTest, ACleanUpIsADisable) {

@@ -213,9 +213,7 @@ TEST_F(WechatProxExceptionTest, AStoredRecordIsTakenIfItHasFourPieces) {
 
 TEST_F(WechatProxExceptionTest, TakesModeAndStateFromWholeNotificationsOfTheirKinds) {
     const auto notify = [this](std::vector<int> values) {
-        Vector<int> list;
-        list.appendArray(values.data(), values.size());
-        mMonitor->setNotification(list);
+        mMonitor->setNotification(listOf(values));
     };
     notify({});
     notify({7, 1, 1, 1, 1, 1, 1});
