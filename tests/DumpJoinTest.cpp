@@ -113,12 +113,18 @@ TEST(DumpJoinTest, NamesAGapWithItsTimes) {
     EXPECT_EQ(note.gaps[0].to, 2 * 86'400'000 + 36'000'000);
     EXPECT_EQ(note.capture->files, (std::vector<std::string>{"1", "0"}));
     EXPECT_EQ(note.capture->taken, "2024-05-04 12:00:00");
-    const std::string list = kSensors + "Previous Registrations:\n";
-    EXPECT_EQ(importTexts({list + "09:00:00 - 0x00000000 pid=1 uid=1 package=a\n",
-                           list + "07:00:00 - 0x00000000 pid=1 uid=1 package=b\n"})
-                      .error,
-              "0: no registration is also in 1, and without dates the two cannot be put in order: "
-              "merge captures that say when they were taken");
+    // A line is the same only if all of it is.
+    const std::string list = kSensors + "Previous Registrations:\n09:00:00 + 0x00000000 pid=1 ";
+    for (const char* other : {"uid=1 package=b samplingPeriod=5us batchingPeriod=0us",
+                              "uid=1 package=a samplingPeriod=6us batchingPeriod=0us",
+                              "uid=1 package=a samplingPeriod=5us batchingPeriod=7us"}) {
+        EXPECT_EQ(importTexts({list + "uid=1 package=a samplingPeriod=5us batchingPeriod=0us\n",
+                               list + other + '\n'})
+                          .error,
+                  "0: no registration is also in 1, and without dates the two cannot be put in "
+                  "order: merge captures that say when they were taken")
+                << other;
+    }
 }
 
 TEST(DumpJoinTest, DatesEachDumpByItself) {
@@ -135,6 +141,12 @@ TEST(DumpJoinTest, DatesEachDumpByItself) {
     const auto either = importTexts({dump("2024-05-03 12:00:00", {"09:00:00", "10:30:00"}),
                                      dump("2024-05-02 12:00:00", {"10:30:00", "09:00:00"})});
     EXPECT_EQ(headOf(either).from, 32'400'000);
+    // One date alone tells nothing: they follow each other as they were given.
+    std::string undated = dump("2024-05-02 12:00:00", {"10:30:00", "09:00:00"});
+    for (size_t at; (at = undated.find("2024-05-02")) != std::string::npos;) undated.erase(at, 19);
+    EXPECT_EQ(headOf(importTexts({dump("2024-05-03 12:00:00", {"09:00:00", "10:30:00"}), undated}))
+                      .from,
+              37'800'000);
     // A date that is later than the newer dump allows is wrong.
     const auto late = importTexts({dump("2024-05-04 12:00:00", {"09:00:00"}),
                                    dump("2024-05-04 12:00:00", {"07:30:00", "09:00:00"})});

@@ -189,6 +189,17 @@ TEST_F(ReplayTest, ChecksExpectationsInOrderAndWithoutTheirTimes) {
     EXPECT_EQ(run("--check trace").err, "trace: nothing to check: no \"expect\" lines\n");
 }
 
+TEST_F(ReplayTest, NothingIsLostOfMoreThanPassesAtOnce) {
+    constexpr size_t kEvents = 500;
+    Lines trace{line("0", R"("call": "UltraException.doAction", "args": [3, {"packageName": ")" +
+                                  std::string(1000, 'a') + "\"}]")};
+    for (size_t i = 1; i <= kEvents; ++i) {
+        trace.push_back(
+                line(std::to_string(i), R"("call": "UltraException.doAction", "args": [4, {}])"));
+    }
+    EXPECT_EQ(happened(play(trace)).size(), 2 * kEvents + 1) << "each with a property";
+}
+
 TEST_F(ReplayTest, LaysOutLinesForAPerson) {
     write("trace", joined({sample("86400000"), report("86410000.5")}));
     EXPECT_EQ(run("--log trace").out,

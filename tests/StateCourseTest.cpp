@@ -155,11 +155,11 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
              logged("10:00:05.000", on) + logged("10:00:06.000", charge("1")) +
                      logged("10:00:15.000", charge("8")) + logged("11:00:00.000", off),
              "09:59:50 d1 p2 c0 t0, 10:00:10 d2 p1, 10:00:15 p3, 11:00:10 p0, 12:00:00 d1"},
-            {"a full battery: the plug stays",
+            {"a full battery: the plug stays, whatever the log says of it, and has said",
              kReset + kComplete + "+1h00m10s000ms (2) 100 status=full +screen\n" +
                      "+1h00m20s000ms (2) 100 plug=none -screen +camera\n",
-             logged("10:00:12.500", off) + logged("10:00:30.000", charge("0")) +
-                     logged("10:00:40.000", on),
+             logged("10:00:06.000", charge("4")) + logged("10:00:12.500", off) +
+                     logged("10:00:30.000", charge("0")) + logged("10:00:40.000", on),
              "09:59:50 d1 p2 c0 t0, 10:00:10 d2, 10:00:12 d1, 10:00:40 d2, 12:00:00 d1 p0"},
             {"a full battery that is not plugged pauses nothing, nor does one that charges",
              kReset + kComplete + "+1h00m10s000ms (2) 100 status=full plug=none\n" +

@@ -7,6 +7,9 @@
 #  - an event id, a property or a cause of the summary without a row in docs/output.md;
 #  - a property that the recorder does not look at;
 #  - an event id, or a property, that trace/Words.h does not have;
+#  - an event, a property that is kept, or a column of a daily list that report/EventText.cpp has no
+#    words for;
+#  - a sensor whose connections are routed and that trace/Words.h takes for one that nobody watches;
 #  - an option of sensor-replay that its manual or the completion does not have, and the reverse;
 #  - a version that the list of changes does not have.
 # shellcheck disable=SC2013  # no line has a blank
@@ -56,6 +59,23 @@ for property in $(strings '(persist|ro|service)\.[a-z._]+'); do
     expect "$suffix\`" docs/output.md "the property $property"
     expect "\"$property\"," record/Surroundings.cpp "the property $property"
     expect "\"$property\"," trace/Words.h "the property $property"
+done
+
+# The names of the enum $1, up to the first of those that $2 matches.
+names() {
+    sed -n "/^enum class $1 {/,/^};/s/^ *\(k[A-Za-z]*\),.*/\1/p" trace/Words.h | sed "/$2/,\$d"
+}
+for kind in $(names EventKind kUnknown); do
+    expect "{EventKind::$kind, \"" report/EventText.cpp "the event $kind"
+done
+for property in $(names Property kSkipRestriction); do
+    expect "{Property::$property, \"" report/EventText.cpp "the property $property"
+done
+for column in $(sed -n 's/.*(\*entry)\["\([A-Za-z]*\)"\].*/\1/p' usage/*.cpp exception/*.cpp | sort -u); do
+    expect "{\"$column\", \"" report/EventText.cpp "the column $column"
+done
+for sensor in $(sed -n 's/^ *{\(SENSOR_TYPE_[A-Z_]*\), Route::.*/\1/p' core/SDCImpl.cpp); do
+    expect "{$sensor, Watch::" trace/Words.h "the watched sensor $sensor"
 done
 
 sed -n '/kTexts\[\]/,/};/p' report/CauseText.cpp | tr -d '\n' | sed 's/" *"//g' |

@@ -17,7 +17,10 @@ trap 'rm -f "$made"' EXIT
 # Compares what was made with golden file $1.
 compare() {
     if [ -z "$update" ]; then
-        diff "$1" "$made"
+        diff "$1" "$made" || {
+            printf '%s differs. If the change is wanted: ./test --update-golden\n' "$1"
+            exit 1
+        }
     elif ! cmp -s "$1" "$made"; then
         cat "$made" >"$1"
         printf 'wrote %s\n' "$1"

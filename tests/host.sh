@@ -18,7 +18,10 @@ out=$("$1" --hour-ms 20 "$2" 2>"$log") || { cat "$log"; exit 1; }
     sed -En 's/^N273 I [^|]*N273/N273/p' "$log"
 } | sed -E 's/([tT]ime("? ?: ?"?))[1-9][0-9]*/\1S/g' | LC_ALL=C sort >"$made"
 if [ -z "$update" ]; then
-    diff "$golden" "$made"
+    diff "$golden" "$made" || {
+        printf '%s differs. If the change is wanted: ./test --update-golden\n' "$golden"
+        exit 1
+    }
 elif ! cmp -s "$golden" "$made"; then
     cat "$made" >"$golden"
     printf 'wrote %s\n' "$golden"
