@@ -62,7 +62,8 @@ TEST_F(ReplayOutputTest, EachKindOfLineIsLaidOutForAPerson) {
 
 TEST_F(ReplayOutputTest, ABadFileEndsTheReplayAndKeepsWhatCameBefore) {
     write("noCapture", "no capture\n");
-    const std::string capture = kCapture;
+    const std::string capture = "capture";
+    writeCapture(capture);
     const struct {
         std::string files;
         size_t boots;

@@ -128,7 +128,8 @@ TEST_F(ReplayTest, PlaysSeveralFilesAsIfADeviceBootJoinedThem) {
 }
 
 TEST_F(ReplayTest, CapturesAreDevicesOfTheirOwnAndPrintInTheirOrderHoweverManyPlayAtOnce) {
-    const std::string capture = std::string(EXAMPLES) + "/registrations.capture.txt";
+    const std::string capture = "capture";
+    writeCapture(capture);
     write("day", joined({sample("0"), R"({"at": 700})"}));
     write("later", joined({line("0", R"("call": "SDCImpl.getInstance")"), report("2000")}));
     const std::string files = "day " + capture + ' ' + capture + " later missing " + capture;
@@ -142,6 +143,47 @@ TEST_F(ReplayTest, CapturesAreDevicesOfTheirOwnAndPrintInTheirOrderHoweverManyPl
     const size_t lines = static_cast<size_t>(std::count(alone.begin(), alone.end(), '\n'));
     EXPECT_EQ(happened(three).size(), 2 * (lines - 1) + 2);
     EXPECT_NE(happened(three).back().find("count:1"), std::string::npos);
+
+    // Days of one device stay so behind a comment, and captures on one store come one by one.
+    write("day", "# one\n" + sample("0") + "\n{\"at\": 700}\n");
+    write("next",
+          "# two\n" + line("0", R"("call": "SDCImpl.getInstance")") + '\n' + report("2000") + '\n');
+    EXPECT_EQ(happened(run("--json --jobs 2 day next")).back(),
+              happened(run("--json --jobs 1 day next")).back());
+    const std::string ultrasonic = "persist.zuno.ultra.phone.enable.count";
+    write("used", line("0", R"("property": {")" + ultrasonic + R"(": "7"})") + '\n');
+    std::string outputs[2];
+    for (const char* jobs : {"1", "4"}) {
+        const std::string options = std::string("--json --jobs ") + jobs + " --properties " + jobs;
+        EXPECT_EQ(run(options + " used").status, 0);
+        const Played played =
+                run(options + ' ' + capture + ' ' + capture + ' ' + capture + ' ' + capture);
+        EXPECT_EQ(played.status, 0);
+        outputs[*jobs == '4'] = played.out;
+        EXPECT_EQ(storedIn(jobs, ultrasonic.c_str()), "0") << "the capture's mornings reset it";
+        EXPECT_EQ(storedIn(jobs, "persist.zuno.wechat.count.info"), "0_0_0_0");
+    }
+    EXPECT_EQ(outputs[0], outputs[1]);
+}
+
+TEST_F(ReplayTest, AKilledProcessIsAnErrorAndAKilledToolTakesItsProcessesAlong) {
+    // Nobody reads the output, so that the tool and those that play for it come to a stop.
+    ASSERT_EQ(mkfifo("lines", 0600), 0);
+    writeCapture("capture");
+    std::string captures;
+    for (int i = 0; i < 80; ++i) captures += " capture";
+    const std::string killPlayers =
+            " >lines 2>errors & exec 3<lines; read -r line <&3; "
+            "kill -9 $(cat /proc/$!/task/$!/children); cat <&3 >rest; wait $!; echo $?";
+    EXPECT_EQ(run("--json --jobs 2" + captures + killPlayers).out, "1\n");
+    EXPECT_NE(read("errors").find(": the process died\n"), std::string::npos) << read("errors");
+
+    ASSERT_EQ(mkfifo("pipe", 0600), 0);
+    const std::string killAll =
+            " pipe >played & exec 3>pipe; trap '' PIPE; echo '" + report("9") +
+            "' >&3; until grep -q event played; do :; done; kill -9 $!; "
+            "while echo >&3; do :; done 2>errors; echo over";  // nobody reads the trace any more
+    EXPECT_EQ(run("--json" + killAll).out, "over\n");
 }
 
 TEST_F(ReplayTest, ChecksExpectationsInOrderAndWithoutTheirTimes) {

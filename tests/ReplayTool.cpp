@@ -20,6 +20,15 @@ void ReplayToolTest::write(const std::string& name, const std::string& text) con
     std::ofstream(mFolder / name, std::ios::binary) << text;
 }
 
+void ReplayToolTest::writeCapture(const std::string& name) const {
+    std::ifstream example(EXAMPLES "/registrations.capture.txt");
+    std::string text;
+    for (std::string line; std::getline(example, line);) {
+        if (line[0] != '#') text += line + '\n';
+    }
+    write(name, text);
+}
+
 std::string ReplayToolTest::read(const std::string& name) const {
     std::ostringstream text;
     text << std::ifstream(mFolder / name).rdbuf();

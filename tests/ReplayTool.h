@@ -23,6 +23,12 @@ protected:
     void write(const std::string& name, const std::string& text) const;
 
     /**
+     * Writes the example of a capture as a device prints it: what begins with a comment may be a
+     * trace, and is never played beside another input.
+     */
+    void writeCapture(const std::string& name) const;
+
+    /**
      * `arguments` and `environment`, such as "NAME=value", as a shell takes them; `input` is its
      * standard input.
      */
