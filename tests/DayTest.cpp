@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include "day/Findings.h"
 #include "day/Journal.h"
 #include "day/Profile.h"
 #include "day/Samples.h"
@@ -201,6 +202,24 @@ TEST(DayTest, EachUseThatEarnsNoReportHasItsCause) {
         for (const auto& [cause, uses] : journal.causes()) causes.emplace_back(cause, uses.size());
         EXPECT_EQ(causes, expected);
     }
+}
+
+TEST(DayTest, WhatEndsInAGapMayHaveBeenSwitchedOffThere) {
+    const auto findings = [](const std::string& gap) {
+        size_t deaths = 0;
+        const day::Journal journal = gather(
+                {note(0, R"({"capture": {"files": ["a"], "registrations": 1, "from": 0, "to": 1, )"
+                         R"("knownTo": 90000}, "gaps": [)" +
+                                 gap + "]}"),
+                 on(1, "a", R"({"handle": 1})"),
+                 note(50, R"({"end": {"pkg": "a", "handle": 1, "how": "unseen"}})"), at(99, {})});
+        for (const day::Finding& finding : day::findFindings(journal)) {
+            deaths += finding.kind == day::Finding::Kind::kDied ? 1 : 0;
+        }
+        return deaths;
+    };
+    EXPECT_EQ(findings(R"({"from": 40000, "to": 49999})"), 1u);
+    EXPECT_EQ(findings(R"({"from": 40000, "to": 50000})"), 0u);
 }
 
 TEST(DayTest, ATableSplitsUsesAtMidnightAndKeepsSensorsOfOneTypeApart) {
