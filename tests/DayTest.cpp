@@ -191,6 +191,8 @@ TEST(DayTest, EachUseThatEarnsNoReportHasItsCause) {
              {{Cause::kFirstRate, 1}}},
             {{on(1, "a", {}, 500), report, reset, off(70, "a"), on(71, "b"), off(80, "b"), later},
              {{Cause::kStillOn, 1}, {Cause::kStaleRate, 1}}},
+            {{on(1, "a", {}, 500), report, reset, off(60, "a"), on(71, "b"), off(80, "b"), later},
+             {{Cause::kStillOn, 1}, {Cause::kStaleRate, 1}}},
             {{on(1, "a", handle), on(2, "a", other), off(9, "a", handle), off(10, "a", other),
               report},
              {{Cause::kTogether, 2}}},
