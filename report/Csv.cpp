@@ -39,7 +39,9 @@ std::string isoOf(int64_t ns, const std::optional<int64_t>& firstDay) {
     if (const int64_t rest = ns % base::kNsPerSecond; rest != 0) {
         // Milliseconds show a second as 1000, of which the digits behind the first are the
         // decimals.
-        text += '.' + base::formatMs(rest + base::kNsPerSecond).substr(1);
+        std::string decimals = base::formatMs(rest + base::kNsPerSecond).substr(1);
+        decimals.erase(std::remove(decimals.begin(), decimals.end(), '.'), decimals.end());
+        text += '.' + decimals;
     }
     return text;
 }

@@ -70,6 +70,13 @@ TEST_F(RecordedHostTest, WhatTheHostDoesInTelemetryIsItsOwn) {
                       Not(HasSubstr(R"("value": "77")"))));
 }
 
+TEST_F(RecordedHostTest, WhatBeganBeforeALossIsNotToldBehindIt) {
+    live("loses-while-a-message-hangs");
+    EXPECT_THAT(read("sensor-priv.jsonl"),
+                AllOf(HasSubstr("ultraExpired:101"), HasSubstr("goes on after a loss"),
+                      Not(HasSubstr(R"("name": "persist.zuno.device.invalid.count")"))));
+}
+
 TEST_F(RecordedHostTest, PseudonymsLeakNothingAndDamageNoNumber) {
     live("names", "SENSOR_PRIV_RECORD_REDACT=1");
     const std::string record = read("sensor-priv.jsonl");

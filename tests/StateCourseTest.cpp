@@ -178,7 +178,7 @@ TEST_F(StateCourseTest, FollowsTheEventLogWhereTheHistoryDoesNotRecord) {
             {"after a shutdown the display is off, whatever the log said last",
              kReset + kComplete + "+1h00m10s000ms (2) 050 +screen\n+1h00m20s000ms (2) SHUTDOWN\n",
              logged("10:00:10.000", on) + logged("10:00:11.000", charge("1")) +
-                     logged("10:00:30.000", charge("2")),
+                     logged("10:00:20.000", on) + logged("10:00:30.000", charge("2")),
              "09:59:50 d1 p2 c0 t0, 10:00:10 d2, 10:00:20 d1 p1, 10:00:30 p2, 12:00:00 p0"},
             {"the first record after a start names all, even where it does not count",
              kReset + "0 (2) *OVERFLOW*\n0 (2) 050 plug=usb +screen\n"

@@ -28,6 +28,7 @@
 
 #include "core/SDCImpl.h"
 #include "exception/FlowingDataException.h"
+#include "exception/UltraException.h"
 #include "platform/Telemetry.h"
 #include "rgb/RgbShotManager.h"
 
@@ -69,8 +70,8 @@ off_t recordSize() {
     return stat(recordPath().c_str(), &status) == 0 ? status.st_size : -1;
 }
 
-/** Runs `meanwhile` while a call hangs in telemetry. */
-void hangWhile(const std::function<void()>& meanwhile) {
+/** Runs `meanwhile` while what `call` brings about hangs in telemetry. */
+void hangWhile(const std::function<void()>& meanwhile, void (*call)() = report) {
     std::mutex mutex;
     std::condition_variable changed;
     bool hangs = false;
@@ -81,7 +82,7 @@ void hangWhile(const std::function<void()>& meanwhile) {
         changed.notify_all();
         changed.wait(lock, [&] { return isOver; });
     };
-    std::thread caller(report);
+    std::thread caller(call);
     {
         std::unique_lock lock(mutex);
         changed.wait(lock, [&] { return hangs; });
@@ -124,6 +125,12 @@ void full() {
     limit.rlim_cur = usual;
     setrlimit(RLIMIT_FSIZE, &limit);
     report();
+}
+
+/** A message has not done all when lines are lost, and does the rest when the record goes on. */
+void losesWhileAMessageHangs() {
+    hangWhile(full, [] { UltraException::getInstance()->doAction(4, {}); });
+    passMs(50);  // the worker ends its message
 }
 
 /** The file may not grow any more. */
@@ -301,6 +308,7 @@ const std::map<std::string, void (*)()> kHosts{
         {"forks-in-telemetry", forksInTelemetry},
         {"calls-from-log", callsFromLog},
         {"calls-from-telemetry", callsFromTelemetry},
+        {"loses-while-a-message-hangs", losesWhileAMessageHangs},
         {"names", names},
         {"leaves-its-folder", leavesItsFolder},
         {"calls", calls},
