@@ -74,6 +74,9 @@ TEST_F(StateCourseTest, FollowsTheBatteryHistory) {
                      "+1h11m00s000ms (2) TIME: 2024-05-02-10-05-00\n"
                      "+1h12m00s000ms (2) 050 -screen\n+1h20m00s000ms (2) 050 +camera\n",
              "", "09:59:50 d1 p2 c0 t0, 10:14:00 c1, 12:00:00 p0 c0"},
+            {"a prefix may be of milliseconds alone",
+             kReset + kComplete + "+500ms (2) 050 +screen\n", "",
+             "09:59:50 d2 p2 c0 t0, 12:00:00 d1 p0"},
             {"a prefix may be negative",
              kReset + kComplete +
                      "-10s000ms (2) TIME: 2024-05-02-10-00-00\n+5s000ms (2) 050 +screen\n",
