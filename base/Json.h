@@ -231,6 +231,15 @@ inline std::string toJson(std::string_view text) {
     return json;
 }
 
+/** A name or a line of a file for a message: as JSON, the first 200 bytes of a longer one. */
+inline std::string quote(std::string_view text) {
+    constexpr size_t kMost = 200;
+    if (text.size() <= kMost) return toJson(text);
+    size_t end = kMost;
+    while (end > 0 && (static_cast<unsigned char>(text[end]) & 0xC0U) == 0x80) --end;
+    return toJson(text.substr(0, end)) + "...";
+}
+
 /** The time `ns` in milliseconds, as `appendMs` writes it. */
 inline std::string formatMs(int64_t ns) {
     std::string text;

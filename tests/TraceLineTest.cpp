@@ -105,6 +105,7 @@ TEST(TraceLineTest, WhatIsAtALimitIsTakenAndWhatIsBeyondItIsNamed) {
             {R"({"args": []})", R"("at" is missing)"},
             {R"({"at": 1, "at": 2})", R"(the key "at" twice)"},
             {R"({"at": 1, "what": 1})", R"(unknown key "what")"},
+            {R"({"at": 1, "x)" + std::string(199, 'y') + "\u00e4" + R"(": 1})", "yyy\"..."},
             {R"({"at": 1, "boot": "device", "set": {}})", "more than one action"},
             {R"({"at": 1, "boot": "cold"})", R"("boot" must be)"},
             {R"({"at": 1, "call": 1})", R"("call" must be a text)"},

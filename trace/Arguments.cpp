@@ -44,7 +44,7 @@ Error read(element json, android::UltraExceptionInfo* info) {
         Error error = "is unknown";
         if (key == "packageName") error = trace::read(value, &info->packageName);
         if (key == "phoneState") error = trace::read(value, &info->phoneState);
-        if (error) return base::toJson(key) + ' ' + *error;
+        if (error) return base::quote(key) + ' ' + *error;
     }
     return {};
 }

@@ -53,7 +53,7 @@ Error readPicture(element json, const std::string& trace, platform::Picture* pic
     if (Error error = read(json, &path)) return error;
     // An absolute path stands for itself; standard input, "-", is beside the current directory.
     const auto file = std::filesystem::path(trace).parent_path() / path;
-    if (Error error = platform::readPng(file, picture)) return base::toJson(path) + ": " + *error;
+    if (Error error = platform::readPng(file, picture)) return base::quote(path) + ": " + *error;
     return {};
 }
 
@@ -101,9 +101,9 @@ Error readDisplay(element json, const std::string& trace, platform::DisplayChang
         } else if (key == "fault") {
             error = readFault(value, &change->fault.emplace());
         } else {
-            return "unknown key " + base::toJson(key);
+            return "unknown key " + base::quote(key);
         }
-        if (error) return base::toJson(key) + ' ' + *error;
+        if (error) return base::quote(key) + ' ' + *error;
     }
     if (change->picture && (change->size || change->color)) {
         return R"("png" together with "size" or "color")";

@@ -120,7 +120,7 @@ Error read(element json, std::vector<int32_t>* value) {
 
 Error checkKeys(object json) {
     const auto twice = [](std::string_view key) {
-        return "the key " + base::toJson(key) + " twice";
+        return "the key " + base::quote(key) + " twice";
     };
     if (json.size() > kFewKeys) {
         std::unordered_set<std::string_view> keys;

@@ -55,7 +55,7 @@ Error readCall(element json, Call* call) {
     if (json.get(name) != simdjson::SUCCESS) return R"("call" must be a text)";
     const std::optional<size_t> index = findCall(name);
     if (!index) {
-        return "unknown call " + base::toJson(name) + "; the nearest is " +
+        return "unknown call " + base::quote(name) + "; the nearest is " +
                base::toJson(nearestCall(name));
     }
     call->index = *index;
@@ -68,10 +68,10 @@ Error readVariables(element json, VariableWrites* variables) {
     if (Error error = checkKeys(values)) return error;
     for (const auto [name, value] : values) {
         const std::optional<size_t> index = findVariable(name);
-        if (!index) return "unknown variable " + base::toJson(name);
+        if (!index) return "unknown variable " + base::quote(name);
         auto& write = variables->writes.emplace_back(*index, 0);
         if (Error error = readVariable(*index, value, &write.second)) {
-            return base::toJson(name) + ' ' + *error;
+            return base::quote(name) + ' ' + *error;
         }
     }
     return {};
@@ -86,11 +86,11 @@ Error readProperties(element json, PropertyWrites* properties) {
         if (name.find('\0') != std::string_view::npos) return "a property's name holds a NUL";
         if (!value.is_null()) {
             if (Error error = read(value, &write.second.emplace())) {
-                return base::toJson(name) + ' ' + *error + " or null";
+                return base::quote(name) + ' ' + *error + " or null";
             }
         }
         if (Error error = platform::refuseProperty(write.first, write.second.value_or(""))) {
-            return base::toJson(name) + ": " + *error;
+            return base::quote(name) + ": " + *error;
         }
     }
     return {};
@@ -108,8 +108,8 @@ Error readTexts(element json, const std::array<std::string_view, Size>& keys,
         if (!ignored.empty() && key == ignored) continue;
         const auto place =
                 static_cast<size_t>(std::find(keys.begin(), keys.end(), key) - keys.begin());
-        if (place == Size) return "has the unknown key " + base::toJson(key);
-        if (Error error = read(value, &(*texts)[place])) return base::toJson(key) + ' ' + *error;
+        if (place == Size) return "has the unknown key " + base::quote(key);
+        if (Error error = read(value, &(*texts)[place])) return base::quote(key) + ' ' + *error;
         ++found;
     }
     return found == Size ? Error() : "lacks a key";
@@ -136,7 +136,7 @@ Error readExpectation(element json, Expectation* expectation) {
         }
         expectation->entry = propertyEntry(texts[0], texts[1]);
     } else {
-        return R"("expect" has the unknown key )" + base::toJson(kind);
+        return R"("expect" has the unknown key )" + base::quote(kind);
     }
     return {};
 }
@@ -161,7 +161,7 @@ Error readAction(std::string_view key, element value, const std::string& trace, 
     }
     if (key == "expect") return readExpectation(value, &action.emplace<Expectation>());
     if (key == "boot") return readBoot(value, &action.emplace<BootKind>());
-    return "unknown key " + base::toJson(key);
+    return "unknown key " + base::quote(key);
 }
 
 }  // namespace

@@ -10,7 +10,7 @@ namespace capture {
 struct SkippedLines {
     int64_t count = 0;
     int64_t firstNumber = 0;
-    std::string firstText;  // its start
+    std::string firstQuoted;  // its start
 
     void add(std::string_view text, int64_t lineNumber);
 
