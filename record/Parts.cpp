@@ -43,7 +43,7 @@ bool isPart(int fd) {
 /** What there is to know of an open file. */
 struct FileStatus {
     dev_t device = 0;
-    ino_t number = 0;
+    uint64_t number = 0;
     bool hasName = false;
     size_t size = 0;
 };
@@ -55,8 +55,8 @@ struct FileStatus {
 std::optional<FileStatus> statusOf(int fd) {
     struct statx lean {};
     if (statx(fd, "", AT_EMPTY_PATH, STATX_INO | STATX_NLINK | STATX_SIZE, &lean) == 0) {
-        return FileStatus{makedev(lean.stx_dev_major, lean.stx_dev_minor), lean.stx_ino,
-                          lean.stx_nlink > 0, static_cast<size_t>(lean.stx_size)};
+        return FileStatus{static_cast<dev_t>(makedev(lean.stx_dev_major, lean.stx_dev_minor)),
+                          lean.stx_ino, lean.stx_nlink > 0, static_cast<size_t>(lean.stx_size)};
     }
     struct stat full {};
     if (fstat(fd, &full) != 0) return std::nullopt;

@@ -86,7 +86,7 @@ private:
     size_t mMaxSize = 0;
     int mFd = -1;
     dev_t mDevice = 0;  // of the file, whose descriptor the host may close and use
-    ino_t mNumber = 0;
+    uint64_t mNumber = 0;
     size_t mSize = 0;  // bytes, without a note of `writeNote`
     size_t mNoteSize = 0;
     bool mIsGone = false;
