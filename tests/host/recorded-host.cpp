@@ -12,9 +12,11 @@
 #include <cstring>
 #include <functional>
 #include <map>
+#include <memory>
 #include <mutex>
 #include <string>
 #include <thread>
+#include <utility>
 
 #include <android/log.h>
 #include <cutils/properties.h>
@@ -77,27 +79,31 @@ off_t recordSize() {
 
 /** Runs `meanwhile` while what `call` brings about hangs in telemetry. */
 void hangWhile(const std::function<void()>& meanwhile, void (*call)() = report) {
-    std::mutex mutex;
-    std::condition_variable changed;
-    bool hangs = false;
-    bool isOver = false;
-    gTelemetry = [&](const std::string&) {
-        std::unique_lock lock(mutex);
-        if (std::exchange(hangs, true)) return;
-        changed.notify_all();
-        changed.wait(lock, [&] { return isOver; });
+    struct State {
+        std::mutex mutex;
+        std::condition_variable changed;
+        bool hangs = false;
+        bool isOver = false;
+    };
+    // Held by telemetry: the worker may still be in it when this returns.
+    const auto state = std::make_shared<State>();
+    gTelemetry = [state](const std::string&) {
+        std::unique_lock lock(state->mutex);
+        if (std::exchange(state->hangs, true)) return;
+        state->changed.notify_all();
+        state->changed.wait(lock, [&] { return state->isOver; });
     };
     std::thread caller(call);
     {
-        std::unique_lock lock(mutex);
-        changed.wait(lock, [&] { return hangs; });
+        std::unique_lock lock(state->mutex);
+        state->changed.wait(lock, [&] { return state->hangs; });
     }
     meanwhile();
     {
-        const std::lock_guard lock(mutex);
-        isOver = true;
+        const std::lock_guard lock(state->mutex);
+        state->isOver = true;
     }
-    changed.notify_all();
+    state->changed.notify_all();
     caller.join();
 }
 
