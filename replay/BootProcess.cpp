@@ -13,6 +13,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "base/FileIo.h"
 #include "platform/PropertyService.h"
 #include "replay/OneProcessor.h"
 
@@ -27,24 +28,23 @@ namespace {
 
 constexpr int kIdleMs = 200;  // between two calls of `idle` while nothing comes
 
-std::optional<Failure> openStore(const Device& device) {
+base::Result<void> openStore(const Device& device) {
     if (device.propertyFile) {
         if (const auto error = platform::openProperties(*device.propertyFile)) {
-            return Failure{*error};
+            return base::fail(*error);
         }
     } else if (!device.properties.empty()) {
         const auto* begin = reinterpret_cast<const unsigned char*>(device.properties.data());
         platform::restoreProperties({begin, begin + device.properties.size()});
     }
-    return std::nullopt;
+    return {};
 }
 
 /** Plays the boot in this process. */
 base::Result<NextBoot> playHere(const Boot& boot, const trace::TraceLine* first,
                                 const Device& device, const Channels& channels) {
     try {
-        if (auto failure = openStore(device)) return tl::unexpected(std::move(*failure));
-        return play(boot, first, channels);
+        return openStore(device).and_then([&] { return play(boot, first, channels); });
     } catch (const std::bad_alloc&) {
         const trace::TraceReader& reader = *channels.reader;
         return base::fail(base::at(reader.name(), reader.lineNumber()) + "not enough memory",
@@ -141,7 +141,10 @@ base::Result<NextBoot> runBoot(const Boot& boot, const trace::TraceLine* first,
         prctl(PR_SET_PDEATHSIG, SIGKILL);
         if (getppid() != tool) _exit(kStatusFailed);
         close(ends[0]);
-        trace::RecordWriter records(ends[1]);
+        // Ends with the tool, which reads it.
+        trace::RecordWriter records([fd = ends[1]](std::string_view bytes) {
+            if (!base::writeAll(fd, bytes.data(), bytes.size())) _exit(kStatusFailed);
+        });
         playAndTell(boot, first, *device, {reader, &records, wanted});
         _exit(0);
     }

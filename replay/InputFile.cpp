@@ -1,5 +1,6 @@
 #include "replay/InputFile.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <utility>
@@ -8,37 +9,54 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "base/Result.h"
+#include "capture/CaptureImport.h"
 #include "capture/text/TextSource.h"
 #include "trace/TraceLine.h"
 
 namespace replay {
 
+namespace {
+
+constexpr std::string_view kMark = "\xEF\xBB\xBF";  // the byte order mark of UTF-8
+
+}  // namespace
+
 bool InputFile::isCapture() const {
     return first && first->find_first_not_of(" \t") != first->find('{');
 }
 
-std::optional<base::Failure> open(const std::string& name, size_t inputs, InputFile* file) {
+base::Result<InputFile> open(const std::string& name, size_t inputs) {
     const int fd = name == "-" ? dup(STDIN_FILENO) : ::open(name.c_str(), O_RDONLY | O_CLOEXEC);
-    if (fd < 0) return base::Failure{name + ": cannot open: " + std::strerror(errno)};
+    if (fd < 0) return base::fail(name + ": cannot open: " + std::strerror(errno));
     auto opened = capture::openText(fd);
-    if (!opened) return base::Failure{name + ": " + opened.error().text, opened.error().status};
-    file->name = name;
-    file->lines = std::make_unique<base::LineReader>(std::move(opened->text));
+    if (!opened) return base::fail(name + ": " + opened.error().text, opened.error().status);
+    InputFile file{name, std::make_unique<base::LineReader>(std::move(opened->text)), {}};
     bool isEmpty = name != "/dev/null" || inputs == 1;
-    while ((file->first = file->lines->next()) && trace::isSkipped(*file->first)) {
-        isEmpty &= file->first->find('#') == std::string_view::npos;
+    while ((file.first = file.lines->next()) && trace::isSkipped(*file.first)) {
+        isEmpty &= file.first->find('#') == std::string_view::npos;
     }
-    if (file->lines->error()) {
-        return base::Failure{base::at(name, file->lines->lineNumber()) + *file->lines->error()};
+    if (file.lines->error()) {
+        return base::fail(base::at(name, file.lines->lineNumber()) + *file.lines->error());
     }
-    if (!file->first && isEmpty) {
-        return base::Failure{name + ": empty: adb leaves such a file when it finds no device"};
+    if (!file.first && isEmpty) {
+        return base::fail(name + ": empty: adb leaves such a file when it finds no device");
     }
-    if (file->first && !opened->isPlain && !file->isCapture()) {
-        return base::Failure{name + ": a trace must be plain UTF-8, not packed or UTF-16"};
+    if (file.first && !opened->isPlain && !file.isCapture()) {
+        return base::fail(name + ": a trace must be plain UTF-8, not packed or UTF-16");
     }
-    return std::nullopt;
+    return file;
+}
+
+base::Result<capture::ImportedCapture> importCaptures(const std::vector<std::string>& names,
+                                                      size_t inputs) {
+    capture::CaptureImport import;
+    for (const std::string& name : names) {
+        const auto file = open(name, inputs);
+        if (!file) return tl::unexpected(file.error());
+        if (!file->isCapture()) return base::fail(name + ": not a device capture");
+        import.add(name, *file->first, file->lines.get());
+    }
+    return import.finish();
 }
 
 bool isSurelyCapture(const std::string& name) {
@@ -48,10 +66,13 @@ bool isSurelyCapture(const std::string& name) {
     char bytes[4096];
     const ssize_t count = fd < 0 ? 0 : read(fd, bytes, sizeof(bytes));
     if (fd >= 0) close(fd);
-    if (count <= 0) return false;
-    const std::string_view text(bytes, static_cast<size_t>(count));
-    const size_t first = text.find_first_not_of(" \t\r\n\xEF\xBB\xBF");
-    return first != std::string_view::npos && text[first] != '{' && text[first] != '#';
+    std::string_view text(bytes, static_cast<size_t>(std::max<ssize_t>(count, 0)));
+    if (text.substr(0, kMark.size()) == kMark) text.remove_prefix(kMark.size());
+    while (trace::isSkipped(text.substr(0, text.find('\n')))) {
+        if (text.find('\n') == std::string_view::npos) return false;
+        text.remove_prefix(text.find('\n') + 1);
+    }
+    return text[text.find_first_not_of(" \t\r")] != '{';
 }
 
 }  // namespace replay

@@ -5,9 +5,11 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "base/LineReader.h"
 #include "base/Result.h"
+#include "capture/ImportedCapture.h"
 
 namespace replay {
 
@@ -22,17 +24,21 @@ struct InputFile {
 };
 
 /**
- * Opens `name`, one of so many `inputs`, into `*file`. Returns nothing, or why it cannot be read.
+ * Opens `name`, one of so many `inputs`.
  *
  * An input without anything but blank lines is refused: nobody means to play one, but a command
  * that failed leaves one. `/dev/null` beside others is meant: it has the others' lines name their
  * file. A trace may consist of comments.
  */
-std::optional<base::Failure> open(const std::string& name, size_t inputs, InputFile* file);
+base::Result<InputFile> open(const std::string& name, size_t inputs);
+
+/** Makes a trace of the captures `names`, of one device, which stand for one of `inputs`. */
+base::Result<capture::ImportedCapture> importCaptures(const std::vector<std::string>& names,
+                                                      size_t inputs);
 
 /**
  * Whether the file `name` is a capture for sure, as its first bytes tell. Only a regular file is
- * looked at; one that begins with a comment may be either.
+ * looked at; one that begins with many comments may be either.
  */
 bool isSurelyCapture(const std::string& name);
 

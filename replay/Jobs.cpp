@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cerrno>
 #include <csignal>
-#include <cstdio>
 #include <cstring>
 #include <new>
+#include <string_view>
 #include <utility>
 
 #include <fcntl.h>
@@ -16,17 +16,15 @@
 #include <unistd.h>
 
 #include "base/FileIo.h"
-#include "base/Result.h"
 
 namespace replay {
 
 namespace {
 
-/** What stands in front of a file's output in a worker's pipe. */
+/** What stands in front of a file's records in a worker's pipe. */
 struct Header {
     uint64_t file;
-    uint64_t size;  // of the texts, each behind its own size
-    int32_t status;
+    uint64_t size;
 };
 
 std::atomic<size_t>* sharedCounter() {
@@ -35,26 +33,12 @@ std::atomic<size_t>* sharedCounter() {
     return memory == MAP_FAILED ? nullptr : new (memory) std::atomic<size_t>(0);
 }
 
-/** Makes `fd` a memory file; what is printed there can then be taken out by `takeOutput`. */
-bool gather(int fd) {
-    const int file = memfd_create("output", MFD_CLOEXEC);
-    return file >= 0 && dup2(file, fd) == fd && close(file) == 0;
-}
-
-std::vector<unsigned char> takeOutput(int fd) {
-    lseek(fd, 0, SEEK_SET);
-    std::vector<unsigned char> bytes = base::readAll(fd);
-    lseek(fd, 0, SEEK_SET);
-    if (ftruncate(fd, 0) != 0) _exit(base::kStatusFailed);
-    return bytes;
-}
-
 }  // namespace
 
-Jobs::Jobs(int count, std::vector<int> outputs, Work work, std::function<void(size_t)> tell)
+Jobs::Jobs(int count, Play play, Take take, std::function<void(size_t)> tell)
       : mCount(count),
-        mOutputs(std::move(outputs)),
-        mWork(std::move(work)),
+        mPlay(std::move(play)),
+        mTake(std::move(take)),
         mTell(std::move(tell)),
         mNext(sharedCounter()) {}
 
@@ -63,18 +47,18 @@ Jobs::~Jobs() {
     if (mNext != nullptr) munmap(mNext, sizeof(*mNext));
 }
 
-int Jobs::run(const std::vector<std::string>& names) {
+base::Result<void> Jobs::run(const std::vector<std::string>& names) {
     mResults.clear();
-    mPrinted = 0;
+    mHandedOn = 0;
     if (mNext != nullptr) *mNext = 0;
     const size_t count = std::min(static_cast<size_t>(mCount), names.size());
     for (size_t i = 0; i < count; ++i) {
         if (mNext != nullptr && startWorker(names)) continue;
-        std::fprintf(stderr, "cannot start a process: %s\n", std::strerror(errno));
-        return base::kStatusFailed;
+        return base::fail(std::string("cannot start a process: ") + std::strerror(errno),
+                          base::kStatusFailed);
     }
-    int status = 0;
-    while (!mWorkers.empty() && status == 0) {
+    bool isWanted = true;
+    while (!mWorkers.empty() && isWanted) {
         std::vector<pollfd> ready;
         for (const Worker& worker : mWorkers) ready.push_back({worker.results, POLLIN, 0});
         poll(ready.data(), ready.size(), -1);
@@ -84,12 +68,11 @@ int Jobs::run(const std::vector<std::string>& names) {
             waitpid(mWorkers[i].process, nullptr, 0);
             mWorkers.erase(mWorkers.begin() + static_cast<ptrdiff_t>(i));
         }
-        status = printDone();
+        isWanted = handOn();
     }
     endWorkers();
-    if (status != 0 || mPrinted == names.size()) return status;
-    std::fprintf(stderr, "%s: the process died\n", names[mPrinted].c_str());
-    return base::kStatusFailed;
+    if (!isWanted || mHandedOn == names.size()) return {};
+    return base::fail(names[mHandedOn] + ": the process died", base::kStatusFailed);
 }
 
 bool Jobs::startWorker(const std::vector<std::string>& names) {
@@ -113,37 +96,19 @@ bool Jobs::startWorker(const std::vector<std::string>& names) {
 }
 
 void Jobs::work(const std::vector<std::string>& names, int results) {
-    for (const int output : mOutputs) {
-        if (!gather(output)) _exit(base::kStatusFailed);
-    }
-    int status = 0;
-    // Nothing behind a file that fails is printed, so this process need not go on.
-    for (size_t file; status == 0 && (file = mNext->fetch_add(1)) < names.size();) {
-        status = mWork(names[file]);
-        std::string texts;
-        for (const int output : mOutputs) {
-            const auto bytes = takeOutput(output);
-            const uint64_t size = bytes.size();
-            texts.append(reinterpret_cast<const char*>(&size), sizeof(size));
-            texts.append(bytes.begin(), bytes.end());
-        }
-        const Header header{file, texts.size(), status};
+    std::string bytes;
+    trace::RecordWriter records([&](std::string_view gathered) { bytes += gathered; });
+    // Nothing behind a file that fails is wanted, so this process need not go on.
+    bool isPlayed = true;
+    for (size_t file; isPlayed && (file = mNext->fetch_add(1)) < names.size(); bytes.clear()) {
+        isPlayed = mPlay(names[file], &records);
+        records.flush();
+        const Header header{file, bytes.size()};
         const bool told = base::writeAll(results, &header, sizeof(header)) &&
-                          base::writeAll(results, texts.data(), texts.size());
+                          base::writeAll(results, bytes.data(), bytes.size());
         if (!told) _exit(base::kStatusFailed);
     }
     _exit(0);
-}
-
-std::vector<std::string> Jobs::takeApart(const char* texts) const {
-    std::vector<std::string> parts;
-    for (size_t i = 0; i < mOutputs.size(); ++i) {
-        uint64_t size = 0;
-        std::memcpy(&size, texts, sizeof(size));
-        parts.emplace_back(texts + sizeof(size), size);
-        texts += sizeof(size) + size;
-    }
-    return parts;
 }
 
 bool Jobs::receive(Worker* worker) {
@@ -156,27 +121,21 @@ bool Jobs::receive(Worker* worker) {
     for (Header header; received.size() >= sizeof(header);) {
         std::memcpy(&header, received.data(), sizeof(header));
         if (received.size() < sizeof(header) + header.size) break;
-        mResults[header.file] = {header.status, takeApart(received.data() + sizeof(header))};
+        mResults[header.file] = received.substr(sizeof(header), header.size);
         received.erase(0, sizeof(header) + header.size);
-        mTell(mPrinted + mResults.size());
+        mTell(mHandedOn + mResults.size());
     }
     return true;
 }
 
-int Jobs::printDone() {
-    for (auto done = mResults.begin(); done != mResults.end() && done->first == mPrinted;
-         done = mResults.erase(done), ++mPrinted) {
-        const auto& [status, texts] = done->second;
-        for (size_t i = 0; i < texts.size(); ++i) {
-            if (base::writeAll(mOutputs[i], texts[i].data(), texts[i].size())) continue;
-            std::fprintf(stderr, "cannot write %s: %s\n",
-                         mOutputs[i] == STDOUT_FILENO ? "standard output" : "an output",
-                         std::strerror(errno));
-            return base::kStatusFailed;
-        }
-        if (status != 0) return status;
+bool Jobs::handOn() {
+    bool isWanted = true;
+    for (auto next = mResults.begin();
+         isWanted && next != mResults.end() && next->first == mHandedOn;
+         next = mResults.erase(next), ++mHandedOn) {
+        isWanted = mTake(next->second);
     }
-    return 0;
+    return isWanted;
 }
 
 void Jobs::endWorkers() {

@@ -4,7 +4,7 @@
 
 #include <unistd.h>
 
-#include "report/RealTime.h"
+#include "replay/RealTime.h"
 #include "report/Text.h"
 
 namespace replay {
@@ -19,11 +19,11 @@ constexpr int64_t kIntervalNs = 200'000'000;
 Progress::Progress(size_t files, bool isWanted)
       : mFiles(files),
         mIsWanted(isWanted && isatty(STDERR_FILENO) != 0),
-        mStarted(report::realTime()) {}
+        mStarted(realTime()) {}
 
 void Progress::show(size_t done, const std::string& name, int64_t line) {
     if (!mIsWanted) return;
-    const int64_t now = report::realTime();
+    const int64_t now = realTime();
     if (now - mStarted < kFirstAfterNs || now - mShown < kIntervalNs) return;
     mShown = now;
     std::string text = std::to_string(done) + " of " + std::to_string(mFiles) + " files";

@@ -4,37 +4,36 @@
 #include <csignal>
 #include <cstdio>
 #include <new>
-#include <optional>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include <unistd.h>
 
 #include "base/Result.h"
 #include "platform/Display.h"
-#include "replay/FilePlayer.h"
 #include "replay/InputFile.h"
+#include "replay/InputPlayer.h"
 #include "replay/Jobs.h"
+#include "replay/Outputs.h"
 #include "replay/Progress.h"
+#include "replay/TracePrinter.h"
 
 namespace replay {
 
-using base::Failure;
+using trace::Record;
 
 namespace {
 
 /** Says what is wrong, if something is. Returns the exit status. */
-int say(const std::optional<Failure>& failure) {
-    if (!failure) return 0;
-    std::fprintf(stderr, "%s\n", failure->text.c_str());
-    return failure->status;
+int say(const base::Result<void>& result) {
+    if (result) return 0;
+    std::fprintf(stderr, "%s\n", result.error().text.c_str());
+    return result.error().status;
 }
 
 /** Whether what appears on a terminal shows by itself how far the replay has come. */
 bool showsItself(const Options& options) {
-    const bool asTheyCome =
-            options.json || options.log || options.printTrace || options.inputs() > 1;
+    const bool asTheyCome = options.json || options.log || options.inputs() > 1;
     return asTheyCome && isatty(STDOUT_FILENO) != 0;
 }
 
@@ -44,80 +43,82 @@ public:
     explicit Replay(const Options& options)
           : mOptions(options),
             mProgress(options.inputs(), !showsItself(options)),
-            mPlayer(options, &mProgress) {
-        mDevice.propertyFile = options.properties;
-    }
+            mOutputs(options, &mProgress),
+            mPlayer(options, {[this](const Record& record) { take(record); },
+                              [this] { return mOutputs.wanted(); },
+                              [this](const std::string& name, int64_t line) {
+                                  mOutputs.flush();
+                                  mProgress.show(mPlayed, name, line);
+                              }}) {}
 
     int run() {
-        if (const auto failure = mPlayer.openOutputs()) return say(failure);
-        const int status = playAll();
+        if (const auto opened = mOutputs.open(mOptions); !opened) return say(opened);
+        const int status = say(playAll());
         // Of a run that failed nothing is made: what was there before stays.
         if (status != 0 && status != base::kStatusDiffers) return status;
-        const int finished = say(mPlayer.finish());
+        const int finished = say(mOutputs.finish());
         return status != 0 ? status : finished;
     }
 
 private:
-    int playAll() {
-        for (const std::string& name : mOptions.baseline) {
-            if (const int status = playInMemory(name); status != 0) return status;
+    base::Result<void> playAll() {
+        if (mOptions.merge) {
+            for (const std::string& name : mOptions.baseline) {
+                if (!mPlayer.play(name)) return result();
+            }
+            mPlayer.playMerged();
+            return result();
         }
-        const std::vector<std::string>& files = mOptions.files;
-        if (mOptions.merge) return inMemory(files.front(), [&] { return runMerged(); });
-        Jobs jobs(
-                mOptions.jobs, mPlayer.outputs(),
-                [this](const std::string& name) { return playInMemory(name); },
-                [this](size_t done) { mProgress.show(done, "", 0); });
-        for (auto next = files.begin(); next != files.end();) {
+        std::vector<std::string> names = mOptions.baseline;
+        names.insert(names.end(), mOptions.files.begin(), mOptions.files.end());
+        const bool mayUseJobs = mOptions.jobs > 1 && !mOptions.properties;
+        for (auto next = names.begin(); next != names.end() && !mOutputs.failure();) {
             const auto end =
-                    mayUseJobs() ? std::find_if_not(next, files.end(), isSurelyCapture) : next;
-            int status = 0;
+                    mayUseJobs ? std::find_if_not(next, names.end(), isSurelyCapture) : next;
             if (end - next > 1) {
-                status = jobs.run({next, end});
+                if (const auto ran = playAtOnce({next, end}); !ran) return ran;
                 next = end;
             } else {
-                status = playInMemory(*next++);
+                mPlayer.play(*next++);
             }
-            if (status != 0) return status;
         }
-        return 0;
+        return result();
     }
 
-    /** What is made of all inputs together needs their days in this process. */
-    bool mayUseJobs() const {
-        return mOptions.jobs > 1 && !mOptions.properties && !mOptions.printTrace &&
-               !mOptions.page && !mOptions.timeline && mOptions.baseline.empty();
+    base::Result<void> playAtOnce(const std::vector<std::string>& captures) {
+        // A capture's first note asks for the records of calls.
+        const trace::WantedRecords wanted{true, mOutputs.wanted().counters};
+        const auto play = [&](const std::string& name, trace::RecordWriter* records) {
+            const Audience audience{[&](const Record& record) { records->add(record); },
+                                    [&] { return wanted; }, [](const std::string&, int64_t) {}};
+            return InputPlayer(mOptions, audience).play(name);
+        };
+        const auto takeAll = [this](const std::string& records) {
+            trace::RecordReader().take(records.data(), records.size(),
+                                       [this](const Record& record) { take(record); });
+            return !mOutputs.failure();
+        };
+        const auto tell = [played = mPlayed, this](size_t done) {
+            mProgress.show(played + done, "", 0);
+        };
+        return Jobs(mOptions.jobs, play, takeAll, tell).run(captures);
     }
 
-    /** What `work` with a file returns, or says, if there is not enough memory for it. */
-    template <typename Work>
-    static int inMemory(const std::string& name, Work work) {
-        try {
-            return work();
-        } catch (const std::bad_alloc&) {
-            return say(Failure{name + ": not enough memory", base::kStatusFailed});
-        }
+    void take(const Record& record) {
+        mOutputs.take(record);
+        if (record.kind == Record::Kind::kPlayed) ++mPlayed;
     }
 
-    int runMerged() {
-        return say(mOptions.printTrace ? mPlayer.printMerged() : mPlayer.playMerged(&mDevice));
-    }
-
-    int playInMemory(const std::string& name) {
-        return inMemory(name, [&] { return play(name); });
-    }
-
-    int play(const std::string& name) {
-        InputFile file;
-        if (const auto failure = open(name, mOptions.inputs(), &file)) return say(failure);
-        if (mOptions.printTrace) return say(mPlayer.printTrace(std::move(file)));
-        return say(mPlayer.play(std::move(file), &mDevice));
+    base::Result<void> result() const {
+        if (mOutputs.failure()) return tl::unexpected(*mOutputs.failure());
+        return {};
     }
 
     const Options& mOptions;
     Progress mProgress;
-    FilePlayer mPlayer;
-    Device mDevice;
+    Outputs mOutputs;
+    InputPlayer mPlayer;
+    size_t mPlayed = 0;  // inputs
 };
 
 }  // namespace
@@ -125,10 +126,15 @@ private:
 int replayFiles(const Options& options) {
     // A write beyond the limit of a file's size is an error, and not the end of the tool.
     std::signal(SIGXFSZ, SIG_IGN);
-    if (const auto error = platform::shareDisplay()) {
-        return say(Failure{*error, base::kStatusFailed});
+    try {
+        if (options.printTrace) return say(printTraces(options));
+        if (const auto error = platform::shareDisplay()) {
+            return say(base::fail(*error, base::kStatusFailed));
+        }
+        return Replay(options).run();
+    } catch (const std::bad_alloc&) {
+        return say(base::fail("not enough memory", base::kStatusFailed));
     }
-    return Replay(options).run();
 }
 
 }  // namespace replay

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <optional>
 #include <string>
 
@@ -23,7 +24,10 @@ public:
     virtual void begin([[maybe_unused]] const std::string& name) {}
     virtual void take(const trace::Record& record) = 0;
 
-    /** After the last record; `isWhole` tells whether the input was played to its end. */
+    /** After the last record: the real time that the input took, ns. */
+    virtual void took([[maybe_unused]] int64_t ns) {}
+
+    /** After that; `isWhole` tells whether the input was played to its end. */
     virtual void end([[maybe_unused]] bool isWhole) {}
 
     /** After the last input. */

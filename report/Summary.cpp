@@ -12,14 +12,12 @@
 #include "report/EventText.h"
 #include "report/FindingText.h"
 #include "report/OnNowText.h"
-#include "report/RealTime.h"
 #include "report/Text.h"
 
 namespace report {
 
 void Summary::begin(const std::string& name) {
     mJournal.begin(name);
-    mStarted = realTime();
 }
 
 void Summary::end(bool isWhole) {
@@ -127,7 +125,7 @@ void Summary::printCauses() {
 void Summary::printEnd(bool isWhole) {
     char seconds[32];
     std::snprintf(seconds, sizeof(seconds), "%.3f",
-                  static_cast<double>(realTime() - mStarted) / 1e9);
+                  static_cast<double>(mTook) / 1e9);
     mOut->write(std::string(isWhole ? "\nPlayed " : "\nStopped after ") +
                 count(mJournal.boots().size(), "boot") + ", " +
                 base::formatDuration(std::chrono::nanoseconds(mJournal.played())) +

@@ -22,6 +22,7 @@ public:
     trace::WantedRecords wanted() const override { return {true, false}; }
     void begin(const std::string& name) override;
     void take(const trace::Record& record) override { mJournal.take(record); }
+    void took(int64_t ns) override { mTook = ns; }
     void end(bool isWhole) override;
 
 private:
@@ -40,7 +41,7 @@ private:
     Terminal mTerminal;
     const size_t mLimit;
     day::Journal mJournal;
-    int64_t mStarted = 0;  // real time, ns
+    int64_t mTook = 0;  // real time, ns
 };
 
 }  // namespace report

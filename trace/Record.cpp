@@ -2,11 +2,6 @@
 
 #include <cstring>
 
-#include <unistd.h>
-
-#include "base/FileIo.h"
-#include "base/Result.h"
-
 namespace trace {
 
 namespace {
@@ -35,7 +30,7 @@ void RecordWriter::add(const Record& record) {
 }
 
 void RecordWriter::flush() {
-    if (!base::writeAll(mFd, mGathered.data(), mGathered.size())) _exit(base::kStatusFailed);
+    mHandOn(mGathered);
     mGathered.clear();
 }
 

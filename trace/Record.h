@@ -6,6 +6,7 @@
 #include <functional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 #include "trace/Words.h"
 
@@ -34,6 +35,11 @@ struct Record {
 
         kCounters,  // the library's counters have changed: trace::Counters, as bytes; if wanted
 
+        // Around the records of an input.
+        kInput,    // it is about to be played: its name
+        kWarning,  // what is doubtful about it: a line for standard error
+        kPlayed,   // it is over; `number`: the real time that it took, ns
+
         // What a process leaves to the tool; no report gets these.
         kNextBoot,  // it ended by a boot line: its note, the properties in memory; `value`:
                     // BootKind
@@ -56,19 +62,21 @@ struct WantedRecords {
     bool counters = false;
 };
 
-/** Gathers records and writes them, as bytes, to a descriptor. One thread at a time may use it. */
+/** Gathers records as bytes. One thread at a time may use it. */
 class RecordWriter {
 public:
-    explicit RecordWriter(int fd) : mFd(fd) {}
+    /** `handOn` gets the bytes, in blocks. */
+    explicit RecordWriter(std::function<void(std::string_view)> handOn)
+          : mHandOn(std::move(handOn)) {}
 
-    /** Takes a record; writes what is gathered when there is much of it. */
+    /** Takes a record; hands on what is gathered when there is much of it. */
     void add(const Record& record);
 
-    /** Writes what is gathered. Ends the process with status 1 if nobody reads it any more. */
+    /** Hands on what is gathered. */
     void flush();
 
 private:
-    const int mFd;
+    const std::function<void(std::string_view)> mHandOn;
     std::string mGathered;
 };
 

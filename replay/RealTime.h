@@ -4,7 +4,7 @@
 
 #include <time.h>
 
-namespace report {
+namespace replay {
 
 /** The time that passes outside of a replay, ns; the monotonic clock is the replay's. */
 inline int64_t realTime() {
@@ -13,4 +13,4 @@ inline int64_t realTime() {
     return int64_t{now.tv_sec} * 1'000'000'000 + now.tv_nsec;
 }
 
-}  // namespace report
+}  // namespace replay
