@@ -186,8 +186,12 @@ int main(int argc, char** argv) {
     } catch (const CLI::ExtrasError& error) {
         return refuseOption(app, error);
     } catch (const CLI::ParseError& error) {
-        const int status = app.exit(error) == 0 ? 0 : base::kStatusBadInput;
-        return std::cout.flush() ? status : base::kStatusFailed;
+        if (error.get_exit_code() != 0) {
+            std::cerr << error.what() << '\n';
+            return base::kStatusBadInput;
+        }
+        app.exit(error);  // help or version
+        return std::cout.flush() ? 0 : base::kStatusFailed;
     }
     if (const auto clash = base::findClash(filesOf(options))) {
         std::cerr << clash->text << '\n';
