@@ -16,6 +16,9 @@ namespace {
 /** How long a process waits for others that use the file. */
 constexpr int kBusyMs = 10'000;
 
+/** What SQLite sets up once is there in processes that are forked later. */
+[[maybe_unused]] const int kInitialised = sqlite3_initialize();
+
 }  // namespace
 
 PropertyStore::PropertyStore() : PropertyStore(nullptr, ":memory:") {}
@@ -33,12 +36,8 @@ PropertyStore::PropertyStore(std::shared_ptr<const StoreFile> file, const std::s
     run("PRAGMA synchronous = OFF");
     prepareFormat();
     if (mFile != nullptr) switchToLog();
-    mGet = prepare("SELECT value FROM properties WHERE name = ?1");
-    mAdd = prepare("INSERT INTO properties VALUES (?1, ?2) ON CONFLICT (name) DO NOTHING");
-    mSet =
-            prepare("INSERT INTO properties VALUES (?1, ?2)"
-                    " ON CONFLICT (name) DO UPDATE SET value = excluded.value");
-    mErase = prepare("DELETE FROM properties WHERE name = ?1");
+    // Now: what is stored can still be read when a write has failed.
+    prepare(&mGet, "SELECT value FROM properties WHERE name = ?1");
 }
 
 PropertyStore::~PropertyStore() {
@@ -67,16 +66,21 @@ std::optional<std::string> PropertyStore::get(std::string_view name) {
 }
 
 bool PropertyStore::add(std::string_view name, std::string_view value) {
+    prepare(&mAdd, "INSERT INTO properties VALUES (?1, ?2) ON CONFLICT (name) DO NOTHING");
     bind(mAdd, 2, value);
     return change(mAdd, name) && sqlite3_changes(mDb) == 1;
 }
 
 bool PropertyStore::set(std::string_view name, std::string_view value) {
+    prepare(&mSet,
+            "INSERT INTO properties VALUES (?1, ?2)"
+            " ON CONFLICT (name) DO UPDATE SET value = excluded.value");
     bind(mSet, 2, value);
     return change(mSet, name);
 }
 
 bool PropertyStore::erase(std::string_view name) {
+    prepare(&mErase, "DELETE FROM properties WHERE name = ?1");
     return change(mErase, name);
 }
 
@@ -139,7 +143,8 @@ void PropertyStore::switchToLog() {
 
 /** Without this, a damaged page would show only when it is read. */
 void PropertyStore::checkPages() {
-    sqlite3_stmt* statement = prepare("PRAGMA quick_check(1)");
+    sqlite3_stmt* statement = nullptr;
+    prepare(&statement, "PRAGMA quick_check(1)");
     if (mError) return;
     const int status = sqlite3_step(statement);
     if (status != SQLITE_ROW) {
@@ -156,11 +161,11 @@ void PropertyStore::run(const char* sql) {
     if (!mError) check(sqlite3_exec(mDb, sql, nullptr, nullptr, nullptr));
 }
 
-/** Returns null if something has failed before. */
-sqlite3_stmt* PropertyStore::prepare(const char* sql) {
-    sqlite3_stmt* statement = nullptr;
-    if (!mError) check(sqlite3_prepare_v2(mDb, sql, -1, &statement, nullptr));
-    return statement;
+/** Prepares `*statement` if it is null. Leaves it so if something has failed before. */
+void PropertyStore::prepare(sqlite3_stmt** statement, const char* sql) {
+    if (*statement == nullptr && !mError) {
+        check(sqlite3_prepare_v2(mDb, sql, -1, statement, nullptr));
+    }
 }
 
 /** `text` must stay valid until the statement is reset. */

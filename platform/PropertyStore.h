@@ -70,7 +70,7 @@ private:
     void switchToLog();
     void checkPages();
     void run(const char* sql);
-    sqlite3_stmt* prepare(const char* sql);
+    void prepare(sqlite3_stmt** statement, const char* sql);
     void bind(sqlite3_stmt* statement, int index, std::string_view text);
     bool change(sqlite3_stmt* statement, std::string_view name);
     void check(int status);
@@ -80,6 +80,8 @@ private:
     const std::shared_ptr<const StoreFile> mFile;  // null in memory
     sqlite3* mDb = nullptr;
     sqlite3_stmt* mGet = nullptr;
+
+    // Null until they are first run.
     sqlite3_stmt* mAdd = nullptr;
     sqlite3_stmt* mSet = nullptr;
     sqlite3_stmt* mErase = nullptr;

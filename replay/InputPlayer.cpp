@@ -79,8 +79,8 @@ bool InputPlayer::playCapture(const std::string& name,
     }
     const int fd = memoryFile(imported->trace);
     if (fd < 0) {
-        return fail({name + ": cannot keep the trace: " + std::strerror(errno),
-                     base::kStatusFailed});
+        return fail(
+                {name + ": cannot keep the trace: " + std::strerror(errno), base::kStatusFailed});
     }
     InputFile file{name, std::make_unique<base::LineReader>(fd), {}};
     file.first = file.lines->next();
@@ -105,8 +105,8 @@ bool InputPlayer::playLines(InputFile* file, Device* device) {
     return played.has_value();
 }
 
-base::Result<void> InputPlayer::playBoots(trace::TraceReader* reader,
-                                          const trace::TraceLine& first, Device* device) {
+base::Result<void> InputPlayer::playBoots(trace::TraceReader* reader, const trace::TraceLine& first,
+                                          Device* device) {
     if (device->propertyFile) {
         if (const auto error = platform::pinPropertyFile(*device->propertyFile)) {
             return base::fail(*error);

@@ -124,8 +124,7 @@ void Summary::printCauses() {
 
 void Summary::printEnd(bool isWhole) {
     char seconds[32];
-    std::snprintf(seconds, sizeof(seconds), "%.3f",
-                  static_cast<double>(mTook) / 1e9);
+    std::snprintf(seconds, sizeof(seconds), "%.3f", static_cast<double>(mTook) / 1e9);
     mOut->write(std::string(isWhole ? "\nPlayed " : "\nStopped after ") +
                 count(mJournal.boots().size(), "boot") + ", " +
                 base::formatDuration(std::chrono::nanoseconds(mJournal.played())) +
