@@ -11,6 +11,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <functional>
+#include <future>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -29,6 +30,7 @@
 #include <unistd.h>
 
 #include "core/SDCImpl.h"
+#include "core/SensorHandlerThread.h"
 #include "exception/FlowingDataException.h"
 #include "exception/UltraException.h"
 #include "platform/Telemetry.h"
@@ -63,9 +65,15 @@ void passMs(int64_t ms) {
     for (const int64_t end = realMs() + ms; realMs() < end;) usleep(1000);
 }
 
-/** What the worker does behind an event is done soon, and nothing tells when. */
+/** Waits until the worker has ended the message that it is in. */
 void letMessageEnd() {
-    passMs(300);
+    struct Signal : MessageHandler {
+        void handleMessage(const Message&) override { isReached.set_value(); }
+        std::promise<void> isReached;
+    };
+    const sp<Signal> signal = new Signal;
+    SensorHandlerThread::getInstance()->sendMessage(signal, 0);
+    signal->isReached.get_future().wait();
 }
 
 std::string recordPath() {
@@ -190,14 +198,14 @@ int recordFd() {
 void closes() {
     property_set("persist.zuno.flow.detect.count", "0,7,0,0,0,0");
     FlowingDataException::getInstance()->notifyBootCompleted();
-    std::atomic<int> own{-1};
-    gTelemetry = [&](const std::string&) {
-        if (own >= 0) return;
+    static std::promise<int> opened;
+    gTelemetry = [isOpen = false](const std::string&) mutable {
+        if (std::exchange(isOpen, true)) return;
         close(recordFd());
-        own = open("own", O_RDWR | O_CREAT | O_APPEND, 0600);
+        opened.set_value(open("own", O_RDWR | O_CREAT | O_APPEND, 0600));
     };
     SDCImpl::getInstance()->notifySdcClock(8);
-    while (own < 0) passMs(1);
+    const int own = opened.get_future().get();
     letMessageEnd();
     report();
     struct stat status {};
@@ -282,19 +290,12 @@ void names() {
             enable(false, 3, name, opPkg);
         }
     }
-    std::mutex mutex;
-    std::condition_variable changed;
-    bool isSent = false;
-    gTelemetry = [&](const std::string& id) {
-        const std::lock_guard lock(mutex);
-        isSent |= id == "N273|10012";
-        changed.notify_all();
+    static std::promise<void> sent;
+    gTelemetry = [](const std::string& id) {
+        if (id == "N273|10012") sent.set_value();
     };
     SDCImpl::getInstance()->notifySdcClock(23);
-    std::unique_lock lock(mutex);
-    changed.wait(lock, [&] { return isSent; });
-    lock.unlock();
-    SDCImpl::getInstance()->notifySdcClock(1);
+    sent.get_future().wait();
     letMessageEnd();
 }
 
