@@ -76,7 +76,7 @@ private:
             const auto end =
                     mayUseJobs ? std::find_if_not(next, names.end(), isSurelyCapture) : next;
             if (end - next > 1) {
-                if (const auto ran = playAtOnce({next, end}); !ran) return ran;
+                if (auto ran = playAtOnce({next, end}); !ran) return ran;
                 next = end;
             } else {
                 mPlayer.play(*next++);
