@@ -265,8 +265,9 @@ TEST_F(CaptureImportTest, LosesNothingOfItsTablesWithoutAWord) {
                  {"------ CHECKIN BATTERYSTATS (x) ------\n9,0,i,uid,10018," + longName +
                           "\n9,10018,l,sr,12,1,2\n9,10018,l,sr,5000000000,1,2\n"
                           "9,10018,l,sr,12,1,2,3,99999999999999999999,5\n9,5000000000,l,sr,1,1,2\n"
+                          "9,10018,l,sr,12,1,2,3,4\n"
                           "9,0,l,xy,z\n9,0,i,uid,x,a\n------ 0.1s was it ------\n",
-                  {"8: warning: 4 lines of the battery statistics" + left +
+                  {"8: warning: 5 lines of the battery statistics" + left +
                    "\"9,10018,l,sr,5000000000,1,2\""}}}) {
         const auto imported = importText(kSensors + table + kHeading + offs({"01:00:00"}));
         Lines expected;

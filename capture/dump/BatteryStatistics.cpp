@@ -68,15 +68,16 @@ bool BatteryStatistics::takeBattery(std::string_view fields) {
 bool BatteryStatistics::takeSensor(int32_t uid, std::string_view fields) {
     const auto handle = parseNumber<int32_t>(fields.substr(0, fields.find(',')));
     const std::vector<int64_t> numbers = takeNumbers(&fields);
-    const bool isWhole = numbers.size() == kMostNumbers || fields.empty();
-    if (!handle || numbers.size() < 3 || !isWhole) return false;
+    // What is between the two forms is cut, and its last number is not what it was.
+    const bool isShort = numbers.size() == 3 && fields.empty();
+    if (!handle || (!isShort && numbers.size() != kMostNumbers)) return false;
     trace::ChargeRow row;
     row.uid = uid;
     row.handle = *handle;
-    row.shared = numbers.size() < 5;
+    row.shared = isShort;
     row.ms = row.shared ? numbers[1] : numbers[4];
     row.count = numbers[2];
-    if (numbers.size() > 5) row.background = numbers[5];
+    if (!isShort) row.background = numbers[5];
     mSinceCharge.rows.push_back(row);
     return true;
 }
