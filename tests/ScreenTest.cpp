@@ -33,6 +33,7 @@ constexpr char kScreenCapture[] = R"({
 constexpr char kTaken[] = R"({"taken": {
         "connections": [
             {"pkg": "com.a.x", "uid": 1, "handle": 1},
+            {"pkg": "com.a.x", "uid": 1, "handle": 2},
             {"pkg": "tag", "uid": 2, "handle": 3, "count": 2, "hasAccess": false, "wakeLocks": 1},
             {"pkg": "late", "uid": 3, "handle": 9}],
         "direct": [{"package": "com.vr", "sensors": 2, "rates": [1, 7]}],
@@ -134,6 +135,7 @@ com.a (shot)    Motion   1:28:00  0:28:00 of 1:28:00        1                   
     const report::OnNowText on = report::describeOnNow(journal, 0, kAll);
     EXPECT_EQ("\n" + on.rows.text(0), R"(
 App             Sensor             Since               Hz                Batch  Wake
+com.a (x)       Gyro                                                                  no line tells of it
 com.a (x)       Acc                before 04:00:00  100.0  as long as possible
 com.b +1 (tag)  Steps              before 04:00:00      ?                    0  wake  no data access, 1 wake lock, 2 connections, rate unknown
 late            handle 0x00000009                                                     no line tells of it

@@ -137,6 +137,9 @@ TEST(UseStepsTest, ShowsWhatNoLineTells) {
                   "10:00:04 -0 a@1000",
                   "a@6 0: 36001-36002 off x1 200000us, a@5 0: 36000-36003 off x1 200000us, "
                   "<a@1000 0: 35990-36004 off x1 200000us"},
+                 {"it does so as often as the app has it on", nothing,
+                  "10:00:00 +0 a@5, 10:00:01 +0 a@5, 10:00:02 -0 a@1000, 10:00:03 -0 a@1000",
+                  "a@5 0: 36000-36003 off x2 200000us"},
                  {"what the system itself has on it switches off for itself", nothing,
                   "10:00:00 +0 a@1000, 10:00:01 +0 a@5, 10:00:02 -0 a@1000, 10:00:03 -0 a@5",
                   "a@1000 0: 36000-36002 off x1 200000us, a@5 0: 36001-36003 off x1 200000us"},
