@@ -38,9 +38,7 @@ void DayTable::add(const Use& use, const UseTracker& tracker) {
                     row.samples && samples ? std::optional(*row.samples + *samples) : std::nullopt;
         }
         row.held += span.to - span.from;
-        const DisplayTime display = tracker.displayIn(span);
-        row.display.known += display.known;
-        row.display.on += display.on;
+        row.display.add(tracker.displayIn(span));
         row.enables += std::count_if(
                 use.enables.begin(), use.enables.end(),
                 [number](const Enable& enable) { return enable.at / base::kNsPerDay == number; });

@@ -8,14 +8,9 @@ DisplayTime DisplayCourse::within(Span span, const std::optional<std::vector<Spa
     DisplayTime time;
     if (mChanges.empty()) return time;
     span.from = std::max(span.from, mChanges.front().at);
-    const auto add = [&](Span part) {
-        if (part.from >= part.to) return;
+    for (const Span& part : commonOf({span}, known.value_or(std::vector{span}))) {
         time.known += part.to - part.from;
         time.on += timeOn(part);
-    };
-    if (!known) add(span);
-    for (const Span& each : known.value_or(std::vector<Span>())) {
-        add({std::max(each.from, span.from), std::min(each.to, span.to)});
     }
     return time;
 }

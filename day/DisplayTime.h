@@ -12,6 +12,12 @@ namespace day {
 struct DisplayTime {
     int64_t known = 0;
     int64_t on = 0;
+
+    int64_t off() const { return known - on; }
+    void add(const DisplayTime& more) {
+        known += more.known;
+        on += more.on;
+    }
 };
 
 /** The display through one boot. It is known from the first time that it is told. */

@@ -4,7 +4,6 @@
 #include <map>
 #include <tuple>
 
-#include "day/Coverage.h"
 #include "day/Samples.h"
 
 namespace day {
@@ -27,25 +26,25 @@ struct Sum {
 
 /** Whether `use` ended in a gap of what is seen, where its disable may have been. */
 bool endsInGap(const Use& use, const Journal& journal) {
-    const auto capture = journal.boots()[static_cast<size_t>(use.boot)].capture;
+    const auto capture = journal.bootOf(use).capture;
     if (!capture) return false;
-    const std::vector<Span> gaps = spansOf(journal.captures()[*capture].gaps());
+    const std::vector<Span> gaps = spansOf(journal.captures[*capture].gaps);
     return std::any_of(gaps.begin(), gaps.end(), [&](const Span& gap) { return use.to == gap.to; });
 }
 
 std::map<HolderKey, Sum> sumUp(const Journal& journal) {
     std::map<HolderKey, Sum> sums;
-    for (const Use& use : journal.uses()) {
+    for (const Use& use : journal.uses) {
         Sum& sum = sums[keyOf(use)];
         sum.holder = use;
-        const int64_t dark = use.display.known - use.display.on;
+        const int64_t dark = use.display.off();
         const bool isOneShot = use.mode == trace::SensorMode::kOneShot;
         if (isContinuous(use)) sum.dark += dark;
         if (use.wakeUp == true && !isOneShot && use.batchUs == 0) sum.unbatched += dark;
         if (use.before && use.end == End::kOn) {
             sum.through = use.to - use.from;
             sum.throughFrom = use.from;
-            sum.capture = journal.boots()[static_cast<size_t>(use.boot)].capture;
+            sum.capture = journal.bootOf(use).capture;
         }
         // A one-shot sensor whose firing is not in the recent events ends like this, too.
         if (use.end == End::kUnseen && !isOneShot && !endsInGap(use, journal)) {
@@ -57,7 +56,7 @@ std::map<HolderKey, Sum> sumUp(const Journal& journal) {
 }
 
 void addLost(const Journal& journal, std::vector<Finding>* findings) {
-    const auto& lost = journal.lost();
+    const auto& lost = journal.lost;
     if (lost.empty()) return;
     findings->push_back({Kind::kLost,
                          {},
@@ -91,25 +90,25 @@ void addUses(const Journal& journal, std::vector<Finding>* findings) {
 }
 
 void addTaken(const Notes& notes, std::vector<Finding>* findings) {
-    if (!notes.taken()) return;
+    if (!notes.taken) return;
     const auto add = [&](Kind kind, const trace::Client& client, int64_t count,
                          const std::string& text) {
         findings->push_back({kind, notes.holderOf(client), count, count, 0, 0, text});
     };
-    for (const trace::RefusedNote& each : notes.taken()->refused) {
+    for (const trace::RefusedNote& each : notes.taken->refused) {
         add(Kind::kRefused, each.client, each.count, each.result);
     }
-    if (!notes.taken()->connections) return;
-    for (const trace::Connection& each : *notes.taken()->connections) {
+    if (!notes.taken->connections) return;
+    for (const trace::Connection& each : *notes.taken->connections) {
         if (each.hasAccess == false) add(Kind::kNoAccess, each.client, each.count, "");
     }
 }
 
 void addUnseen(const Journal& journal, size_t capture, std::vector<Finding>* findings) {
-    const std::vector<Span> seen = seenOf(journal, capture);
+    const std::vector<Span> seen = journal.seenOf(capture);
     if (seen.empty()) return;
     const int64_t from = seen[0].from / base::kNsPerDay * base::kNsPerDay;
-    const int64_t to = *journal.captures()[capture].knownTo();
+    const int64_t to = *journal.captures[capture].knownTo();
     const int64_t length = lengthOf(seen);
     if (length / kSeenPercent >= (to - from) / 100) return;
     findings->push_back({Kind::kUnseen, {}, length, 0, from, to, {}, capture});
@@ -121,8 +120,8 @@ std::vector<Finding> findFindings(const Journal& journal) {
     std::vector<Finding> findings;
     addLost(journal, &findings);
     addUses(journal, &findings);
-    for (size_t i = 0; i < journal.captures().size(); ++i) {
-        addTaken(journal.captures()[i], &findings);
+    for (size_t i = 0; i < journal.captures.size(); ++i) {
+        addTaken(journal.captures[i], &findings);
         addUnseen(journal, i, &findings);
     }
     std::stable_sort(findings.begin(), findings.end(), [](const Finding& a, const Finding& b) {

@@ -23,53 +23,47 @@ struct Event {
     bool isAhead;  // it lies after what is known: the device would report it if nothing changed
 };
 
-/** How long a state of the device held. */
+/** How long the display was on or off, or the charger. */
 struct StateSpan {
     int64_t boot;
     Span span;
-    int64_t value;  // see trace::DeviceState
+    bool isOn;
 };
 
 struct Boot {
     Span span;
     std::optional<int64_t> firstDay;  // the date of the clock's 0, in days since 1970-01-01
-    std::optional<size_t> capture;    // that it is of, in `captures()`
+    std::optional<size_t> capture;    // that it is of, in `Journal::captures`
     std::vector<Span> seen;           // when it is known who holds what: without gaps
     DisplayTime display;              // within `seen`
 };
 
-/** What happened in one input, gathered from its records. Nothing is kept that no view shows. */
-class Journal {
-public:
-    Journal();
+/** The part of a capture's time on battery in which it is known who held what. */
+struct BatteryCoverage {
+    int64_t seen = 0;           // ns
+    bool isUpperBound = false;  // the charger is not known all the time
+};
 
-    void begin(const std::string& name);
-    void take(const trace::Record& record);
-    void end();
+/** What happened in one input. Nothing is kept that no view shows. */
+struct Journal {
+    std::string name;             // of the input, as it was given
+    std::vector<Notes> captures;  // what the notes tell of each capture in the input, in order
+    std::vector<trace::LostNote> lost;  // the lines of a record that are missing, in order
+    std::vector<Boot> boots;
+    std::vector<Use> uses;
+    DayTable table;
+    std::vector<Event> events;
+    std::vector<StateSpan> display;
+    std::vector<StateSpan> charge;
+    std::map<std::string, std::string> properties;  // that the library set, with the last values
+    std::vector<DailyCall> dailyCalls;
 
-    /** The input's name as it was given. */
-    const std::string& name() const { return mName; }
+    const Boot& bootOf(const Use& use) const { return boots[static_cast<size_t>(use.boot)]; }
 
-    /** What the notes tell of each capture in the input, in order. */
-    const std::vector<Notes>& captures() const { return mCaptures; }
-
-    /** Whether a boot is of a capture: an index of `captures()`. */
+    /** Whether a boot is of a capture: an index of `captures`. */
     bool isOf(int64_t boot, size_t capture) const {
-        return mBoots[static_cast<size_t>(boot)].capture == capture;
+        return boots[static_cast<size_t>(boot)].capture == capture;
     }
-
-    /** The lines of a record that are missing, in order. */
-    const std::vector<trace::LostNote>& lost() const { return mLost; }
-
-    const std::vector<Boot>& boots() const { return mBoots; }
-    const std::vector<Use>& uses() const { return mUses; }
-    const DayTable& table() const { return mTable; }
-    const std::vector<Event>& events() const { return mEvents; }
-    const std::vector<StateSpan>& display() const { return mDisplay; }
-    const std::vector<StateSpan>& charge() const { return mCharge; }
-
-    /** The properties that the library has set, with their last values. */
-    const std::map<std::string, std::string>& properties() const { return mProperties; }
 
     /** The device's time that was played, all boots together, ns. */
     int64_t played() const;
@@ -80,7 +74,25 @@ public:
     /** The events of a day, in order. */
     std::vector<const Event*> eventsOf(const Day& day) const;
 
-    Causes causes() const { return findCauses(mUses, mDailyCalls); }
+    Causes causes() const { return findCauses(uses, dailyCalls); }
+
+    /** When a capture tells who holds what, all its boots together. */
+    std::vector<Span> seenOf(size_t capture) const;
+
+    /** Of a capture that has battery statistics. */
+    BatteryCoverage batteryCoverage(size_t capture) const;
+};
+
+/** Makes the journal of an input out of its records. */
+class JournalWriter {
+public:
+    JournalWriter();
+
+    void begin(const std::string& name);
+    void take(const trace::Record& record);
+
+    /** The input is over. The journal is there until the next one begins. */
+    const Journal& end();
 
 private:
     void startBoot(const trace::Record& record);
@@ -89,19 +101,9 @@ private:
     void keepCapture();
     void takeState(const trace::Record& record);
 
-    std::string mName;
     UseTracker mTracker;
-    std::vector<Notes> mCaptures;
-    std::vector<trace::LostNote> mLost;
+    Journal mJournal;
     size_t mFirstBoot = 0;  // since the clock was set back
-    std::vector<Boot> mBoots;
-    std::vector<Use> mUses;
-    DayTable mTable;
-    std::vector<DailyCall> mDailyCalls;
-    std::vector<Event> mEvents;
-    std::vector<StateSpan> mDisplay;
-    std::vector<StateSpan> mCharge;
-    std::map<std::string, std::string> mProperties;
 };
 
 }  // namespace day

@@ -8,46 +8,50 @@ using trace::Bound;
 
 void Notes::take(const trace::Note& note, int64_t at) {
     if (note.capture) {
-        mCapture = note.capture;
-        mKnownTo = toClock(note.capture->knownTo);
-        mFirstDay = base::parseDate(note.capture->midnight.value_or(""));
+        capture = note.capture;
+        firstDay = base::parseDate(note.capture->midnight.value_or(""));
     }
     if (note.sensors) {
-        mNamesSensors = true;
-        mSensors = *note.sensors;
+        namesSensors = true;
+        sensors = *note.sensors;
         mByHandle.clear();
-        for (size_t i = 0; i < mSensors.size(); ++i) mByHandle.emplace(mSensors[i].handle, i);
+        for (size_t i = 0; i < sensors.size(); ++i) mByHandle.emplace(sensors[i].handle, i);
     }
-    for (const trace::UidPackages& each : note.packages) mPackages[each.uid] = each.names;
+    for (const trace::UidPackages& each : note.packages) packages[each.uid] = each.names;
     if (note.known) {
-        mKnown = note.known;
-        mDisplayKnown = spansOf(note.known->display);
+        known = note.known;
+        displayKnown = spansOf(note.known->display);
     }
-    mGaps.insert(mGaps.end(), note.gaps.begin(), note.gaps.end());
+    gaps.insert(gaps.end(), note.gaps.begin(), note.gaps.end());
     if (note.taken) {
-        mTaken = note.taken;
-        mTakenAt = at;
+        taken = note.taken;
+        takenAt = at;
     }
-    if (note.lost) mLost.push_back(*note.lost);
+    if (note.lost) lost.push_back(*note.lost);
 }
 
 void Notes::startClock() {
     Notes kept;
-    kept.mNamesSensors = mNamesSensors;
-    kept.mSensors = std::move(mSensors);
+    kept.namesSensors = namesSensors;
+    kept.sensors = std::move(sensors);
     kept.mByHandle = std::move(mByHandle);
-    kept.mPackages = std::move(mPackages);
+    kept.packages = std::move(packages);
     *this = std::move(kept);
 }
 
+std::optional<int64_t> Notes::knownTo() const {
+    if (capture) return toClock(capture->knownTo);
+    return taken ? std::optional(takenAt) : std::nullopt;
+}
+
 bool Notes::isAhead(int64_t at) const {
-    return mCapture && at > *mKnownTo &&
-           (mCapture->bound == Bound::kStamp || mCapture->bound == Bound::kCapturedAt);
+    return capture && isBehind(at) &&
+           (capture->bound == Bound::kStamp || capture->bound == Bound::kCapturedAt);
 }
 
 const trace::Sensor* Notes::sensorOf(uint32_t handle) const {
     const auto found = mByHandle.find(handle);
-    return found == mByHandle.end() ? nullptr : &mSensors[found->second];
+    return found == mByHandle.end() ? nullptr : &sensors[found->second];
 }
 
 const trace::Sensor* Notes::sensorOf(const trace::ChargeRow& row) const {
@@ -60,9 +64,10 @@ std::string Notes::nameOf(const trace::ChargeRow& row) const {
     return sensor == nullptr ? std::string() : sensor->name;
 }
 
-const std::vector<std::string>* Notes::packagesOf(int32_t uid) const {
-    const auto found = mPackages.find(uid);
-    return found == mPackages.end() ? nullptr : &found->second;
+const std::vector<std::string>& Notes::packagesOf(int32_t uid) const {
+    static const std::vector<std::string> kNone;
+    const auto found = packages.find(uid);
+    return found == packages.end() ? kNone : found->second;
 }
 
 void Notes::complete(Holder* holder) const {
@@ -73,9 +78,7 @@ void Notes::complete(Holder* holder) const {
         holder->wakeUp = sensor->wakeUp;
         holder->maxRate = sensor->maxRate;
     }
-    if (const auto* packages = holder->uid ? packagesOf(*holder->uid) : nullptr) {
-        holder->packages = *packages;
-    }
+    if (holder->uid) holder->packages = packagesOf(*holder->uid);
 }
 
 Holder Notes::holderOf(const trace::Client& client) const {

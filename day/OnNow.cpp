@@ -34,16 +34,16 @@ std::tuple<bool, double, int64_t> orderOf(const OnRow& row) {
 
 OnNow whatIsOn(const Journal& journal, size_t capture) {
     std::vector<const Use*> uses;
-    for (const Use& use : journal.uses()) {
+    for (const Use& use : journal.uses) {
         if (journal.isOf(use.boot, capture) && use.end == End::kOn) uses.push_back(&use);
     }
     OnNow on;
-    const auto& taken = journal.captures()[capture].taken();
+    const auto& taken = journal.captures[capture].taken;
     on.isFromConnections = taken && taken->connections;
     if (on.isFromConnections) {
         for (const trace::Connection& each : *taken->connections) {
             const Use* const use = useOf(each.client, uses);
-            Holder holder = journal.captures()[capture].holderOf(each.client);
+            Holder holder = journal.captures[capture].holderOf(each.client);
             if (use != nullptr) holder = *use;
             on.rows.push_back({holder, use, each.count, each.hasAccess.value_or(true),
                                each.wakeLocks.value_or(0)});

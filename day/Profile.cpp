@@ -23,7 +23,7 @@ void add(const Use& use, Profile* profile) {
     row.sensor = use.sensor;
     row.held = use.to - use.from;
     row.displayKnown = use.display.known;
-    row.heldOff = use.display.known - use.display.on;
+    row.heldOff = use.display.off();
     row.uses = 1;
     row.enables = static_cast<int64_t>(use.enables.size());
     row.periodNs = use.periodNs;
@@ -34,11 +34,10 @@ void add(const Use& use, Profile* profile) {
 void add(const trace::SinceCharge& charge, const Notes& notes, Profile* profile) {
     profile->onBattery += toClock(charge.onBatteryMs.value_or(0));
     for (const trace::ChargeRow& each : charge.rows) {
-        const auto* packages = notes.packagesOf(each.uid);
+        const auto& packages = notes.packagesOf(each.uid);
         const trace::Sensor* sensor = notes.sensorOf(each);
-        const std::string app = packages == nullptr || packages->empty()
-                                        ? "uid " + std::to_string(each.uid)
-                                        : packages->front();
+        const std::string app =
+                packages.empty() ? "uid " + std::to_string(each.uid) : packages.front();
         ProfileRow row;
         row.sensor = notes.nameOf(each);
         row.heldOnBattery = toClock(each.ms);
@@ -79,18 +78,18 @@ int64_t heldPer(const ProfileRow& row, Per per) {
 
 Profile profileOf(const Journal& journal) {
     Profile profile;
-    profile.name = journal.name();
-    profile.properties = journal.properties();
-    for (const Use& use : journal.uses()) add(use, &profile);
-    for (const Boot& boot : journal.boots()) {
+    profile.name = journal.name;
+    profile.properties = journal.properties;
+    for (const Use& use : journal.uses) add(use, &profile);
+    for (const Boot& boot : journal.boots) {
         profile.covered += lengthOf(boot.seen);
         profile.displayKnown += boot.display.known;
-        profile.displayOff += boot.display.known - boot.display.on;
+        profile.displayOff += boot.display.off();
     }
-    for (const Notes& notes : journal.captures()) {
-        profile.sensors = notes.sensors();
-        if (notes.taken() && notes.taken()->sinceCharge) {
-            add(*notes.taken()->sinceCharge, notes, &profile);
+    for (const Notes& notes : journal.captures) {
+        profile.sensors = notes.sensors;
+        if (notes.taken && notes.taken->sinceCharge) {
+            add(*notes.taken->sinceCharge, notes, &profile);
         }
     }
     return profile;

@@ -27,6 +27,7 @@ std::vector<Span> commonOf(const std::vector<Span>& a, const std::vector<Span>& 
 /** What lies in `span` and in none of the others. */
 std::vector<Span> without(Span span, const std::vector<Span>& others);
 
+/** All of them together, ns. */
 int64_t lengthOf(const std::vector<Span>& spans);
 
 }  // namespace day

@@ -87,7 +87,7 @@ void UseTracker::endBoot() {
     mIsRunning = false;
     const auto knownTo = mNotes.knownTo();
     // What is on when the capture is taken may be known for longer than the trace lasts.
-    if (mNotes.taken() && !mIsClosed) {
+    if (mNotes.taken && !mIsClosed) {
         passTime(std::max(mAt, *knownTo + 1));
     } else {
         endAll(knownTo ? std::min(mAt, *knownTo) : mAt);

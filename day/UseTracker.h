@@ -42,7 +42,7 @@ public:
     bool isClosed() const { return mIsClosed; }
 
     /** The display within a part of a use that has just ended. */
-    DisplayTime displayIn(Span span) const { return mDisplay.within(span, mNotes.displayKnown()); }
+    DisplayTime displayIn(Span span) const { return mDisplay.within(span, mNotes.displayKnown); }
 
 private:
     /** A client on a sensor: with a note its tag, uid and handle, else its names and the type. */

@@ -31,9 +31,8 @@ std::string nameApp(const day::Holder& holder) {
     return name + " (" + (isWithin ? holder.pkg.substr(package.size() + 1) : holder.pkg) + ')';
 }
 
-std::string nameUid(int32_t uid, const std::vector<std::string>* packages) {
-    const bool isKnown = packages != nullptr && !packages->empty();
-    return isKnown ? namePackages(*packages) : "uid " + std::to_string(uid);
+std::string nameUid(int32_t uid, const std::vector<std::string>& packages) {
+    return packages.empty() ? "uid " + std::to_string(uid) : namePackages(packages);
 }
 
 std::string nameSensor(const day::Holder& holder) {

@@ -17,7 +17,7 @@ namespace report {
 std::string nameApp(const day::Holder& holder);
 
 /** The apps of a uid in the same way, or "uid 1000". */
-std::string nameUid(int32_t uid, const std::vector<std::string>* packages);
+std::string nameUid(int32_t uid, const std::vector<std::string>& packages);
 
 /** A sensor by its name or kind, or by its handle if the device does not list it. */
 std::string nameSensor(const day::Holder& holder);

@@ -22,12 +22,12 @@ std::string describeKnown(const char* what, const std::vector<trace::Interval>& 
 }
 
 void describe(const day::Notes& notes, std::vector<std::string>* lines) {
-    const trace::CaptureNote& capture = *notes.capture();
+    const trace::CaptureNote& capture = *notes.capture;
     if (capture.taken) lines->push_back("taken " + safe(*capture.taken));
     lines->push_back(count(static_cast<size_t>(capture.registrations), "registration") + " from " +
                      formatMomentMs(capture.from, notes) + " to " +
                      formatMomentMs(capture.to, notes));
-    const auto known = notes.known().value_or(trace::KnownStates());
+    const auto known = notes.known.value_or(trace::KnownStates());
     lines->push_back(describeKnown("display", known.display, notes));
     lines->push_back(describeKnown("charger", known.charge, notes));
     for (const std::string& warning : capture.warnings) lines->push_back(safe(warning));
@@ -38,13 +38,13 @@ void describe(const day::Notes& notes, std::vector<std::string>* lines) {
 std::string formatMoment(int64_t ns, const day::Notes& notes) {
     const int64_t day = ns / base::kNsPerDay;
     const std::string time = base::formatTimeOfDay(std::chrono::nanoseconds(ns));
-    if (notes.firstDay()) return base::formatDate(*notes.firstDay() + day) + ' ' + time;
+    if (notes.firstDay) return base::formatDate(*notes.firstDay + day) + ' ' + time;
     return "day " + std::to_string(day + 1) + ' ' + time;
 }
 
 std::vector<std::string> describeCaptures(const day::Journal& journal) {
     std::vector<std::string> lines;
-    for (const day::Notes& notes : journal.captures()) describe(notes, &lines);
+    for (const day::Notes& notes : journal.captures) describe(notes, &lines);
     return lines;
 }
 
@@ -52,8 +52,8 @@ std::vector<std::string> describeBounds(const day::Journal& journal) {
     constexpr const char* kBounds[] = {nullptr, nullptr, "the report's header",
                                        "the newest registration", "the newest recent event"};
     std::vector<std::string> lines;
-    for (const day::Notes& notes : journal.captures()) {
-        const char* bound = kBounds[static_cast<size_t>(notes.capture()->bound)];
+    for (const day::Notes& notes : journal.captures) {
+        const char* bound = kBounds[static_cast<size_t>(notes.capture->bound)];
         if (bound == nullptr) continue;
         lines.push_back(std::string("The capture does not say when it was taken: what is known is "
                                     "bounded by ") +
@@ -63,12 +63,18 @@ std::vector<std::string> describeBounds(const day::Journal& journal) {
 }
 
 std::string nameDay(const day::Journal& journal, const day::Day& day) {
-    const auto& boots = journal.boots();
+    const auto& boots = journal.boots;
     if (const auto firstDay = boots[static_cast<size_t>(day.boot)].firstDay) {
         return base::formatDate(*firstDay + day.number);
     }
     const std::string name = "day " + std::to_string(day.number + 1);
     return boots.size() == 1 ? name : "boot " + std::to_string(day.boot + 1) + ", " + name;
+}
+
+std::string describePlayed(const day::Journal& journal) {
+    return count(journal.boots.size(), "boot") + ", " +
+           base::formatDuration(std::chrono::nanoseconds(journal.played())) +
+           " of the device's time";
 }
 
 std::string count(size_t number, const std::string& noun) {

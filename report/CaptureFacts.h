@@ -20,6 +20,9 @@ std::string formatMoment(int64_t ns, const day::Notes& notes);
 /** A day by its date, or by its number if no date is known. */
 std::string nameDay(const day::Journal& journal, const day::Day& day);
 
+/** How much was played: "1 boot, 24:00:00 of the device's time". */
+std::string describePlayed(const day::Journal& journal);
+
 /** A number of things: "1 boot", "2 boots". */
 std::string count(size_t number, const std::string& noun);
 

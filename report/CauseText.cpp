@@ -1,9 +1,10 @@
-#include "report/CauseText.h"
-
 #include <cstddef>
 #include <set>
+#include <string>
 
 #include "report/AppNames.h"
+#include "report/Sections.h"
+#include "report/Text.h"
 
 namespace report {
 
@@ -32,16 +33,19 @@ constexpr const char* kTexts[] = {
 
 }  // namespace
 
-std::vector<CauseText> describeCauses(const day::Causes& causes) {
-    std::vector<CauseText> texts;
+Section layOutCauses(const day::Causes& causes) {
+    Section section;
+    section.heading = "Why times held and times reported differ";
     for (const auto& [cause, uses] : causes) {
         std::set<std::string> names;
         for (const day::Use* use : uses) {
             names.insert(cause == Cause::kNobodyWatches ? nameSensor(*use) : nameApp(*use));
         }
-        texts.push_back({kTexts[static_cast<size_t>(cause)], {names.begin(), names.end()}});
+        Section::List& list = section.lists.emplace_back();
+        list.title = std::string(kTexts[static_cast<size_t>(cause)]) + ':';
+        for (const std::string& name : names) list.items.push_back(safe(name));
     }
-    return texts;
+    return section;
 }
 
 }  // namespace report

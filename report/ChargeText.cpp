@@ -1,12 +1,10 @@
-#include "report/ChargeText.h"
-
 #include <algorithm>
 #include <cmath>
 #include <vector>
 
 #include "base/Calendar.h"
-#include "day/Coverage.h"
 #include "report/AppNames.h"
+#include "report/Sections.h"
 #include "report/SensorNames.h"
 
 namespace report {
@@ -32,8 +30,8 @@ std::string describeRow(const trace::ChargeRow& row) {
 }
 
 std::string describeCoverage(const day::Journal& journal, size_t capture) {
-    const auto& charge = *journal.captures()[capture].taken()->sinceCharge;
-    const day::BatteryCoverage coverage = batteryCoverage(journal, capture);
+    const auto& charge = *journal.captures[capture].taken->sinceCharge;
+    const day::BatteryCoverage coverage = journal.batteryCoverage(capture);
     std::string text = std::string("The registrations cover ") +
                        (coverage.isUpperBound ? "at most " : "") +
                        base::formatDuration(std::chrono::nanoseconds(coverage.seen));
@@ -44,30 +42,33 @@ std::string describeCoverage(const day::Journal& journal, size_t capture) {
 
 }  // namespace
 
-ChargeText describeSinceCharge(const day::Journal& journal, size_t capture, size_t limit) {
-    const auto& charge = *journal.captures()[capture].taken()->sinceCharge;
-    ChargeText text{describeCoverage(journal, capture),
-                    Table({{"App", Table::Column::kCut},
-                           {"Sensor", Table::Column::kCut},
-                           {"Time", Table::Column::kRight},
-                           {"Of battery time", Table::Column::kRight},
-                           {"In background", Table::Column::kRight},
-                           {"Count", Table::Column::kRight},
-                           {""}},
-                          limit)};
+Section layOutSinceCharge(const day::Journal& journal, size_t capture, size_t limit) {
+    const day::Notes& notes = journal.captures[capture];
+    const trace::SinceCharge& charge = *notes.taken->sinceCharge;
     std::vector<const trace::ChargeRow*> rows;
     for (const trace::ChargeRow& row : charge.rows) rows.push_back(&row);
     std::stable_sort(rows.begin(), rows.end(),
                      [](const auto* a, const auto* b) { return a->ms > b->ms; });
+    Table table({{"App", Table::Column::kCut},
+                 {"Sensor", Table::Column::kCut},
+                 {"Time", Table::Column::kRight},
+                 {"Of battery time", Table::Column::kRight},
+                 {"In background", Table::Column::kRight},
+                 {"Count", Table::Column::kRight},
+                 {""}},
+                limit);
     for (const trace::ChargeRow* row : rows) {
-        text.rows.add({nameUid(row->uid, journal.captures()[capture].packagesOf(row->uid)),
-                       nameSensorOf(*row, journal.captures()[capture]),
-                       base::formatDuration(std::chrono::milliseconds(row->ms)),
-                       formatPercent(row->ms, charge.onBatteryMs),
-                       formatPercent(row->background, row->ms), std::to_string(row->count),
-                       describeRow(*row)});
+        table.add({nameUid(row->uid, notes.packagesOf(row->uid)), nameSensorOf(*row, notes),
+                   base::formatDuration(std::chrono::milliseconds(row->ms)),
+                   formatPercent(row->ms, charge.onBatteryMs),
+                   formatPercent(row->background, row->ms), std::to_string(row->count),
+                   describeRow(*row)});
     }
-    return text;
+    Section section;
+    section.heading = "Since the last charge";
+    section.lines = {describeCoverage(journal, capture)};
+    section.add(std::move(table), "charge", "Held on battery");
+    return section;
 }
 
 }  // namespace report

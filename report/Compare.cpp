@@ -128,13 +128,12 @@ void addRow(const Difference& difference, Table* table) {
                 std::string(wordsOf(difference.per).title), why});
 }
 
-ComparedPart partOf(const day::Comparison& comparison, ChangeState state,
-                    const std::string& heading, size_t limit) {
-    ComparedPart part{heading, "Time held in an hour", differenceTable(limit), {}};
+Table differencesOf(const day::Comparison& comparison, ChangeState state, size_t limit) {
+    Table table = differenceTable(limit);
     for (const Difference& each : comparison.differences) {
-        if (each.state == state) addRow(each, &part.table);
+        if (each.state == state) addRow(each, &table);
     }
-    return part;
+    return table;
 }
 
 std::string describe(const std::optional<trace::Sensor>& sensor) {
@@ -150,34 +149,27 @@ std::string describe(const std::optional<trace::Sensor>& sensor) {
     return text;
 }
 
-ComparedPart sensorsPart(const day::Comparison& comparison, size_t limit) {
-    ComparedPart part{"Sensors that differ",
-                      "What the device's lists say",
-                      Table({{"Sensor", Table::Column::kCut}, {"Old"}, {"New"}}, limit),
-                      {}};
+Table sensorTable(const day::Comparison& comparison, size_t limit) {
+    Table table({{"Sensor", Table::Column::kCut}, {"Old"}, {"New"}}, limit);
     for (const auto& [before, after] : comparison.sensors) {
         const trace::Sensor& sensor = before ? *before : *after;
-        part.table.add({nameSensor(sensor.type, sensor.name), describe(before), describe(after)});
+        table.add({nameSensor(sensor.type, sensor.name), describe(before), describe(after)});
     }
-    return part;
+    return table;
 }
 
-ComparedPart propertiesPart(const day::Comparison& comparison, size_t limit) {
-    ComparedPart part{"Stored values that differ",
-                      "Properties",
-                      Table({{"Property", Table::Column::kCut}, {"Old"}, {"New"}}, limit),
-                      {}};
+Table storedTable(const day::Comparison& comparison, size_t limit) {
+    Table table({{"Property", Table::Column::kCut}, {"Old"}, {"New"}}, limit);
     for (const auto& [name, before, after] : comparison.properties) {
-        part.table.add({name, before.value_or("not set"), after.value_or("not set")});
+        table.add({name, before.value_or("not set"), after.value_or("not set")});
     }
-    return part;
+    return table;
 }
 
 }  // namespace
 
 void Compare::end(bool) {
-    mJournal.end();
-    mSides.add(mJournal);
+    mSides.add(mWriter.end());
 }
 
 void ComparedSides::add(const day::Journal& journal) {
@@ -190,16 +182,22 @@ std::optional<day::Comparison> ComparedSides::compare() const {
     return day::compare(mBefore, mAfter);
 }
 
-std::optional<ComparisonText> ComparedSides::layOut(size_t limit) const {
-    const auto compared = compare();
-    if (!compared) return std::nullopt;
-    const day::Comparison& comparison = *compared;
-    ComparisonText text;
-    text.coverage = {describeSide("old", mBefore), describeSide("new", mAfter)};
+std::optional<Section> ComparedSides::layOut(size_t limit) const {
+    const auto comparison = compare();
+    if (!comparison) return std::nullopt;
+    Section section;
+    section.heading = "Old against new";
+    section.lines = {safe(describeSide("old", mBefore)), safe(describeSide("new", mAfter))};
     for (size_t per = 0; per < day::kPers; ++per) {
-        if (comparison.isCovered[per]) continue;
-        text.coverage.push_back("not compared: " + std::string(kPers[per].missing));
+        if (comparison->isCovered[per]) continue;
+        section.lines.push_back("not compared: " + std::string(kPers[per].missing));
     }
+    const auto add = [&](const char* heading, Table table, const char* caption) {
+        if (table.isEmpty()) return;
+        Section& part = section.parts.emplace_back();
+        part.heading = heading;
+        part.add(std::move(table), "compared", caption);
+    };
     const std::pair<ChangeState, const char*> kGroups[] = {
             {ChangeState::kChanged, "Changed: time held in an hour"},
             {ChangeState::kNew, "New: not held before"},
@@ -207,23 +205,19 @@ std::optional<ComparisonText> ComparedSides::layOut(size_t limit) const {
             {ChangeState::kNotCovered, "Too little is seen to tell"},
     };
     for (const auto& [state, heading] : kGroups) {
-        text.parts.push_back(partOf(comparison, state, heading, limit));
+        add(heading, differencesOf(*comparison, state, limit), "Time held in an hour");
     }
-    text.parts.push_back(sensorsPart(comparison, limit));
-    text.parts.push_back(propertiesPart(comparison, limit));
-    if (comparison.isEmpty()) text.parts.front().sentence = "Nothing differs.";
-    return text;
+    add("Sensors that differ", sensorTable(*comparison, limit), "What the device's lists say");
+    add("Stored values that differ", storedTable(*comparison, limit), "Properties");
+    return section;
 }
 
 void CompareSummary::finish() {
-    const auto text = sides().layOut(mLimit);
-    if (!text) return;
-    for (const std::string& line : text->coverage) mTerminal.sentence(safe(line), 0);
-    for (const ComparedPart& part : text->parts) {
-        if (part.table.isEmpty() && part.sentence.empty()) continue;
-        mTerminal.heading(part.sentence.empty() ? part.heading : part.sentence);
-        if (!part.table.isEmpty()) mTerminal.table(part.table, 2);
-    }
+    const auto compared = sides().layOut(mLimit);
+    if (!compared) return;
+    for (const std::string& line : compared->lines) mTerminal.sentence(line, 0);
+    for (const Section& part : compared->parts) mTerminal.section(part);
+    if (compared->parts.empty()) mTerminal.heading(kNothingDiffers);
     mOut->flush();
 }
 

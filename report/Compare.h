@@ -8,25 +8,13 @@
 #include "day/Comparison.h"
 #include "day/Journal.h"
 #include "report/Report.h"
+#include "report/Section.h"
 #include "report/Stdout.h"
-#include "report/Table.h"
 #include "report/Terminal.h"
 
 namespace report {
 
-/** A part of a comparison: a heading, and a table or a sentence. */
-struct ComparedPart {
-    std::string heading;
-    std::string caption;  // of the table
-    Table table;
-    std::string sentence;  // where the table is empty
-};
-
-/** A comparison laid out: what it covers, a line each, and its parts. */
-struct ComparisonText {
-    std::vector<std::string> coverage;
-    std::vector<ComparedPart> parts;
-};
+inline constexpr char kNothingDiffers[] = "Nothing differs.";
 
 /** Inputs and a baseline: the first inputs are the baseline's. */
 class ComparedSides {
@@ -39,7 +27,9 @@ public:
 
     /** Nothing if a side has no input. */
     std::optional<day::Comparison> compare() const;
-    std::optional<ComparisonText> layOut(size_t limit) const;
+
+    /** The same laid out: what it covers, and a part for each kind of difference. */
+    std::optional<Section> layOut(size_t limit) const;
 
 private:
     const size_t mBaselines;
@@ -51,8 +41,8 @@ private:
 class Compare : public Report {
 public:
     trace::WantedRecords wanted() const override { return {true, false}; }
-    void begin(const std::string& name) override { mJournal.begin(name); }
-    void take(const trace::Record& record) override { mJournal.take(record); }
+    void begin(const std::string& name) override { mWriter.begin(name); }
+    void take(const trace::Record& record) override { mWriter.take(record); }
     void end(bool isWhole) override;
 
 protected:
@@ -61,7 +51,7 @@ protected:
     const ComparedSides& sides() const { return mSides; }
 
 private:
-    day::Journal mJournal;
+    day::JournalWriter mWriter;
     ComparedSides mSides;
 };
 

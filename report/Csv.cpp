@@ -47,7 +47,7 @@ std::string isoOf(int64_t ns, const std::optional<int64_t>& firstDay) {
 }
 
 std::string takenOf(const day::Notes& notes) {
-    return notes.capture() && notes.capture()->taken ? isoOf(*notes.capture()->taken) : "";
+    return notes.capture && notes.capture->taken ? isoOf(*notes.capture->taken) : "";
 }
 
 /** `amount` thousandths in units. */
@@ -130,7 +130,7 @@ void UsesCsv::addEnded(int64_t before) {
 }
 
 void UsesCsv::add(const day::Use& use) {
-    const std::optional<int64_t> firstDay = tracker()->notes().firstDay();
+    const std::optional<int64_t> firstDay = tracker()->notes().firstDay;
     const bool hasRate =
             use.periodNs && *use.periodNs > 0 && use.mode != trace::SensorMode::kOneShot;
     const auto samples = day::samplesOf(use);
@@ -164,24 +164,20 @@ void SinceChargeCsv::begin(const std::string& name) {
 void SinceChargeCsv::take(const trace::Record& record) {
     tracker()->take(record);
     const day::Notes& notes = tracker()->notes();
-    const bool hasStatistics = notes.taken() && notes.taken()->sinceCharge;
+    const bool hasStatistics = notes.taken && notes.taken->sinceCharge;
     if (hasStatistics && !mIsAdded) add(notes);
     mIsAdded = hasStatistics;
 }
 
 void SinceChargeCsv::add(const day::Notes& notes) {
-    const trace::SinceCharge& charge = *notes.taken()->sinceCharge;
+    const trace::SinceCharge& charge = *notes.taken->sinceCharge;
     for (const trace::ChargeRow& each : charge.rows) {
         std::string packages;
-        const auto* names = notes.packagesOf(each.uid);
-        if (names != nullptr) {
-            for (const std::string& package : *names) {
-                packages += (packages.empty() ? "" : " ") + package;
-            }
-        }
+        const auto& names = notes.packagesOf(each.uid);
+        for (const std::string& name : names) packages += (packages.empty() ? "" : " ") + name;
         base::CsvWriter row(rows());
         row.field(name()).field(takenOf(notes)).field(each.uid);
-        row.field(names == nullptr ? "" : firstOf(*names)).field(packages).field(each.handle);
+        row.field(firstOf(names)).field(packages).field(each.handle);
         row.field(notes.nameOf(each)).field(each.ms).field(each.count);
         row.field(ifKnown(each.background)).field(flag(each.shared));
         row.field(ifKnown(charge.onBatteryMs));

@@ -183,20 +183,23 @@ std::string shortenApp(const std::string& app) {
     return isTwice ? app.substr(0, half) : app;
 }
 
-EventText layOutEvent(const day::Event& event, size_t limit) {
-    EventText text;
-    text.title = base::formatTimeOfDay(std::chrono::nanoseconds(event.at)) + "  " + safe(event.id);
+Section layOutEvent(const day::Event& event, size_t limit) {
+    Section section;
+    section.heading =
+            base::formatTimeOfDay(std::chrono::nanoseconds(event.at)) + "  " + safe(event.id);
     const std::string_view meaning = describe(event.payload.kind);
-    if (!meaning.empty()) text.title.append("  ").append(meaning);
+    if (!meaning.empty()) section.heading.append("  ").append(meaning);
+    Section::List values;
     for (const Field& field : event.payload.fields) {
         if (field.isList) {
-            text.lists.push_back(layOutList(field, limit));
+            section.add(layOutList(field, limit), "report", "What it lists");
         } else {
-            text.values.emplace_back(safe(describeKey(event.payload.kind, field.key)),
-                                     showPlain(field));
+            values.items.push_back(safe(describeKey(event.payload.kind, field.key)) + ": " +
+                                   showPlain(field));
         }
     }
-    return text;
+    if (!values.items.empty()) section.lists.push_back(std::move(values));
+    return section;
 }
 
 std::string_view describe(EventKind kind) {

@@ -4,25 +4,20 @@
 #include <map>
 #include <string>
 #include <string_view>
-#include <utility>
 #include <vector>
 
 #include "base/Json.h"
 #include "day/Journal.h"
 #include "day/Payload.h"
-#include "report/Table.h"
+#include "report/Section.h"
 
 namespace report {
 
-/** An event laid out for a person. Rates are in Hz, times h:mm:ss. */
-struct EventText {
-    std::string title;                                        // time of day, id and meaning
-    std::vector<std::pair<std::string, std::string>> values;  // what they are, and what they say
-    std::vector<Table> lists;
-};
-
-/** Lays `event` out; its lists show at most `limit` rows. */
-EventText layOutEvent(const day::Event& event, size_t limit);
+/**
+ * An event under its time of day, id and meaning. Rates are in Hz, times h:mm:ss; its lists show at
+ * most `limit` rows.
+ */
+Section layOutEvent(const day::Event& event, size_t limit);
 
 /** The event in words, as "screen samples of the day"; empty for an unknown one. */
 std::string_view describe(trace::EventKind kind);

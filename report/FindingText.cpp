@@ -23,7 +23,7 @@ std::string times(int64_t number) {
 
 std::string describe(const Finding& finding, const day::Journal& journal) {
     const auto moment = [&](int64_t at) {
-        return finding.capture ? formatMoment(at, journal.captures()[*finding.capture])
+        return finding.capture ? formatMoment(at, journal.captures[*finding.capture])
                                : formatClock(at);
     };
     const std::string app = nameApp(finding.holder);
@@ -61,7 +61,7 @@ std::string describe(const Finding& finding, const day::Journal& journal) {
 }  // namespace
 
 bool hasFindings(const day::Journal& journal) {
-    return !journal.captures().empty() || !journal.lost().empty();
+    return !journal.captures.empty() || !journal.lost.empty();
 }
 
 std::vector<std::string> describeFindings(const day::Journal& journal) {

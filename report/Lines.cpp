@@ -117,7 +117,7 @@ void JsonLines::writeRecord(const Record& record) {
 }
 
 void JsonLines::writeCapture(int64_t at) {
-    const auto& capture = mTracker.notes().capture();
+    const auto& capture = mTracker.notes().capture;
     if (!capture || mHasTold) return;
     mHasTold = true;
     writeLine(at, [&](JsonWriter* json) {
@@ -131,9 +131,9 @@ void JsonLines::writeCapture(int64_t at) {
 
 void JsonLines::writeEnded(int64_t before) {
     mEnded.tell(before, [this](const day::Use& use) {
-        if (mTracker.notes().namesSensors()) writeUse(use);
+        if (mTracker.notes().namesSensors) writeUse(use);
     });
-    const auto& taken = mTracker.notes().taken();
+    const auto& taken = mTracker.notes().taken;
     if (!taken || !mTracker.isClosed() || mIsClosed) return;
     mIsClosed = true;
     writeTaken(*taken, *mTracker.notes().knownTo());
@@ -172,11 +172,10 @@ void JsonLines::writeTaken(const trace::TakenNote& taken, int64_t at) {
     if (!taken.sinceCharge) return;
     const day::Notes& notes = mTracker.notes();
     for (const trace::ChargeRow& row : taken.sinceCharge->rows) {
-        const auto* packages = notes.packagesOf(row.uid);
         const std::string sensor = notes.nameOf(row);
         writeLine(at, [&](JsonWriter* json) {
             json->key("sinceCharge").beginObject().member("uid", row.uid);
-            if (packages != nullptr) packagesMember(json, *packages);
+            packagesMember(json, notes.packagesOf(row.uid));
             json->member("handle", row.handle);
             if (!sensor.empty()) json->member("sensor", sensor);
             json->member("ms", row.ms).member("count", row.count);

@@ -1,11 +1,11 @@
-#include "report/OnNowText.h"
-
 #include <optional>
 
 #include "base/Calendar.h"
+#include "day/OnNow.h"
 #include "report/AppNames.h"
 #include "report/CaptureFacts.h"
 #include "report/DayRows.h"
+#include "report/Sections.h"
 #include "report/Text.h"
 
 namespace report {
@@ -40,10 +40,10 @@ std::string nameRate(int64_t level) {
 }
 
 std::string describeChannel(const trace::DirectChannel& channel, const day::Notes& notes) {
-    const auto* packages = channel.uid ? notes.packagesOf(*channel.uid) : nullptr;
-    const bool isNamed = channel.package.empty() && packages != nullptr;
-    std::string text = "Direct channel of " +
-                       (isNamed ? nameUid(*channel.uid, packages) : channel.package) + ": " +
+    const bool isOfUid = channel.package.empty() && channel.uid;
+    const std::string app =
+            isOfUid ? nameUid(*channel.uid, notes.packagesOf(*channel.uid)) : channel.package;
+    std::string text = "Direct channel of " + app + ": " +
                        count(static_cast<size_t>(channel.sensors), "sensor");
     const char* gap = channel.rates.size() == 1 ? ", rate level " : ", rate levels ";
     for (const int64_t rate : channel.rates) {
@@ -55,41 +55,41 @@ std::string describeChannel(const trace::DirectChannel& channel, const day::Note
 
 }  // namespace
 
-OnNowText describeOnNow(const day::Journal& journal, size_t capture, size_t limit) {
-    const day::Notes& notes = journal.captures()[capture];
+Section layOutOnNow(const day::Journal& journal, size_t capture, size_t limit) {
+    const day::Notes& notes = journal.captures[capture];
     const day::OnNow on = whatIsOn(journal, capture);
-    OnNowText text{{},
-                   Table({{"App", Table::Column::kCut},
-                          {"Sensor", Table::Column::kCut},
-                          {"Since"},
-                          {"Hz", Table::Column::kRight},
-                          {"Batch", Table::Column::kRight},
-                          {"Wake"},
-                          {""}},
-                         limit),
-                   {}};
+    Table table({{"App", Table::Column::kCut},
+                 {"Sensor", Table::Column::kCut},
+                 {"Since"},
+                 {"Hz", Table::Column::kRight},
+                 {"Batch", Table::Column::kRight},
+                 {"Wake"},
+                 {""}},
+                limit);
     for (const day::OnRow& row : on.rows) {
         const day::Use* const use = row.use;
-        text.rows.add({nameApp(row.holder), nameSensor(row.holder),
-                       use != nullptr ? formatSince(*use, notes) : "",
-                       use != nullptr ? formatHz(row.holder, use->periodNs) : "",
-                       use != nullptr ? formatBatch(use->batchUs) : "", formatWake(row.holder),
-                       describeRow(row)});
+        table.add({nameApp(row.holder), nameSensor(row.holder),
+                   use != nullptr ? formatSince(*use, notes) : "",
+                   use != nullptr ? formatHz(row.holder, use->periodNs) : "",
+                   use != nullptr ? formatBatch(use->batchUs) : "", formatWake(row.holder),
+                   describeRow(row)});
     }
-    if (on.rows.empty()) text.before.emplace_back("Nothing is on.");
+    Section section;
+    section.heading = "On when it was taken";
+    if (on.rows.empty()) section.lines.emplace_back("Nothing is on.");
     if (!on.isFromConnections) {
-        text.before.emplace_back(
+        section.lines.emplace_back(
                 "The capture has no table of connections: the registrations tell it.");
     }
-    if (const auto& taken = notes.taken()) {
-        if (taken->operatingMode) {
-            text.after.push_back("Operating mode: " + safe(*taken->operatingMode));
-        }
-        for (const trace::DirectChannel& each : taken->direct) {
-            text.after.push_back(describeChannel(each, notes));
-        }
+    section.add(std::move(table), "on", "What is on");
+    if (!notes.taken) return section;
+    if (notes.taken->operatingMode) {
+        section.below.push_back("Operating mode: " + safe(*notes.taken->operatingMode));
     }
-    return text;
+    for (const trace::DirectChannel& each : notes.taken->direct) {
+        section.below.push_back(describeChannel(each, notes));
+    }
+    return section;
 }
 
 }  // namespace report

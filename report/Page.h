@@ -9,7 +9,6 @@
 #include "day/Journal.h"
 #include "report/Compare.h"
 #include "report/Report.h"
-#include "report/page/PageModel.h"
 #include "report/page/PageWriter.h"
 
 namespace report {
@@ -27,19 +26,17 @@ public:
     Page(base::OutputFile* file, size_t baselines) : mFile(file), mSides(baselines) {}
 
     trace::WantedRecords wanted() const override { return {true, false}; }
-    void begin(const std::string& name) override { mJournal.begin(name); }
-    void take(const trace::Record& record) override { mJournal.take(record); }
+    void begin(const std::string& name) override { mWriter.begin(name); }
+    void take(const trace::Record& record) override { mWriter.take(record); }
     void end(bool isWhole) override;
     void finish() override;
     const std::optional<base::Failure>& failure() const override { return mFailure; }
 
 private:
-    page::Input model(bool isWhole) const;
-
     base::OutputFile* const mFile;
-    day::Journal mJournal;
+    day::JournalWriter mWriter;
     ComparedSides mSides;
-    page::PageWriter mWriter;
+    page::PageWriter mPages;
     std::optional<base::Failure> mFailure;
 };
 

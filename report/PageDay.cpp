@@ -95,16 +95,15 @@ public:
     DayMaker(const day::Journal& journal, const day::Day& day)
           : mJournal(journal),
             mDay(day),
-            mBoot(journal.boots()[static_cast<size_t>(day.boot)]),
-            mNotes(mBoot.capture ? &journal.captures()[*mBoot.capture] : nullptr),
+            mBoot(journal.boots[static_cast<size_t>(day.boot)]),
+            mNotes(mBoot.capture ? &journal.captures[*mBoot.capture] : nullptr),
             mMidnight(day.number * base::kNsPerDay) {}
 
     page::Day make() {
         mResult.name = nameDay(mJournal, mDay);
-        const auto known = mNotes != nullptr ? mNotes->known() : std::nullopt;
-        mResult.display = bandOf(mJournal.display(), known ? &known->display : nullptr, 1, 1);
-        mResult.charge = bandOf(mJournal.charge(), known ? &known->charge : nullptr, 1, 3);
-        addUnseen();
+        mResult.display = bandOf(mJournal.display, &trace::KnownStates::display);
+        mResult.charge = bandOf(mJournal.charge, &trace::KnownStates::charge);
+        mResult.unseen = day::without(kDay, inDay(mBoot.seen));
         addMarks();
         addUses();
         return std::move(mResult);
@@ -113,55 +112,33 @@ public:
 private:
     static constexpr Span kDay{0, base::kNsPerDay};
 
-    static bool isEmpty(Span span) { return span.from >= span.to; }
-    static Span cut(Span span, Span to) {
-        return {std::max(span.from, to.from), std::min(span.to, to.to)};
+    /** What of spans of the clock lies in the day, counted from its midnight. */
+    std::vector<Span> inDay(std::vector<Span> spans) const {
+        for (Span& span : spans) span = {span.from - mMidnight, span.to - mMidnight};
+        return day::commonOf(spans, {kDay});
     }
 
-    /** What of a span of the clock lies in the day, counted from its midnight. */
-    Span inDay(Span span) const { return cut({span.from - mMidnight, span.to - mMidnight}, kDay); }
-
-    /** A state that is on from `first` to `last`. `known` bounds what is known; null: nothing does.
-     */
+    /** A state, which without a capture is known where it is told. */
     page::Band bandOf(const std::vector<day::StateSpan>& states,
-                      const std::vector<trace::Interval>* known, int64_t first,
-                      int64_t last) const {
-        std::vector<Span> bounds{kDay};
-        if (known != nullptr) {
-            bounds.clear();
-            for (const Span& each : day::spansOf(*known)) bounds.push_back(inDay(each));
+                      std::vector<trace::Interval> trace::KnownStates::*known) const {
+        std::vector<Span> told;
+        std::vector<Span> on;
+        for (const day::StateSpan& state : states) {
+            if (state.boot != mDay.boot) continue;
+            told.push_back(state.span);
+            if (state.isOn) on.push_back(state.span);
         }
-        page::Band band;
-        int64_t end = 0;  // of what is made
-        for (const Span& bound : bounds) {
-            for (const day::StateSpan& state : states) {
-                if (state.boot != mDay.boot) continue;
-                const Span span = cut(inDay(state.span), bound);
-                if (isEmpty(span)) continue;
-                if (span.from > end) band.unknown.push_back({end, span.from});
-                if (state.value >= first && state.value <= last) {
-                    band.on.push_back({span.from, span.to});
-                }
-                end = span.to;
-            }
-        }
-        if (end < kDay.to) band.unknown.push_back({end, kDay.to});
-        return band;
-    }
-
-    void addUnseen() {
-        std::vector<Span> seen;
-        for (const Span& span : mBoot.seen) seen.push_back(inDay(span));
-        for (const Span& span : day::without(kDay, seen)) {
-            mResult.unseen.push_back({span.from, span.to});
-        }
+        std::vector<Span> bounds{{mMidnight, mMidnight + base::kNsPerDay}};
+        if (mNotes != nullptr && mNotes->known) bounds = day::spansOf(*mNotes->known.*known);
+        return {inDay(day::commonOf(bounds, on)),
+                day::without(kDay, inDay(day::commonOf(bounds, told)))};
     }
 
     void addMarks() {
         for (const day::Event* event : mJournal.eventsOf(mDay)) {
             auto& marks = event->isAhead ? mResult.ahead : mResult.reports;
             const char* const lead = event->isAhead ? "if nothing changed: " : "";
-            marks.push_back({event->at - mMidnight, lead + layOutEvent(*event, 0).title});
+            marks.push_back({event->at - mMidnight, lead + layOutEvent(*event, 0).heading});
         }
         const auto end = mNotes != nullptr ? mNotes->knownTo() : std::nullopt;
         if (!end || *end / base::kNsPerDay != mDay.number) return;
@@ -169,13 +146,13 @@ private:
     }
 
     void addUses() {
-        const auto rows = mJournal.table().rowsOf(mDay);
+        const auto rows = mJournal.table.rowsOf(mDay);
         if (rows.empty()) return;
         mResult.uses =
                 page::tableOf(dayTable(rows, Table::kAllRows), "uses", "Who held which sensor");
         if (rows.size() > 1) mResult.uses->total = totalOf(rows, *mResult.uses);
         std::map<day::HolderKey, std::vector<const Use*>> byRow;
-        for (const Use& use : mJournal.uses()) {
+        for (const Use& use : mJournal.uses) {
             if (use.boot != mDay.boot || use.from >= mMidnight + base::kNsPerDay) continue;
             if (use.to < mMidnight) continue;
             byRow[keyOf(use)].push_back(&use);
@@ -195,10 +172,11 @@ private:
 
     /** What of a use lies in the day, if anything. */
     std::optional<page::Use> partOf(const Use& use) const {
-        const Span span = inDay(Span{use.from, use.to});
-        if (span.from > span.to || (isEmpty(span) && use.from != use.to)) return {};
         page::Use part;
-        part.span = {span.from, span.to};
+        part.span = {std::max<int64_t>(use.from - mMidnight, 0),
+                     std::min(use.to - mMidnight, base::kNsPerDay)};
+        // A use that was off at once has its place, one that ends at midnight has none behind it.
+        if (part.span.from >= part.span.to && use.from != use.to) return {};
         part.isBefore = use.before && use.from >= mMidnight;
         const bool isEnd = use.to <= mMidnight + base::kNsPerDay;
         if (use.end == day::End::kUnseen) part.end = page::Use::End::kUnseen;

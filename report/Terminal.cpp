@@ -1,5 +1,6 @@
 #include "report/Terminal.h"
 
+#include <algorithm>
 #include <vector>
 
 #include "report/Text.h"
@@ -16,6 +17,27 @@ void Terminal::heading(const std::string& text) {
 
 void Terminal::table(const Table& table, size_t indent) {
     mOut->write(table.text(indent, mLooks.columns));
+}
+
+void Terminal::section(const Section& section, size_t indent) {
+    if (indent == 0) {
+        heading(section.heading + (section.isEmpty() ? " nothing" : ""));
+    } else {
+        name(section.heading, indent);
+    }
+    const size_t inner = indent + 2;
+    for (const std::string& line : section.lines) sentence(line, inner);
+    for (const auto& [title, items] : section.lists) {
+        if (!title.empty()) sentence(title, inner);
+        const size_t itemIndent = title.empty() ? inner : inner + 2;
+        const size_t shown = std::min(items.size(), mLooks.rows());
+        for (size_t i = 0; i < shown; ++i) name(items[i], itemIndent);
+        const size_t more = items.size() - shown;
+        if (more > 0) name("and " + std::to_string(more) + " more", itemIndent);
+    }
+    for (const auto& shown : section.tables) table(shown.table, inner);
+    for (const std::string& line : section.below) sentence(line, inner);
+    for (const Section& part : section.parts) this->section(part, inner);
 }
 
 void Terminal::name(const std::string& text, size_t indent) {

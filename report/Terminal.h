@@ -5,6 +5,7 @@
 #include <string>
 #include <utility>
 
+#include "report/Section.h"
 #include "report/Stdout.h"
 #include "report/Table.h"
 
@@ -29,6 +30,9 @@ public:
     /** Behind an empty line. */
     void heading(const std::string& text);
     void table(const Table& table, size_t indent);
+
+    /** With all that stands in it, each step deeper by two blanks. */
+    void section(const Section& section, size_t indent = 0);
 
     /** A name, cut where the terminal ends; a sentence, broken there. */
     void name(const std::string& text, size_t indent);

@@ -64,7 +64,7 @@ void TimelineFile::begin(const std::string& name) {
 
 /** A date moves an input to its place on the clock that all inputs share. */
 void TimelineFile::date() {
-    const auto day = mTracker.notes().firstDay();
+    const auto day = mTracker.notes().firstDay;
     if (!mSeveralInputs || mIsDated || !day) return;
     mIsDated = true;
     if (!mFirstDay) mFirstDay = day;
@@ -165,7 +165,7 @@ void TimelineFile::writeState(DeviceState state, const std::string& name, day::S
         mEvents.slice(processOf(kDevice), kTracks[static_cast<size_t>(state)], what, from, to,
                       [](JsonWriter*) {});
     };
-    const auto& known = mTracker.notes().known();
+    const auto& known = mTracker.notes().known;
     if (!known) return write(name, span.from, span.to);
     const auto* const spans = state == DeviceState::kDisplay  ? &known->display
                               : state == DeviceState::kCharge ? &known->charge
@@ -191,7 +191,7 @@ void TimelineFile::endKnown() {
     }
     endBoot();
     mEvents.instant(processOf(kDevice), "capture", "taken", mAt, [&](JsonWriter* json) {
-        if (notes.capture() && notes.capture()->taken) json->member("at", *notes.capture()->taken);
+        if (notes.capture && notes.capture->taken) json->member("at", *notes.capture->taken);
     });
 }
 

@@ -44,13 +44,12 @@ Record displayIs(int64_t seconds, bool isOn) {
 
 /** A boot of the device at 0 in which the records happen, and that ends with the last. */
 day::Journal gather(const std::vector<Record>& records) {
-    day::Journal journal;
-    journal.begin("input");
-    journal.take(at(0, Kind::kBoot));
-    for (const Record& record : records) journal.take(record);
-    journal.take({Kind::kOver, records.back().at});
-    journal.end();
-    return journal;
+    day::JournalWriter writer;
+    writer.begin("input");
+    writer.take(at(0, Kind::kBoot));
+    for (const Record& record : records) writer.take(record);
+    writer.take({Kind::kOver, records.back().at});
+    return writer.end();
 }
 
 /** "app from-to end enables", and the display's time that was known and on. */
@@ -105,7 +104,7 @@ TEST(DayTest, UsesAreFollowedByTheirClientsToTheEndOfWhatIsKnown) {
     for (const auto& [what, records, expected] : kCases) {
         const day::Journal journal = gather(records);
         std::vector<std::string> uses;
-        for (const day::Use& use : journal.uses()) uses.push_back(show(use));
+        for (const day::Use& use : journal.uses) uses.push_back(show(use));
         EXPECT_EQ(uses, expected) << what;
     }
 }
@@ -125,15 +124,15 @@ TEST(DayTest, AUseKnowsItsSensorItsShortestPeriodAndItsSamples) {
             on(0, "guess", R"({"handle": 7, "rateKnown": false})", 0),
             at(10, Kind::kTick),
     });
-    ASSERT_EQ(journal.uses().size(), 4u);
-    const day::Use& use = journal.uses()[0];
+    ASSERT_EQ(journal.uses.size(), 4u);
+    const day::Use& use = journal.uses[0];
     EXPECT_EQ(use.sensor, "Acc");
     EXPECT_EQ(use.packages, std::vector<std::string>{"com.a"});
     EXPECT_EQ(use.periodNs, 20'000'000);
     EXPECT_EQ(use.batchUs, 50);
     const std::optional<double> kSamples[] = {500, 1000, std::nullopt, std::nullopt};
-    for (const day::Use& each : journal.uses()) {
-        const size_t i = &each - journal.uses().data();
+    for (const day::Use& each : journal.uses) {
+        const size_t i = &each - journal.uses.data();
         EXPECT_EQ(samplesOf(each), kSamples[each.pkg == "fast" ? 1 : i == 0 ? 0 : 2]) << each.pkg;
     }
 }
@@ -236,7 +235,7 @@ TEST(DayTest, ATableSplitsUsesAtMidnightAndKeepsSensorsOfOneTypeApart) {
     });
     std::string shown;
     for (const day::Day& day : journal.days()) {
-        for (const day::DayRow& row : journal.table().rowsOf(day)) {
+        for (const day::DayRow& row : journal.table.rowsOf(day)) {
             shown += std::to_string(day.number) + ": " + std::to_string(row.held / kSecond) + ' ' +
                      std::to_string(row.display.known / kSecond) + ' ' +
                      std::to_string(row.enables) +
@@ -248,21 +247,20 @@ TEST(DayTest, ATableSplitsUsesAtMidnightAndKeepsSensorsOfOneTypeApart) {
 }
 
 TEST(DayTest, WhatIsSeenAndHeldOnBatteryIsCountedOnce) {
-    day::Journal journal;
-    journal.begin("input");
-    journal.take(at(0, Kind::kBoot));
-    journal.take(note(0, R"({"capture": {"files": ["f"], "registrations": 1, "from": 0, "to": 90000,
+    day::JournalWriter writer;
+    writer.begin("input");
+    writer.take(at(0, Kind::kBoot));
+    writer.take(note(0, R"({"capture": {"files": ["f"], "registrations": 1, "from": 0, "to": 90000,
         "knownTo": 100000, "bound": "stamp"}, "gaps": [{"from": 10000, "to": 20000}],
         "sensors": [{"handle": 1, "name": "A", "type": 1}], "taken": {"sinceCharge":
         {"onBatteryMs": 9000, "rows": [{"uid": 5, "handle": 1, "ms": 1, "count": 1},
         {"uid": 5, "handle": 7, "ms": 2, "count": 1}, {"uid": 5, "handle": -10000, "ms": 3,
         "count": 1}]}}})"));
-    journal.take(displayIs(5, false));
-    journal.take({Kind::kOver, 40 * kSecond});
-    journal.take(at(40, Kind::kBoot, {}, 0, static_cast<int32_t>(trace::BootKind::kProcess)));
-    journal.take({Kind::kOver, 50 * kSecond});
-    journal.end();
-    const day::Profile profile = profileOf(journal);
+    writer.take(displayIs(5, false));
+    writer.take({Kind::kOver, 40 * kSecond});
+    writer.take(at(40, Kind::kBoot, {}, 0, static_cast<int32_t>(trace::BootKind::kProcess)));
+    writer.take({Kind::kOver, 50 * kSecond});
+    const day::Profile profile = profileOf(writer.end());
     EXPECT_EQ(profile.covered, 90 * kSecond) << "40 and 60 but for the gap";
     EXPECT_EQ(profile.displayOff, 25 * kSecond) << "the second process was told nothing";
     std::string rows;
@@ -323,11 +321,11 @@ TEST(EventTextTest, AValueIsShownAsItsKindAndAsItIsIfItIsNoNumber) {
     for (const auto& [seconds, shown] :
          {std::pair("1801", "0:30:01"), {"-5", "-5"}, {"12x", "12x"}, {"", ""}, {"0", "0:00:00"}}) {
         const std::string payload = std::string("pkg:a/a&time:") + seconds;
-        const report::EventText text =
+        const report::Section text =
                 report::layOutEvent({0, 0, kId, day::takeApart(kId, payload), false}, 1);
-        ASSERT_EQ(text.values.size(), 2u);
-        EXPECT_EQ(text.values[0].second, "a");
-        EXPECT_EQ(text.values[1].second, shown);
+        ASSERT_EQ(text.lists.size(), 1u);
+        EXPECT_EQ(text.lists[0].items,
+                  (std::vector<std::string>{"app: a", std::string("held: ") + shown}));
     }
 }
 

@@ -4,10 +4,9 @@
 #include <gtest/gtest.h>
 
 #include "day/Journal.h"
-#include "report/ChargeText.h"
 #include "report/DayRows.h"
 #include "report/FindingText.h"
-#include "report/OnNowText.h"
+#include "report/Sections.h"
 
 namespace {
 
@@ -55,38 +54,37 @@ struct Line {
 
 /** A capture from 4 to 10 o'clock, the display on for the first half hour only. */
 day::Journal journalOf(const std::vector<Line>& lines) {
-    day::Journal journal;
-    journal.begin("input");
+    day::JournalWriter writer;
+    writer.begin("input");
     const auto at = [](int64_t minute) { return (240 + minute) * kMinute; };
-    journal.take({Kind::kBoot, at(0)});
-    journal.take({Kind::kNote, at(0), {kScreenCapture}});
-    journal.take({Kind::kState, at(0), {}, 1, static_cast<int32_t>(trace::DeviceState::kDisplay)});
-    journal.take({Kind::kState, at(0), {}, 2, static_cast<int32_t>(trace::DeviceState::kCharge)});
+    writer.take({Kind::kBoot, at(0)});
+    writer.take({Kind::kNote, at(0), {kScreenCapture}});
+    writer.take({Kind::kState, at(0), {}, 1, static_cast<int32_t>(trace::DeviceState::kDisplay)});
+    writer.take({Kind::kState, at(0), {}, 2, static_cast<int32_t>(trace::DeviceState::kCharge)});
     bool isDark = false;
     for (const Line& line : lines) {
         if (line.minute >= 30 && !isDark) {
             isDark = true;
-            journal.take({Kind::kState, at(30), {}, 0, 0});
-            journal.take({Kind::kState,
-                          at(60),
-                          {},
-                          0,
-                          static_cast<int32_t>(trace::DeviceState::kCharge)});
+            writer.take({Kind::kState, at(30), {}, 0, 0});
+            writer.take({Kind::kState,
+                         at(60),
+                         {},
+                         0,
+                         static_cast<int32_t>(trace::DeviceState::kCharge)});
         }
         if (line.tag.empty()) {
-            journal.take({Kind::kNote, at(line.minute), {line.note}});
+            writer.take({Kind::kNote, at(line.minute), {line.note}});
             continue;
         }
-        journal.take({line.isOn ? Kind::kEnable : Kind::kDisable,
-                      at(line.minute),
-                      {line.tag, line.tag, line.note},
-                      line.periodNs,
-                      65537});
+        writer.take({line.isOn ? Kind::kEnable : Kind::kDisable,
+                     at(line.minute),
+                     {line.tag, line.tag, line.note},
+                     line.periodNs,
+                     65537});
     }
-    journal.take({Kind::kNote, at(360), {kTaken}});
-    journal.take({Kind::kOver, at(400)});
-    journal.end();
-    return journal;
+    writer.take({Kind::kNote, at(360), {kTaken}});
+    writer.take({Kind::kOver, at(400)});
+    return writer.end();
 }
 
 const std::vector<Line> kLines = {
@@ -123,7 +121,7 @@ TEST(ScreenTest, FindingsComeByTheirWeightAndNeverMoreThanSeven) {
 
 TEST(ScreenTest, TheTablesSayWhatIsKnownAndMarkWhatIsNot) {
     const day::Journal journal = journalOf(kLines);
-    EXPECT_EQ("\n" + report::dayTable(journal.table().rowsOf({0, 0}), kAll).text(0), R"(
+    EXPECT_EQ("\n" + report::dayTable(journal.table.rowsOf({0, 0}), kAll).text(0), R"(
 App             Sensor      Held             Display  Enables     Hz                Batch  Wake  Samples
 com.b +1        Gyro     0:02:00  0:02:00 of 0:02:00        1   50.0                1.5 s
 com.a (x)       Acc     ≥6:00:00  0:30:00 of 6:00:00        1  100.0  as long as possible           2.2M  still on
@@ -132,22 +130,23 @@ com.b +1 (tag)  Steps   ≥6:00:00  0:30:00 of 6:00:00        1      ?          
 com.a (shot)    Motion   1:28:00  0:28:00 of 1:28:00        1                           0  wake           fired
 )");
 
-    const report::OnNowText on = report::describeOnNow(journal, 0, kAll);
-    EXPECT_EQ("\n" + on.rows.text(0), R"(
+    const report::Section on = report::layOutOnNow(journal, 0, kAll);
+    EXPECT_EQ("\n" + on.tables[0].table.text(0), R"(
 App             Sensor             Since               Hz                Batch  Wake
 com.a (x)       Gyro                                                                  no line tells of it
 com.a (x)       Acc                before 04:00:00  100.0  as long as possible
 com.b +1 (tag)  Steps              before 04:00:00      ?                    0  wake  no data access, 1 wake lock, 2 connections, rate unknown
 late            handle 0x00000009                                                     no line tells of it
 )");
-    EXPECT_EQ(on.before, std::vector<std::string>());
-    EXPECT_EQ(on.after, (std::vector<std::string>{
+    EXPECT_EQ(on.lines, std::vector<std::string>());
+    EXPECT_EQ(on.below, (std::vector<std::string>{
                                 "Operating mode: RESTRICTED",
                                 "Direct channel of com.vr: 2 sensors, rate levels 1 (normal), 7"}));
 
-    const report::ChargeText charge = report::describeSinceCharge(journal, 0, kAll);
-    EXPECT_EQ(charge.line, "The registrations cover 5:00:00 of the 10:00:00 on battery.");
-    EXPECT_EQ("\n" + charge.rows.text(0), R"(
+    const report::Section charge = report::layOutSinceCharge(journal, 0, kAll);
+    EXPECT_EQ(charge.lines, std::vector<std::string>{
+                                    "The registrations cover 5:00:00 of the 10:00:00 on battery."});
+    EXPECT_EQ("\n" + charge.tables[0].table.text(0), R"(
 App    Sensor     Time  Of battery time  In background  Count
 com.a  Acc     5:00:00             50 %           50 %      0  shared, on since before the last charge
 uid 9  GPS     0:00:01              0 %                     1

@@ -5,6 +5,9 @@
 #include <string>
 #include <vector>
 
+#include "day/Spans.h"
+#include "report/Section.h"
+
 /**
  * What the page shows, in the page's order. Whoever fills it in has decided everything but the
  * looks. Each text is data from outside or English; none is markup. Times are nanoseconds since the
@@ -12,10 +15,7 @@
  */
 namespace report::page {
 
-struct Span {
-    int64_t from;
-    int64_t to;
-};
+using day::Span;
 
 struct Column {
     enum class Kind {
@@ -40,20 +40,6 @@ struct Table {
     std::vector<Column> columns;
     std::vector<std::vector<Cell>> rows;
     std::vector<Cell> total;  // a cell for each column; empty: none
-};
-
-/** A heading, and what stands under it, in this order. */
-struct Section {
-    struct List {
-        std::string title;
-        std::vector<std::string> items;
-    };
-
-    std::string heading;
-    std::vector<std::string> lines;
-    std::vector<List> lists;
-    std::vector<Table> tables;
-    std::vector<Section> parts;
 };
 
 /** The part of a use of a sensor that lies within a day. */

@@ -11,6 +11,7 @@
 #include "report/page/Embedded.h"
 #include "report/page/Html.h"
 #include "report/page/PageData.h"
+#include "report/page/TableOf.h"
 
 namespace report::page {
 
@@ -119,7 +120,11 @@ private:
             if (!title.empty()) mHtml += element("p", title);
             addList(items);
         }
-        for (const Table& table : section.tables) addTable(table);
+        for (const auto& [table, kind, caption] : section.tables) {
+            addTable(tableOf(table, kind, caption));
+        }
+        for (const std::string& line : section.below) mHtml += element("p", line);
+        if (section.isEmpty()) mHtml += element("p", "Nothing.");
         for (const Section& part : section.parts) addSection(part, level + 1);
     }
 
