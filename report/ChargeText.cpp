@@ -3,9 +3,9 @@
 #include <vector>
 
 #include "base/Calendar.h"
-#include "report/AppNames.h"
+#include "report/Format.h"
+#include "report/Names.h"
 #include "report/Sections.h"
-#include "report/SensorNames.h"
 
 namespace report {
 
@@ -33,8 +33,7 @@ std::string describeCoverage(const day::Journal& journal, size_t capture) {
     const auto& charge = *journal.captures[capture].taken->sinceCharge;
     const day::BatteryCoverage coverage = journal.batteryCoverage(capture);
     std::string text = std::string("The registrations cover ") +
-                       (coverage.isUpperBound ? "at most " : "") +
-                       base::formatDuration(std::chrono::nanoseconds(coverage.seen));
+                       (coverage.isUpperBound ? "at most " : "") + formatDuration(coverage.seen);
     if (!charge.onBatteryMs) return text + " of the time on battery.";
     return text + " of the " +
            base::formatDuration(std::chrono::milliseconds(*charge.onBatteryMs)) + " on battery.";

@@ -8,7 +8,7 @@
 #include "base/FileIo.h"
 #include "base/Json.h"
 #include "day/Samples.h"
-#include "report/SensorNames.h"
+#include "report/Names.h"
 
 namespace report {
 
@@ -126,7 +126,7 @@ void UsesCsv::endInput() {
 }
 
 void UsesCsv::addEnded(int64_t before) {
-    mEnded.tell(before, [this](const day::Use& use) { add(use); });
+    for (const day::Use& use : mEnded.take(before)) add(use);
 }
 
 void UsesCsv::add(const day::Use& use) {

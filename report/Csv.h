@@ -7,7 +7,6 @@
 #include <vector>
 
 #include "base/OutputFile.h"
-#include "day/EndedUses.h"
 #include "day/UseTracker.h"
 #include "report/Report.h"
 

@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "base/Calendar.h"
+#include "report/Format.h"
 #include "report/Text.h"
 
 namespace report {
@@ -185,8 +186,7 @@ std::string shortenApp(const std::string& app) {
 
 Section layOutEvent(const day::Event& event, size_t limit) {
     Section section;
-    section.heading =
-            base::formatTimeOfDay(std::chrono::nanoseconds(event.at)) + "  " + safe(event.id);
+    section.heading = formatTimeOfDay(event.at) + "  " + safe(event.id);
     const std::string_view meaning = describe(event.payload.kind);
     if (!meaning.empty()) section.heading.append("  ").append(meaning);
     Section::List values;

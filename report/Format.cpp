@@ -7,6 +7,14 @@
 
 namespace report {
 
+std::string formatDuration(int64_t ns) {
+    return base::formatDuration(std::chrono::nanoseconds(ns));
+}
+
+std::string formatTimeOfDay(int64_t ns) {
+    return base::formatTimeOfDay(std::chrono::nanoseconds(ns));
+}
+
 std::string formatClock(int64_t ns) {
     const std::string day = "day " + std::to_string(ns / base::kNsPerDay + 1) + ' ';
     char decimals[16];

@@ -6,6 +6,12 @@
 
 namespace report {
 
+/** A duration in nanoseconds as h:mm:ss; parts of a second are left out. */
+std::string formatDuration(int64_t ns);
+
+/** The time of day of a moment, in nanoseconds from any midnight, as "11:45:07". */
+std::string formatTimeOfDay(int64_t ns);
+
 /** The clock as a person reads it: the day since the boot and the time of that day. */
 std::string formatClock(int64_t ns);
 

@@ -130,9 +130,9 @@ void JsonLines::writeCapture(int64_t at) {
 }
 
 void JsonLines::writeEnded(int64_t before) {
-    mEnded.tell(before, [this](const day::Use& use) {
+    for (const day::Use& use : mEnded.take(before)) {
         if (mTracker.notes().namesSensors) writeUse(use);
-    });
+    }
     const auto& taken = mTracker.notes().taken;
     if (!taken || !mTracker.isClosed() || mIsClosed) return;
     mIsClosed = true;

@@ -2,9 +2,10 @@
 
 #include "base/Calendar.h"
 #include "day/OnNow.h"
-#include "report/AppNames.h"
 #include "report/CaptureFacts.h"
 #include "report/DayRows.h"
+#include "report/Format.h"
+#include "report/Names.h"
 #include "report/Sections.h"
 #include "report/Text.h"
 
@@ -16,7 +17,7 @@ namespace {
 std::string formatSince(const day::Use& use, const day::Notes& notes) {
     const int64_t takenDay = *notes.knownTo() / base::kNsPerDay;
     const int64_t day = use.from / base::kNsPerDay;
-    const std::string time = base::formatTimeOfDay(std::chrono::nanoseconds(use.from));
+    const std::string time = formatTimeOfDay(use.from);
     return (use.before ? "before " : "") + (day == takenDay ? time : formatMoment(use.from, notes));
 }
 

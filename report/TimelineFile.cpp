@@ -6,10 +6,9 @@
 
 #include "base/Calendar.h"
 #include "day/Payload.h"
-#include "report/AppNames.h"
 #include "report/DayRows.h"
 #include "report/EventText.h"
-#include "report/SensorNames.h"
+#include "report/Names.h"
 #include "report/Text.h"
 #include "trace/CallTable.h"
 

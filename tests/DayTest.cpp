@@ -262,13 +262,14 @@ TEST(DayTest, WhatIsSeenAndHeldOnBatteryIsCountedOnce) {
     writer.take({Kind::kOver, 50 * kSecond});
     const day::Profile profile = profileOf(writer.end());
     EXPECT_EQ(profile.covered, 90 * kSecond) << "40 and 60 but for the gap";
-    EXPECT_EQ(profile.displayOff, 25 * kSecond) << "the second process was told nothing";
+    EXPECT_EQ(profile.display.off(), 25 * kSecond) << "the second process was told nothing";
     std::string rows;
     for (const auto& [key, row] : profile.rows) {
-        rows += key.first + ' ' + (key.second ? std::to_string(*key.second) : "none") + ' ' +
-                row.sensor + ' ' + std::to_string(row.heldOnBattery / 1'000'000) + '\n';
+        rows += std::to_string(key.uid.value_or(0)) + ' ' +
+                (key.type ? std::to_string(*key.type) : "none") + ' ' + row.sensor + ' ' +
+                std::to_string(row.heldOnBattery / 1'000'000) + '\n';
     }
-    EXPECT_EQ(rows, "uid 5 none GPS 3\nuid 5 0  2\nuid 5 1 A 1\n");
+    EXPECT_EQ(rows, "5 none GPS 3\n5 0  2\n5 1 A 1\n");
 }
 
 TEST(DayTest, APayloadIsTakenApartWhateverItsNamesHold) {

@@ -73,6 +73,13 @@ struct Band {
 
 /** Something at a moment. */
 struct Mark {
+    enum class Kind {
+        kReport,  // telemetry
+        kAhead,   // telemetry that comes if nothing changes
+        kTaken,   // the moment of the capture
+    };
+
+    Kind kind;
     int64_t at;
     std::string text;
 };
@@ -82,13 +89,10 @@ struct Day {
     std::string name;
     Band display;
     Band charge;
-    std::vector<Span> unseen;   // uses are not known here
-    std::vector<Mark> reports;  // telemetry
-    std::vector<Mark> ahead;    // telemetry that comes if nothing changes
-    std::optional<Mark> taken;  // the moment of the capture
-    std::vector<Lane> lanes;    // lane N is row N of `uses`
+    std::vector<Span> unseen;  // uses are not known here
+    std::vector<Mark> marks;
+    std::vector<Lane> lanes;  // lane N is row N of `uses`
     std::optional<Table> uses;
-    std::vector<std::string> lines;  // below the table
 };
 
 /** One input: a trace, a capture, or several merged ones. */

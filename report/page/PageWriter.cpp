@@ -135,7 +135,6 @@ private:
             mHtml += "<section class=\"day\">\n" + element("h3", day.name);
             if (hours.from < hours.to) mHtml += drawDay(day, hours);
             if (day.uses) addTable(*day.uses);
-            for (const std::string& line : day.lines) mHtml += element("p", line);
             mHtml += "</section>\n";
         }
     }
