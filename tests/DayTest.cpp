@@ -8,6 +8,7 @@
 #include "day/Journal.h"
 #include "day/Profile.h"
 #include "day/Samples.h"
+#include "report/Compare.h"
 #include "report/EventText.h"
 
 namespace {
@@ -270,6 +271,22 @@ TEST(DayTest, WhatIsSeenAndHeldOnBatteryIsCountedOnce) {
                 std::to_string(row.heldOnBattery / 1'000'000) + '\n';
     }
     EXPECT_EQ(rows, "5 none GPS 3\n5 0  2\n5 1 A 1\n");
+}
+
+TEST(DayTest, WhatIsRoundedAwayInAComparisonHasNoSignAndNoRange) {
+    const auto heldFor = [](int64_t seconds) {
+        return gather({note(0, R"({"capture": {"knownTo": 36000000}})"), on(0, "a"),
+                       off(seconds, "a"), at(36'000, Kind::kTick)});
+    };
+    for (const auto& [seconds, size] :
+         {std::pair(24, "0:00:00"), {26, "+0:00:01"}, {16, "0:00:00"}, {14, "-0:00:01"}}) {
+        report::ComparedSides sides(2);
+        for (const int64_t each : {19, 21, seconds}) sides.add(heldFor(each));
+        const report::Section compared = *sides.layOut(1);
+        const auto& row = compared.parts.at(0).tables.at(0).table.rows().at(0);
+        EXPECT_EQ(row, (std::vector<std::string>{"a", "accelerometer", "0:00:02", row[3], size,
+                                                 "hour", row[6]}));
+    }
 }
 
 TEST(DayTest, APayloadIsTakenApartWhateverItsNamesHold) {
