@@ -24,9 +24,10 @@ std::string nameSensorOf(const trace::ChargeRow& row, const day::Notes& notes) {
 }
 
 std::string describeRow(const trace::ChargeRow& row) {
-    std::string before = row.count == 0 ? "on since before the last charge" : "";
-    if (!row.shared) return before;
-    return before.empty() ? "shared" : "shared, " + before;
+    std::vector<std::string> texts;
+    if (row.shared) texts.emplace_back("shared");
+    if (row.count == 0) texts.emplace_back("on since before the last charge");
+    return join(texts);
 }
 
 std::string describeCoverage(const day::Journal& journal, size_t capture) {

@@ -126,13 +126,11 @@ Table differenceTable(size_t limit) {
 }
 
 void addRow(const Difference& difference, Table* table) {
-    std::string why;
-    for (const day::Change& change : difference.changes) {
-        why.append(why.empty() ? "" : ", ").append(textOf(change));
-    }
+    std::vector<std::string> why;
+    for (const day::Change& change : difference.changes) why.emplace_back(textOf(change));
     table->add({appOf(difference), sensorOf(difference), formatSpread(difference.before),
                 formatSpread(difference.after), formatSize(difference),
-                std::string(wordsOf(difference.per).title), why});
+                std::string(wordsOf(difference.per).title), join(why)});
 }
 
 Table differencesOf(const day::Comparison& comparison, ChangeState state, size_t limit) {

@@ -168,11 +168,9 @@ std::string showPlain(const Field& field) {
     if (!code.empty()) return field.text + ", " + std::string(code);
     if (field.key == "pkg") return safe(shortenApp(field.text));
     if (field.entries.empty()) return safe(show(kindOf(field.key), field.text));
-    std::string text;
-    for (const auto& [key, value] : field.entries[0]) {
-        text += (text.empty() ? "" : ", ") + key + ' ' + safe(value);
-    }
-    return text;
+    std::vector<std::string> texts;
+    for (const auto& [key, value] : field.entries[0]) texts.push_back(key + ' ' + safe(value));
+    return join(texts);
 }
 
 }  // namespace

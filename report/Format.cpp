@@ -40,6 +40,15 @@ std::string onOneLine(std::string_view text) {
     return result;
 }
 
+std::string join(const std::vector<std::string>& texts, std::string_view between) {
+    std::string joined;
+    for (const std::string& text : texts) {
+        if (&text != texts.data()) joined += between;
+        joined += text;
+    }
+    return joined;
+}
+
 char levelLetter(int64_t level) {
     constexpr std::string_view kLetters = "??VDIWEFS";
     return level >= 0 && static_cast<size_t>(level) < kLetters.size() ? kLetters[level] : '?';

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace report {
 
@@ -20,6 +21,9 @@ std::string formatClock(int64_t ns);
  * which might move the terminal's cursor, a "?".
  */
 std::string onOneLine(std::string_view text);
+
+/** The texts one behind another, with `between` between two. */
+std::string join(const std::vector<std::string>& texts, std::string_view between = ", ");
 
 /** The letter by which logs show a level; "?" for an unknown one. */
 char levelLetter(int64_t level);

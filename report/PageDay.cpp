@@ -172,9 +172,9 @@ private:
         if (part.span.from >= part.span.to && use.from != use.to) return {};
         part.isBefore = use.before && use.from >= mMidnight;
         const bool isEnd = use.to <= mMidnight + base::kNsPerDay;
-        if (use.end == day::End::kUnseen) part.end = page::Use::End::kUnseen;
-        if (isEnd && use.end == day::End::kOn) part.end = page::Use::End::kOn;
-        if (isContinuous(use)) part.rate = day::rateOf(use);
+        part.isUnseen = use.end == day::End::kUnseen;
+        part.isOn = isEnd && use.end == day::End::kOn;
+        if (isContinuous(use)) part.rate = rateOf(use, use.periodNs);
         for (const day::Enable& enable : use.enables) {
             if (enable.at / base::kNsPerDay != mDay.number) continue;
             part.enables.push_back(enable.at - mMidnight);

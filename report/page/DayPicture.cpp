@@ -38,8 +38,7 @@ BandLane bandLane(const char* name, const char* style, const char* on, const Ban
 std::vector<Slice> slicesOf(const Lane& lane) {
     std::vector<Slice> slices;
     for (const Use& use : lane.uses) {
-        const bool isOn = use.end == Use::End::kOn;
-        slices.push_back({use.span, styleOf(use), use.facts, use.isBefore, isOn});
+        slices.push_back({use.span, styleOf(use), use.facts, use.isBefore, use.isOn});
     }
     return slices;
 }
@@ -206,8 +205,8 @@ private:
 std::string styleOf(const Use& use) {
     std::string style = "slice";
     if (use.isBefore) style += " before";
-    if (use.end == Use::End::kUnseen) style += " unseen";
-    if (use.end == Use::End::kOn) style += " on";
+    if (use.isUnseen) style += " unseen";
+    if (use.isOn) style += " on";
     return style;
 }
 

@@ -44,16 +44,11 @@ struct Table {
 
 /** The part of a use of a sensor that lies within a day. */
 struct Use {
-    enum class End {
-        kSeen,    // it ended, or it goes on in the next day
-        kUnseen,  // it ended at `span.to` at the latest, or perhaps in the next day
-        kOn,      // it was on when the capture was taken, or when the trace ended
-    };
-
     Span span;
-    bool isBefore = false;  // it began before `span.from`, unseen
-    End end = End::kSeen;
-    std::optional<double> rate;    // samples a second that it costs; nothing: unknown
+    bool isBefore = false;       // it began before `span.from`, unseen
+    bool isUnseen = false;       // it ended at `span.to` at the latest, or perhaps in the next day
+    bool isOn = false;           // it was on when the capture was taken, or when the trace ended
+    std::optional<double> rate;  // samples a second that it costs; nothing: unknown
     std::vector<int64_t> enables;  // of this day
     std::string facts;             // all of the use, in words, but the app and the sensor
 };
