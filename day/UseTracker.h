@@ -31,8 +31,8 @@ private:
 
 /**
  * Follows the records of an input: who holds which sensor, what notes tell, and when the display is
- * on. Counting is a person's: a disable of what is not on means nothing. After what is known has
- * ended, nothing is held.
+ * on. It counts enables as a person would, and not as the library does: a disable of what is not on
+ * means nothing. After what is known has ended, nothing is held.
  */
 class UseTracker {
 public:
