@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <limits>
 #include <set>
 #include <tuple>
@@ -39,7 +40,7 @@ std::optional<Spread> spreadOf(const Side& side, const ProfileKey& key, Per per)
     for (const Profile& profile : side) {
         const int64_t coverage = profile.coverage(per);
         if (coverage <= 0 || (wantsEnough && !isCovered(profile, per))) continue;
-        values.push_back(static_cast<double>(heldPer(rowOf(profile, key), per)) /
+        values.push_back(static_cast<double>(rowOf(profile, key).heldPer(per)) /
                          static_cast<double>(coverage) * kSecondsPerHour);
     }
     if (values.empty()) return std::nullopt;
@@ -60,9 +61,7 @@ SideSum sumOf(const Side& side, const ProfileKey& key) {
     SideSum sum;
     for (const Profile& profile : side) {
         sum.covered += static_cast<double>(profile.covered);
-        if (const auto found = profile.rows.find(key); found != profile.rows.end()) {
-            add(found->second, &sum.row);
-        }
+        sum.row.add(rowOf(profile, key));
     }
     return sum;
 }
@@ -108,9 +107,9 @@ std::vector<Change> changesOf(const SideSum& before, const SideSum& after, Per p
          ratio(static_cast<double>(b.enables), after.covered));
     if (a.periodNs && b.periodNs) look(Factor::kRate, rateOf(a), rateOf(b));
     if (a.batchUs && b.batchUs) look(Factor::kBatching, unbatchedness(a), unbatchedness(b));
-    if (a.displayKnown > 0 && b.displayKnown > 0) {
-        look(Factor::kDisplayOff, ratio(a.heldOff, a.displayKnown),
-             ratio(b.heldOff, b.displayKnown));
+    if (a.display.known > 0 && b.display.known > 0) {
+        look(Factor::kDisplayOff, ratio(a.display.off(), a.display.known),
+             ratio(b.display.off(), b.display.known));
     }
     return changes;
 }
@@ -125,7 +124,7 @@ std::optional<Difference> differenceOf(const Side& before, const Side& after, co
     const SideSum sumBefore = sumOf(before, key);
     const SideSum sumAfter = sumOf(after, key);
     ProfileRow both = sumBefore.row;
-    add(sumAfter.row, &both);
+    both.add(sumAfter.row);
     Difference result{key, both.sensor, per, ChangeState::kChanged, {}, {}, 0, {}};
     result.before = spreadOf(before, key, per);
     result.after = spreadOf(after, key, per);
@@ -172,39 +171,41 @@ auto identityOf(const trace::Sensor& sensor) {
     return std::tie(sensor.mode, sensor.wakeUp, sensor.minRate, sensor.maxRate);
 }
 
-std::vector<SensorDifference> compareSensors(const Profile& before, const Profile& after) {
-    using Key = std::pair<std::string, int32_t>;
-    std::map<Key, SensorDifference> sensors;
-    for (const trace::Sensor& sensor : before.sensors) {
-        auto& each = sensors[{sensor.name, sensor.type}];
-        if (!each.before) each.before = sensor;
-    }
-    for (const trace::Sensor& sensor : after.sensors) {
-        auto& each = sensors[{sensor.name, sensor.type}];
-        if (!each.after) each.after = sensor;
-    }
-    std::vector<SensorDifference> differences;
-    // Where one side has no list at all, nothing is known of its sensors.
-    if (before.sensors.empty() || after.sensors.empty()) return differences;
-    for (auto& [key, each] : sensors) {
-        const bool isSame =
-                each.before && each.after && identityOf(*each.before) == identityOf(*each.after);
-        if (!isSame) differences.push_back(std::move(each));
-    }
-    return differences;
+bool isSame(const trace::Sensor& a, const trace::Sensor& b) {
+    return identityOf(a) == identityOf(b);
 }
 
-std::vector<PropertyDifference> compareProperties(const Profile& before, const Profile& after) {
-    std::map<std::string, PropertyDifference> properties;
-    for (const auto& [name, value] : before.properties) properties[name].before = value;
-    for (const auto& [name, value] : after.properties) properties[name].after = value;
-    std::vector<PropertyDifference> differences;
-    for (auto& [name, each] : properties) {
-        if (each.before == each.after) continue;
-        each.name = name;
-        differences.push_back(std::move(each));
+bool isSame(const std::string& a, const std::string& b) {
+    return a == b;
+}
+
+template <typename Key, typename Value>
+void leaveOutSame(std::map<Key, Sides<Value>>* all) {
+    for (auto each = all->begin(); each != all->end();) {
+        const auto& [before, after] = each->second;
+        each = before && after && isSame(*before, *after) ? all->erase(each) : std::next(each);
     }
-    return differences;
+}
+
+void compareSensors(const Profile& before, const Profile& after, Comparison* result) {
+    // Where one side has no list at all, nothing is known of its sensors.
+    if (before.sensors.empty() || after.sensors.empty()) return;
+    // Of several that share name and type the first counts.
+    for (const trace::Sensor& sensor : before.sensors) {
+        auto& old = result->sensors[{sensor.name, sensor.type}].before;
+        if (!old) old = sensor;
+    }
+    for (const trace::Sensor& sensor : after.sensors) {
+        auto& now = result->sensors[{sensor.name, sensor.type}].after;
+        if (!now) now = sensor;
+    }
+    leaveOutSame(&result->sensors);
+}
+
+void compareProperties(const Profile& before, const Profile& after, Comparison* result) {
+    for (const auto& [name, value] : before.properties) result->properties[name].before = value;
+    for (const auto& [name, value] : after.properties) result->properties[name].after = value;
+    leaveOutSame(&result->properties);
 }
 
 }  // namespace
@@ -227,8 +228,8 @@ Comparison compare(const Side& before, const Side& after) {
                      [](const Difference& a, const Difference& b) {
                          return std::fabs(a.size) > std::fabs(b.size);
                      });
-    result.sensors = compareSensors(before.back(), after.back());
-    result.properties = compareProperties(before.back(), after.back());
+    compareSensors(before.back(), after.back(), &result);
+    compareProperties(before.back(), after.back(), &result);
     return result;
 }
 

@@ -2,8 +2,11 @@
 
 #include <array>
 #include <cstddef>
+#include <cstdint>
+#include <map>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "base/Calendar.h"
@@ -53,26 +56,22 @@ struct Difference {
     std::vector<Change> changes;
 };
 
-/** A sensor that only one side has, or that is not the same on both. */
-struct SensorDifference {
-    std::optional<trace::Sensor> before;
-    std::optional<trace::Sensor> after;
-};
-
-struct PropertyDifference {
-    std::string name;
-    std::optional<std::string> before;
-    std::optional<std::string> after;
+/** What two sides have of something. */
+template <typename Value>
+struct Sides {
+    std::optional<Value> before;
+    std::optional<Value> after;
 };
 
 /** Two sides, held against each other: of equal ones nothing is left. */
 struct Comparison {
-    std::vector<Difference> differences;         // the largest first
-    std::vector<SensorDifference> sensors;       // of the last input of each side,
-    std::vector<PropertyDifference> properties;  // by name
-    std::array<bool, kPers> isCovered{};         // by Per: on both sides
+    std::vector<Difference> differences;  // the largest first
 
-    bool isEmpty() const { return differences.empty() && sensors.empty() && properties.empty(); }
+    // Of the last input of each side.
+    std::map<std::pair<std::string, int32_t>, Sides<trace::Sensor>> sensors;  // by name and type
+    std::map<std::string, Sides<std::string>> properties;
+
+    std::array<bool, kPers> isCovered{};  // by Per: on both sides
 };
 
 /** Less than this on a side is not enough to call a difference a change, ns. */

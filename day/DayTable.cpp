@@ -37,14 +37,10 @@ void DayTable::add(const Use& use, const UseTracker& tracker) {
             row.samples =
                     row.samples && samples ? std::optional(*row.samples + *samples) : std::nullopt;
         }
-        row.held += span.to - span.from;
-        row.display.add(tracker.displayIn(span));
-        row.enables += std::count_if(
+        const auto enables = std::count_if(
                 use.enables.begin(), use.enables.end(),
                 [number](const Enable& enable) { return enable.at / base::kNsPerDay == number; });
-        if (use.periodNs)
-            row.periodNs = std::min(row.periodNs.value_or(*use.periodNs), *use.periodNs);
-        row.batchUs = shorterBatch(row.batchUs, use.batchUs);
+        row.add({span.to - span.from, tracker.displayIn(span), enables, use.periodNs, use.batchUs});
         row.isBefore = row.isBefore || (use.before && isFirst);
         row.isUnseen = row.isUnseen || use.end == End::kUnseen;
         row.state = use.end == End::kOn || !isLast ? DayRow::State::kOn

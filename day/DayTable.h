@@ -20,8 +20,8 @@ struct Day {
     }
 };
 
-/** How a client used a sensor on one day; times are nanoseconds. */
-struct DayRow {
+/** How a client used a sensor on one day. */
+struct DayRow : Total {
     enum class State {
         kOff,
         kOn,     // when the day, or what is known, ended
@@ -29,15 +29,10 @@ struct DayRow {
     };
 
     Holder holder;
-    int64_t held = 0;
-    DisplayTime display;  // within `held`
-    int64_t enables = 0;
-    std::optional<int64_t> periodNs;  // the shortest; nothing if all are guesses
-    std::optional<int64_t> batchUs;   // the shortest
-    std::optional<double> samples;    // of a continuous sensor; nothing if a rate is not known
-    bool isBefore = false;            // a use began earlier than what is seen
-    bool isUnseen = false;            // the end of a use was not seen: it was held shorter
-    State state = State::kOff;        // of the last use
+    std::optional<double> samples;  // of a continuous sensor; nothing if a rate is not known
+    bool isBefore = false;          // a use began earlier than what is seen
+    bool isUnseen = false;          // the end of a use was not seen: it was held shorter
+    State state = State::kOff;      // of the last use
 };
 
 /** Who used which sensor, day by day. */

@@ -14,7 +14,10 @@ namespace day {
 
 /** What the notes of a trace tell of a device, up to a boot of it that sets the clock back. */
 struct Notes {
-    /** A note at `at`, ns. Of what is told again the last counts. */
+    /**
+     * Takes a note at `at`, ns. It replaces what earlier notes have told of the same, but its gaps
+     * and losses come on top of theirs.
+     */
     void take(const trace::Note& note, int64_t at);
 
     /** The clock is set back: only the sensors and packages are still the device's. */

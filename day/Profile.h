@@ -4,7 +4,7 @@
 #include <map>
 #include <optional>
 #include <string>
-#include <utility>
+#include <tuple>
 #include <vector>
 
 #include "day/Journal.h"
@@ -21,32 +21,40 @@ enum class Per {
 inline constexpr size_t kPers = 3;
 
 /** An app's uses of the sensors of one type in one input. Times are nanoseconds. */
-struct ProfileRow {
+struct ProfileRow : Total {
     std::string sensor;  // a name of it; empty if none is known
-    int64_t held = 0;
-    int64_t displayKnown = 0;  // of `held`
-    int64_t heldOff = 0;       // of `displayKnown`, with the display off
     int64_t uses = 0;
-    int64_t enables = 0;
-    std::optional<int64_t> periodNs;  // the shortest
-    std::optional<int64_t> batchUs;   // the shortest; the longest possible is -1
-    int64_t heldOnBattery = 0;        // since the last charge
-    int64_t background = 0;           // of `heldOnBattery`
+    int64_t heldOnBattery = 0;  // since the last charge
+    int64_t background = 0;     // of `heldOnBattery`
+
+    /** Adds another row of the same key. */
+    void add(const ProfileRow& more);
+
+    /** How long it was held in what `per` divides by, ns. */
+    int64_t heldPer(Per per) const;
 };
 
-/**
- * An app, by its first package where that is known, else by its clients' tag without what changes
- * from build to build ("$1" at its end); and a type of sensor: none for GPS, 0 if it is not known.
- */
-using ProfileKey = std::pair<std::string, std::optional<int32_t>>;
+/** An app and a type of sensor, by what stays the same from one input to another. */
+struct ProfileKey {
+    /**
+     * The app: its first package where that is known, else its clients' tag without what changes
+     * from build to build ("$1" at its end).
+     */
+    std::string app;
+    std::optional<int32_t> uid;   // instead of `app`, where nothing names it
+    std::optional<int32_t> type;  // of the sensor: none for GPS, 0 if it is not known
+
+    bool operator<(const ProfileKey& other) const {
+        return std::tie(app, uid, type) < std::tie(other.app, other.uid, other.type);
+    }
+};
 
 /** What one input says of each app, made to be compared with another one. */
 struct Profile {
-    std::string name;          // of the input
-    int64_t covered = 0;       // ns: seen, without gaps
-    int64_t displayKnown = 0;  // of `covered`
-    int64_t displayOff = 0;    // of `displayKnown`
-    int64_t onBattery = 0;     // ns, of the battery statistics
+    std::string name;       // of the input
+    int64_t covered = 0;    // ns: seen, without gaps
+    DisplayTime display;    // within `covered`
+    int64_t onBattery = 0;  // ns, of the battery statistics
     std::map<ProfileKey, ProfileRow> rows;
     std::vector<trace::Sensor> sensors;
     std::map<std::string, std::string> properties;
@@ -54,12 +62,6 @@ struct Profile {
     /** How long is covered for `per`, ns. */
     int64_t coverage(Per per) const;
 };
-
-/** Adds another row of the same key. */
-void add(const ProfileRow& other, ProfileRow* row);
-
-/** How long a row was held in what `per` divides by, ns. */
-int64_t heldPer(const ProfileRow& row, Per per);
 
 Profile profileOf(const Journal& journal);
 

@@ -20,26 +20,15 @@ inline bool isContinuous(const Holder& holder) {
     return trace::isContinuousType(holder.type);
 }
 
-/** The most samples that the sensor takes, in Hz; nothing if that is not known. */
-inline std::optional<double> highestRate(const Holder& holder) {
-    if (!holder.maxRate || !(*holder.maxRate > 0)) return {};
-    return static_cast<double>(*holder.maxRate);
-}
-
 /**
  * The rate, in Hz, at which the sensor takes samples for `holder`: as it was asked for, but no more
  * than the sensor can, which is also what a period of 0 asks for. Nothing if that is not known, or
  * if there is none: a one-shot sensor has no rate.
  */
 inline std::optional<double> rateOf(const Holder& holder, std::optional<int64_t> periodNs) {
-    const auto most = highestRate(holder);
-    if (holder.mode == trace::SensorMode::kOneShot || !most || !periodNs) return {};
-    if (*periodNs <= 0) return most;
-    return std::min(1e9 / static_cast<double>(*periodNs), *most);
-}
-
-inline std::optional<double> rateOf(const Use& use) {
-    return rateOf(use, use.periodNs);
+    const double most = holder.maxRate.value_or(0);
+    if (holder.mode == trace::SensorMode::kOneShot || !(most > 0) || !periodNs) return {};
+    return *periodNs <= 0 ? most : std::min(1e9 / static_cast<double>(*periodNs), most);
 }
 
 /**
@@ -47,7 +36,7 @@ inline std::optional<double> rateOf(const Use& use) {
  * or if the sensor does not take samples all the time.
  */
 inline std::optional<double> samplesOf(const Use& use, int64_t timeNs) {
-    const auto rate = rateOf(use);
+    const auto rate = rateOf(use, use.periodNs);
     if (!rate || !isContinuous(use)) return {};
     return *rate * static_cast<double>(timeNs) / 1e9;
 }

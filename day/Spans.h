@@ -13,7 +13,7 @@ struct Span {
     int64_t to = 0;
 };
 
-/** A time of a note, which may be any number of ms, as the clock has it, ns. */
+/** Milliseconds of a note in ns. A note may say any number: it is kept to what a clock can have. */
 int64_t toClock(int64_t ms);
 
 // Spans in a vector stand in order and apart from each other.

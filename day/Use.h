@@ -65,6 +65,17 @@ struct Use : Holder {
 
 inline constexpr int64_t kAsLongAsPossible = -1;  // a batching period
 
+/** What uses come to together; times are nanoseconds. */
+struct Total {
+    int64_t held = 0;
+    DisplayTime display;  // within `held`
+    int64_t enables = 0;
+    std::optional<int64_t> periodNs;  // the shortest; nothing if all are guesses
+    std::optional<int64_t> batchUs;   // the shortest
+
+    void add(const Total& more);
+};
+
 /** The shorter of two batching periods, of which one may not be known. */
 std::optional<int64_t> shorterBatch(std::optional<int64_t> a, std::optional<int64_t> b);
 
@@ -75,8 +86,5 @@ HolderKey keyOf(const Holder& holder);
 
 /** The client as the library's reports name it: "pkg", or "pkg/opPkg" if they differ. */
 std::string appOf(const Holder& holder);
-
-/** The order in which uses that end at one moment are told. */
-bool isToldBefore(const Use& a, const Use& b);
 
 }  // namespace day

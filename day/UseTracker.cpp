@@ -31,13 +31,28 @@ std::optional<int64_t> shorterBatch(std::optional<int64_t> a, std::optional<int6
     return std::min(*a, *b);
 }
 
+void Total::add(const Total& more) {
+    held += more.held;
+    display.add(more.display);
+    enables += more.enables;
+    if (more.periodNs) periodNs = std::min(periodNs.value_or(*more.periodNs), *more.periodNs);
+    batchUs = shorterBatch(batchUs, more.batchUs);
+}
+
 HolderKey keyOf(const Holder& holder) {
     if (holder.handle) return {holder.handle, 0, holder.uid, holder.pkg, ""};
     return {std::nullopt, holder.type, std::nullopt, holder.pkg, holder.opPkg};
 }
 
-bool isToldBefore(const Use& a, const Use& b) {
-    return std::tie(a.to, a.from, a.handle, a.pkg) < std::tie(b.to, b.from, b.handle, b.pkg);
+std::vector<Use> EndedUses::take(int64_t before) {
+    std::sort(mUses.begin(), mUses.end(), [](const Use& a, const Use& b) {
+        return std::tie(a.to, a.from, a.handle, a.pkg) < std::tie(b.to, b.from, b.handle, b.pkg);
+    });
+    const auto end = std::find_if(mUses.begin(), mUses.end(),
+                                  [before](const Use& use) { return use.to >= before; });
+    std::vector<Use> ended(mUses.begin(), end);
+    mUses.erase(mUses.begin(), end);
+    return ended;
 }
 
 void UseTracker::begin() {

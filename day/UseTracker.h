@@ -2,10 +2,12 @@
 
 #include <cstdint>
 #include <functional>
+#include <limits>
 #include <map>
 #include <optional>
 #include <string>
 #include <tuple>
+#include <vector>
 
 #include "day/Notes.h"
 #include "day/Use.h"
@@ -13,10 +15,24 @@
 
 namespace day {
 
+/** Uses that have ended and are not told yet: those of one moment are told together, in order. */
+class EndedUses {
+public:
+    static constexpr int64_t kAll = std::numeric_limits<int64_t>::max();
+
+    void add(const Use& use) { mUses.push_back(use); }
+
+    /** Takes those that ended before `before`. */
+    std::vector<Use> take(int64_t before);
+
+private:
+    std::vector<Use> mUses;
+};
+
 /**
  * Follows the records of an input: who holds which sensor, what notes tell, and when the display is
- * on. Counting is a person's: a disable of what is not on means nothing. After what is known has
- * ended, nothing is held.
+ * on. It counts enables as a person would, and not as the library does: a disable of what is not on
+ * means nothing. After what is known has ended, nothing is held.
  */
 class UseTracker {
 public:

@@ -1,6 +1,7 @@
 #include "report/CaptureFacts.h"
 
 #include "base/Calendar.h"
+#include "report/Format.h"
 #include "report/Text.h"
 
 namespace report {
@@ -13,12 +14,11 @@ std::string formatMomentMs(int64_t ms, const day::Notes& notes) {
 
 std::string describeKnown(const char* what, const std::vector<trace::Interval>& known,
                           const day::Notes& notes) {
-    std::string spans;
+    std::vector<std::string> spans;
     for (const trace::Interval& each : known) {
-        spans += (spans.empty() ? "known from " : ", ") + formatMomentMs(each.from, notes) +
-                 " to " + formatMomentMs(each.to, notes);
+        spans.push_back(formatMomentMs(each.from, notes) + " to " + formatMomentMs(each.to, notes));
     }
-    return std::string(what) + ' ' + (spans.empty() ? "unknown" : spans);
+    return std::string(what) + (spans.empty() ? " unknown" : " known from " + join(spans));
 }
 
 void describe(const day::Notes& notes, std::vector<std::string>* lines) {
@@ -37,7 +37,7 @@ void describe(const day::Notes& notes, std::vector<std::string>* lines) {
 
 std::string formatMoment(int64_t ns, const day::Notes& notes) {
     const int64_t day = ns / base::kNsPerDay;
-    const std::string time = base::formatTimeOfDay(std::chrono::nanoseconds(ns));
+    const std::string time = formatTimeOfDay(ns);
     if (notes.firstDay) return base::formatDate(*notes.firstDay + day) + ' ' + time;
     return "day " + std::to_string(day + 1) + ' ' + time;
 }
@@ -72,8 +72,7 @@ std::string nameDay(const day::Journal& journal, const day::Day& day) {
 }
 
 std::string describePlayed(const day::Journal& journal) {
-    return count(journal.boots.size(), "boot") + ", " +
-           base::formatDuration(std::chrono::nanoseconds(journal.played())) +
+    return count(journal.boots.size(), "boot") + ", " + formatDuration(journal.played()) +
            " of the device's time";
 }
 

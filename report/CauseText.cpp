@@ -2,7 +2,7 @@
 #include <set>
 #include <string>
 
-#include "report/AppNames.h"
+#include "report/Names.h"
 #include "report/Sections.h"
 #include "report/Text.h"
 

@@ -3,9 +3,9 @@
 #include <vector>
 
 #include "base/Calendar.h"
-#include "report/AppNames.h"
+#include "report/Format.h"
+#include "report/Names.h"
 #include "report/Sections.h"
-#include "report/SensorNames.h"
 
 namespace report {
 
@@ -24,17 +24,17 @@ std::string nameSensorOf(const trace::ChargeRow& row, const day::Notes& notes) {
 }
 
 std::string describeRow(const trace::ChargeRow& row) {
-    std::string before = row.count == 0 ? "on since before the last charge" : "";
-    if (!row.shared) return before;
-    return before.empty() ? "shared" : "shared, " + before;
+    std::vector<std::string> texts;
+    if (row.shared) texts.emplace_back("shared");
+    if (row.count == 0) texts.emplace_back("on since before the last charge");
+    return join(texts);
 }
 
 std::string describeCoverage(const day::Journal& journal, size_t capture) {
     const auto& charge = *journal.captures[capture].taken->sinceCharge;
     const day::BatteryCoverage coverage = journal.batteryCoverage(capture);
     std::string text = std::string("The registrations cover ") +
-                       (coverage.isUpperBound ? "at most " : "") +
-                       base::formatDuration(std::chrono::nanoseconds(coverage.seen));
+                       (coverage.isUpperBound ? "at most " : "") + formatDuration(coverage.seen);
     if (!charge.onBatteryMs) return text + " of the time on battery.";
     return text + " of the " +
            base::formatDuration(std::chrono::milliseconds(*charge.onBatteryMs)) + " on battery.";

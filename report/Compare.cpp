@@ -1,12 +1,13 @@
 #include "report/Compare.h"
 
-#include <chrono>
 #include <cmath>
+#include <cstdlib>
 #include <utility>
 
 #include "base/Calendar.h"
 #include "base/Json.h"
-#include "report/SensorNames.h"
+#include "report/Format.h"
+#include "report/Names.h"
 #include "report/Text.h"
 
 namespace report {
@@ -65,27 +66,35 @@ std::string_view textOf(const day::Change& change) {
     return change.isMore ? words.more : words.less;
 }
 
-std::string formatSeconds(double seconds) {
-    return base::formatDuration(std::chrono::seconds(std::llround(seconds)));
+/** Seconds in an hour, rounded, with a sign if they are a difference and not rounded to none. */
+std::string formatSeconds(double seconds, bool isDifference = false) {
+    const int64_t rounded = std::llround(seconds);
+    const char* const sign = !isDifference || rounded == 0 ? "" : rounded < 0 ? "-" : "+";
+    return sign + formatDuration(std::abs(rounded) * base::kNsPerSecond);
 }
 
 std::string formatSpread(const std::optional<Spread>& spread) {
     if (!spread) return "?";
-    std::string text = formatSeconds(spread->median);
-    if (spread->smallest == spread->largest) return text;
-    return text + " (" + formatSeconds(spread->smallest) + " to " + formatSeconds(spread->largest) +
-           ')';
+    const std::string smallest = formatSeconds(spread->smallest);
+    const std::string largest = formatSeconds(spread->largest);
+    const std::string range = smallest == largest ? "" : " (" + smallest + " to " + largest + ')';
+    return formatSeconds(spread->median) + range;
 }
 
 std::string formatSize(const Difference& difference) {
     if (difference.state == ChangeState::kNotCovered) return "?";
-    return (difference.size < 0 ? "-" : "+") + formatSeconds(std::fabs(difference.size));
+    return formatSeconds(difference.size, true);
 }
 
-std::string nameOf(const Difference& difference) {
-    if (!difference.key.second) return difference.sensor;  // GPS
-    const bool isKnown = *difference.key.second != 0 || !difference.sensor.empty();
-    return isKnown ? nameSensor(*difference.key.second, difference.sensor) : "unknown sensor";
+std::string appOf(const Difference& difference) {
+    return difference.key.uid ? nameUid(*difference.key.uid, {}) : difference.key.app;
+}
+
+std::string sensorOf(const Difference& difference) {
+    const auto& type = difference.key.type;
+    if (!type) return difference.sensor;  // GPS
+    const bool isKnown = *type != 0 || !difference.sensor.empty();
+    return isKnown ? nameSensor(*type, difference.sensor) : "unknown sensor";
 }
 
 std::string describeSide(const char* what, const std::vector<Profile>& side) {
@@ -96,15 +105,13 @@ std::string describeSide(const char* what, const std::vector<Profile>& side) {
     int64_t onBattery = 0;
     for (const Profile& profile : side) {
         covered += profile.covered;
-        known += profile.displayKnown;
+        known += profile.display.known;
         onBattery += profile.onBattery;
     }
-    const auto format = [](int64_t ns) {
-        return base::formatDuration(std::chrono::nanoseconds(ns));
-    };
-    return text + ": " + format(covered) + " seen, " +
-           (known > 0 ? "display known for " + format(known) : "display not known") + ", " +
-           (onBattery > 0 ? "battery statistics of " + format(onBattery) : "no battery statistics");
+    return text + ": " + formatDuration(covered) + " seen, " +
+           (known > 0 ? "display known for " + formatDuration(known) : "display not known") + ", " +
+           (onBattery > 0 ? "battery statistics of " + formatDuration(onBattery)
+                          : "no battery statistics");
 }
 
 Table differenceTable(size_t limit) {
@@ -119,13 +126,11 @@ Table differenceTable(size_t limit) {
 }
 
 void addRow(const Difference& difference, Table* table) {
-    std::string why;
-    for (const day::Change& change : difference.changes) {
-        why.append(why.empty() ? "" : ", ").append(textOf(change));
-    }
-    table->add({difference.key.first, nameOf(difference), formatSpread(difference.before),
+    std::vector<std::string> why;
+    for (const day::Change& change : difference.changes) why.emplace_back(textOf(change));
+    table->add({appOf(difference), sensorOf(difference), formatSpread(difference.before),
                 formatSpread(difference.after), formatSize(difference),
-                std::string(wordsOf(difference.per).title), why});
+                std::string(wordsOf(difference.per).title), join(why)});
 }
 
 Table differencesOf(const day::Comparison& comparison, ChangeState state, size_t limit) {
@@ -151,17 +156,17 @@ std::string describe(const std::optional<trace::Sensor>& sensor) {
 
 Table sensorTable(const day::Comparison& comparison, size_t limit) {
     Table table({{"Sensor", Table::Column::kCut}, {"Old"}, {"New"}}, limit);
-    for (const auto& [before, after] : comparison.sensors) {
-        const trace::Sensor& sensor = before ? *before : *after;
-        table.add({nameSensor(sensor.type, sensor.name), describe(before), describe(after)});
+    for (const auto& [sensor, sides] : comparison.sensors) {
+        table.add({nameSensor(sensor.second, sensor.first), describe(sides.before),
+                   describe(sides.after)});
     }
     return table;
 }
 
 Table storedTable(const day::Comparison& comparison, size_t limit) {
     Table table({{"Property", Table::Column::kCut}, {"Old"}, {"New"}}, limit);
-    for (const auto& [name, before, after] : comparison.properties) {
-        table.add({name, before.value_or("not set"), after.value_or("not set")});
+    for (const auto& [name, values] : comparison.properties) {
+        table.add({name, values.before.value_or("not set"), values.after.value_or("not set")});
     }
     return table;
 }
@@ -224,6 +229,7 @@ void CompareSummary::finish() {
 void CompareLines::finish() {
     const auto comparison = sides().compare();
     if (!comparison) return;
+    // Seconds with three decimals, which are written as milliseconds with as many would be.
     const auto rounded = [](double value) {
         return base::Ms{std::llround(value * 1000) * (base::kNsPerMs / 1000)};
     };
@@ -231,17 +237,18 @@ void CompareLines::finish() {
         std::string line;
         base::JsonWriter json(&line);
         json.beginObject().key("compare").beginObject();
-        json.member("app", each.key.first);
-        if (each.key.second) json.member("type", *each.key.second);
+        json.member("app", appOf(each));
+        if (each.key.type) json.member("type", *each.key.type);
         json.member("sensor", each.sensor);
         json.member("per", wordsOf(each.per).key);
         const auto spread = [&](const char* key, const char* range,
                                 const std::optional<Spread>& values) {
             if (!values) return;
             json.member(key, rounded(values->median));
-            if (values->smallest == values->largest) return;
-            json.key(range).beginArray();
-            json.value(rounded(values->smallest)).value(rounded(values->largest)).endArray();
+            const base::Ms smallest = rounded(values->smallest);
+            const base::Ms largest = rounded(values->largest);
+            if (smallest.ns == largest.ns) return;
+            json.key(range).beginArray().value(smallest).value(largest).endArray();
         };
         spread("old", "oldRange", each.before);
         spread("new", "newRange", each.after);

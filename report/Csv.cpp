@@ -8,7 +8,7 @@
 #include "base/FileIo.h"
 #include "base/Json.h"
 #include "day/Samples.h"
-#include "report/SensorNames.h"
+#include "report/Format.h"
 
 namespace report {
 
@@ -126,7 +126,7 @@ void UsesCsv::endInput() {
 }
 
 void UsesCsv::addEnded(int64_t before) {
-    mEnded.tell(before, [this](const day::Use& use) { add(use); });
+    for (const day::Use& use : mEnded.take(before)) add(use);
 }
 
 void UsesCsv::add(const day::Use& use) {
@@ -172,12 +172,10 @@ void SinceChargeCsv::take(const trace::Record& record) {
 void SinceChargeCsv::add(const day::Notes& notes) {
     const trace::SinceCharge& charge = *notes.taken->sinceCharge;
     for (const trace::ChargeRow& each : charge.rows) {
-        std::string packages;
-        const auto& names = notes.packagesOf(each.uid);
-        for (const std::string& name : names) packages += (packages.empty() ? "" : " ") + name;
+        const auto& packages = notes.packagesOf(each.uid);
         base::CsvWriter row(rows());
         row.field(name()).field(takenOf(notes)).field(each.uid);
-        row.field(firstOf(names)).field(packages).field(each.handle);
+        row.field(firstOf(packages)).field(join(packages, " ")).field(each.handle);
         row.field(notes.nameOf(each)).field(each.ms).field(each.count);
         row.field(ifKnown(each.background)).field(flag(each.shared));
         row.field(ifKnown(charge.onBatteryMs));

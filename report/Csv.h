@@ -7,7 +7,6 @@
 #include <vector>
 
 #include "base/OutputFile.h"
-#include "day/EndedUses.h"
 #include "day/UseTracker.h"
 #include "report/Report.h"
 
@@ -15,8 +14,7 @@ namespace report {
 
 /**
  * A table of all inputs in a file, as comma-separated values with a header: docs/output.md lists
- * the columns. What has been gathered of an input is in the file when the input ends, also where
- * processes share the work.
+ * the columns. The rows of an input are in the file when it has ended.
  */
 class Csv : public Report {
 public:

@@ -3,9 +3,9 @@
 #include <cmath>
 #include <cstdio>
 
-#include "base/Calendar.h"
 #include "day/Samples.h"
-#include "report/AppNames.h"
+#include "report/Format.h"
+#include "report/Names.h"
 #include "report/Text.h"
 
 namespace report {
@@ -54,13 +54,12 @@ Table dayTable(const std::vector<day::DayRow>& rows, size_t limit) {
 
 std::string formatHeld(const day::DayRow& row) {
     const char* mark = row.isBefore ? (row.isUnseen ? "~" : "≥") : row.isUnseen ? "≤" : "";
-    return mark + base::formatDuration(std::chrono::nanoseconds(row.held));
+    return mark + formatDuration(row.held);
 }
 
 std::string formatDisplay(const day::DisplayTime& time) {
     if (time.known == 0) return "–";
-    return base::formatDuration(std::chrono::nanoseconds(time.on)) + " of " +
-           base::formatDuration(std::chrono::nanoseconds(time.known));
+    return formatDuration(time.on) + " of " + formatDuration(time.known);
 }
 
 std::string formatHz(const day::Holder& holder, std::optional<int64_t> periodNs) {

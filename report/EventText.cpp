@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "base/Calendar.h"
+#include "report/Format.h"
 #include "report/Text.h"
 
 namespace report {
@@ -167,11 +168,9 @@ std::string showPlain(const Field& field) {
     if (!code.empty()) return field.text + ", " + std::string(code);
     if (field.key == "pkg") return safe(shortenApp(field.text));
     if (field.entries.empty()) return safe(show(kindOf(field.key), field.text));
-    std::string text;
-    for (const auto& [key, value] : field.entries[0]) {
-        text += (text.empty() ? "" : ", ") + key + ' ' + safe(value);
-    }
-    return text;
+    std::vector<std::string> texts;
+    for (const auto& [key, value] : field.entries[0]) texts.push_back(key + ' ' + safe(value));
+    return join(texts);
 }
 
 }  // namespace
@@ -185,8 +184,7 @@ std::string shortenApp(const std::string& app) {
 
 Section layOutEvent(const day::Event& event, size_t limit) {
     Section section;
-    section.heading =
-            base::formatTimeOfDay(std::chrono::nanoseconds(event.at)) + "  " + safe(event.id);
+    section.heading = formatTimeOfDay(event.at) + "  " + safe(event.id);
     const std::string_view meaning = describe(event.payload.kind);
     if (!meaning.empty()) section.heading.append("  ").append(meaning);
     Section::List values;

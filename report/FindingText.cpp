@@ -1,10 +1,8 @@
 #include "report/FindingText.h"
 
-#include <chrono>
-
-#include "report/AppNames.h"
 #include "report/CaptureFacts.h"
 #include "report/Format.h"
+#include "report/Names.h"
 #include "report/Text.h"
 
 namespace report {
@@ -12,10 +10,6 @@ namespace report {
 namespace {
 
 using day::Finding;
-
-std::string duration(int64_t ns) {
-    return base::formatDuration(std::chrono::nanoseconds(ns));
-}
 
 std::string times(int64_t number) {
     return number == 1 ? "once" : std::to_string(number) + " times";
@@ -34,26 +28,26 @@ std::string describe(const Finding& finding, const day::Journal& journal) {
                    moment(finding.from) + " to " + moment(finding.to) + " (" + finding.text +
                    "): what happened there is not known.";
         case Finding::Kind::kDark:
-            return app + " held " + sensor + " for " + duration(finding.time) +
+            return app + " held " + sensor + " for " + formatDuration(finding.time) +
                    " with the display off.";
         case Finding::Kind::kUnbatched:
             return app + " held " + sensor + ", which wakes the phone, for " +
-                   duration(finding.time) + " with the display off and without batching.";
+                   formatDuration(finding.time) + " with the display off and without batching.";
         case Finding::Kind::kThrough:
             return app + " had " + sensor + " on all through, since before " +
-                   moment(finding.from) + ": for at least " + duration(finding.time) + '.';
+                   moment(finding.from) + ": for at least " + formatDuration(finding.time) + '.';
         case Finding::Kind::kDied:
             return app + " went without switching " + sensor + " off, " + times(finding.count) +
-                   ": it was on for " + duration(finding.time) + " at most.";
+                   ": it was on for " + formatDuration(finding.time) + " at most.";
         case Finding::Kind::kRefused:
             return "The device refused " + app + " to switch " + sensor + " on, " +
                    times(finding.count) + ": " + finding.text + '.';
         case Finding::Kind::kNoAccess:
             return app + " has " + sensor + " on without access: it gets no data.";
         case Finding::Kind::kUnseen:
-            return "Only " + duration(finding.time) + " is seen of the " +
-                   duration(finding.to - finding.from) + " from " + moment(finding.from) + " to " +
-                   moment(finding.to) + ": of the rest nothing is told.";
+            return "Only " + formatDuration(finding.time) + " is seen of the " +
+                   formatDuration(finding.to - finding.from) + " from " + moment(finding.from) +
+                   " to " + moment(finding.to) + ": of the rest nothing is told.";
     }
     return {};
 }

@@ -7,6 +7,14 @@
 
 namespace report {
 
+std::string formatDuration(int64_t ns) {
+    return base::formatDuration(std::chrono::nanoseconds(ns));
+}
+
+std::string formatTimeOfDay(int64_t ns) {
+    return base::formatTimeOfDay(std::chrono::nanoseconds(ns));
+}
+
 std::string formatClock(int64_t ns) {
     const std::string day = "day " + std::to_string(ns / base::kNsPerDay + 1) + ' ';
     char decimals[16];
@@ -30,6 +38,15 @@ std::string onOneLine(std::string_view text) {
         }
     }
     return result;
+}
+
+std::string join(const std::vector<std::string>& texts, std::string_view between) {
+    std::string joined;
+    for (const std::string& text : texts) {
+        if (&text != texts.data()) joined += between;
+        joined += text;
+    }
+    return joined;
 }
 
 char levelLetter(int64_t level) {

@@ -3,8 +3,15 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace report {
+
+/** A duration in nanoseconds as h:mm:ss; parts of a second are left out. */
+std::string formatDuration(int64_t ns);
+
+/** The time of day of a moment, in nanoseconds from any midnight, as "11:45:07". */
+std::string formatTimeOfDay(int64_t ns);
 
 /** The clock as a person reads it: the day since the boot and the time of that day. */
 std::string formatClock(int64_t ns);
@@ -14,6 +21,9 @@ std::string formatClock(int64_t ns);
  * which might move the terminal's cursor, a "?".
  */
 std::string onOneLine(std::string_view text);
+
+/** The texts one behind another, with `between` between two. */
+std::string join(const std::vector<std::string>& texts, std::string_view between = ", ");
 
 /** The letter by which logs show a level; "?" for an unknown one. */
 char levelLetter(int64_t level);

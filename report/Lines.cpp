@@ -52,16 +52,14 @@ void JsonLines::begin(const std::string& name) {
 void JsonLines::take(const Record& record) {
     if (record.kind == Record::Kind::kExpect) return;  // its time is the recorded device's
     mTracker.take(record);
-    const bool isBoot = record.kind == Record::Kind::kBoot;
-    writeEnded(isBoot ? EndedUses::kAll : record.at);
-    if (isBoot && record.value == static_cast<int32_t>(trace::BootKind::kDevice)) {
+    writeEnded(record.kind == Record::Kind::kOver ? EndedUses::kAll : record.at);
+    if (record.kind == Record::Kind::kBoot &&
+        record.value == static_cast<int32_t>(trace::BootKind::kDevice)) {
         mHasTold = false;
         mIsClosed = false;
     }
     if (isShown(record.kind)) {
         writeRecord(record);
-    } else if (record.kind == Record::Kind::kOver) {
-        writeEnded(EndedUses::kAll);
     } else if (record.kind >= Record::Kind::kNote) {
         mHasNotes = true;
         writeCapture(record.at);
@@ -130,9 +128,9 @@ void JsonLines::writeCapture(int64_t at) {
 }
 
 void JsonLines::writeEnded(int64_t before) {
-    mEnded.tell(before, [this](const day::Use& use) {
+    for (const day::Use& use : mEnded.take(before)) {
         if (mTracker.notes().namesSensors) writeUse(use);
-    });
+    }
     const auto& taken = mTracker.notes().taken;
     if (!taken || !mTracker.isClosed() || mIsClosed) return;
     mIsClosed = true;

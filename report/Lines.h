@@ -4,7 +4,6 @@
 #include <vector>
 
 #include "base/Json.h"
-#include "day/EndedUses.h"
 #include "day/UseTracker.h"
 #include "report/Report.h"
 #include "report/Stdout.h"

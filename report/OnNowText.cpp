@@ -2,9 +2,10 @@
 
 #include "base/Calendar.h"
 #include "day/OnNow.h"
-#include "report/AppNames.h"
 #include "report/CaptureFacts.h"
 #include "report/DayRows.h"
+#include "report/Format.h"
+#include "report/Names.h"
 #include "report/Sections.h"
 #include "report/Text.h"
 
@@ -16,21 +17,18 @@ namespace {
 std::string formatSince(const day::Use& use, const day::Notes& notes) {
     const int64_t takenDay = *notes.knownTo() / base::kNsPerDay;
     const int64_t day = use.from / base::kNsPerDay;
-    const std::string time = base::formatTimeOfDay(std::chrono::nanoseconds(use.from));
+    const std::string time = formatTimeOfDay(use.from);
     return (use.before ? "before " : "") + (day == takenDay ? time : formatMoment(use.from, notes));
 }
 
 std::string describeRow(const day::OnRow& row) {
-    std::string text;
-    const auto add = [&text](const std::string& more) {
-        text += (text.empty() ? "" : ", ") + more;
-    };
-    if (!row.hasAccess) add("no data access");
-    if (row.wakeLocks > 0) add(count(static_cast<size_t>(row.wakeLocks), "wake lock"));
-    if (row.connections > 1) add(std::to_string(row.connections) + " connections");
-    if (row.use != nullptr && !row.use->periodNs) add("rate unknown");
-    if (row.use == nullptr) add("no line tells of it");
-    return text;
+    std::vector<std::string> texts;
+    if (!row.hasAccess) texts.emplace_back("no data access");
+    if (row.wakeLocks > 0) texts.push_back(count(static_cast<size_t>(row.wakeLocks), "wake lock"));
+    if (row.connections > 1) texts.push_back(std::to_string(row.connections) + " connections");
+    if (row.use != nullptr && !row.use->periodNs) texts.emplace_back("rate unknown");
+    if (row.use == nullptr) texts.emplace_back("no line tells of it");
+    return join(texts);
 }
 
 std::string nameRate(int64_t level) {
@@ -45,12 +43,10 @@ std::string describeChannel(const trace::DirectChannel& channel, const day::Note
             isOfUid ? nameUid(*channel.uid, notes.packagesOf(*channel.uid)) : channel.package;
     std::string text = "Direct channel of " + app + ": " +
                        count(static_cast<size_t>(channel.sensors), "sensor");
-    const char* gap = channel.rates.size() == 1 ? ", rate level " : ", rate levels ";
-    for (const int64_t rate : channel.rates) {
-        text += gap + nameRate(rate);
-        gap = ", ";
-    }
-    return safe(text);
+    std::vector<std::string> rates;
+    for (const int64_t rate : channel.rates) rates.push_back(nameRate(rate));
+    if (!rates.empty()) text += rates.size() == 1 ? ", rate level " : ", rate levels ";
+    return safe(text + join(rates));
 }
 
 }  // namespace

@@ -12,6 +12,7 @@
 #include "report/CaptureFacts.h"
 #include "report/DayRows.h"
 #include "report/EventText.h"
+#include "report/Format.h"
 #include "report/Text.h"
 #include "report/page/TableOf.h"
 
@@ -21,14 +22,7 @@ namespace {
 
 using day::Span;
 using day::Use;
-
-std::string timeOfDay(int64_t at) {
-    return base::formatTimeOfDay(std::chrono::nanoseconds(at));
-}
-
-std::string durationOf(int64_t ns) {
-    return base::formatDuration(std::chrono::nanoseconds(ns));
-}
+using page::Mark;
 
 std::string rateText(const Use& use) {
     if (use.mode == trace::SensorMode::kOneShot) return "one-shot";
@@ -43,12 +37,12 @@ std::string batchOf(int64_t us) {
 
 /** All of a use, in words, but the app and the sensor. */
 std::string factsOf(const Use& use) {
-    std::string text =
-            (use.before ? "before " : "") + timeOfDay(use.from) + " to " + timeOfDay(use.to);
+    std::string text = (use.before ? "before " : "") + formatTimeOfDay(use.from) + " to " +
+                       formatTimeOfDay(use.to);
     const int64_t days = use.to / base::kNsPerDay - use.from / base::kNsPerDay;
     if (days == 1) text += " of the next day";
     if (days > 1) text += ", " + count(static_cast<size_t>(days), "day") + " later";
-    text += ", " + durationOf(use.to - use.from) + ", " + rateText(use);
+    text += ", " + formatDuration(use.to - use.from) + ", " + rateText(use);
     if (use.batchUs) text += batchOf(*use.batchUs);
     if (use.wakeUp.value_or(false)) text += ", wake-up";
     if (use.enables.size() > 1) text += ", " + count(use.enables.size(), "enable");
@@ -69,10 +63,7 @@ std::string factsOf(const Use& use) {
 std::vector<page::Cell> totalOf(const std::vector<day::DayRow>& rows, const page::Table& table) {
     day::DayRow total;
     for (const day::DayRow& row : rows) {
-        total.held += row.held;
-        total.display.known += row.display.known;
-        total.display.on += row.display.on;
-        total.enables += row.enables;
+        total.add(row);
         total.isBefore = total.isBefore || row.isBefore;
         total.isUnseen = total.isUnseen || row.isUnseen;
         total.samples = total.samples.value_or(0) + row.samples.value_or(0);
@@ -136,13 +127,15 @@ private:
 
     void addMarks() {
         for (const day::Event* event : mJournal.eventsOf(mDay)) {
-            auto& marks = event->isAhead ? mResult.ahead : mResult.reports;
-            const char* const lead = event->isAhead ? "if nothing changed: " : "";
-            marks.push_back({event->at - mMidnight, lead + layOutEvent(*event, 0).heading});
+            mResult.marks.push_back({event->isAhead ? Mark::Kind::kAhead : Mark::Kind::kReport,
+                                     event->at - mMidnight,
+                                     (event->isAhead ? "if nothing changed: " : "") +
+                                             layOutEvent(*event, 0).heading});
         }
         const auto end = mNotes != nullptr ? mNotes->knownTo() : std::nullopt;
         if (!end || *end / base::kNsPerDay != mDay.number) return;
-        mResult.taken = page::Mark{*end - mMidnight, "known up to " + timeOfDay(*end)};
+        mResult.marks.push_back(
+                {Mark::Kind::kTaken, *end - mMidnight, "known up to " + formatTimeOfDay(*end)});
     }
 
     void addUses() {
@@ -179,9 +172,9 @@ private:
         if (part.span.from >= part.span.to && use.from != use.to) return {};
         part.isBefore = use.before && use.from >= mMidnight;
         const bool isEnd = use.to <= mMidnight + base::kNsPerDay;
-        if (use.end == day::End::kUnseen) part.end = page::Use::End::kUnseen;
-        if (isEnd && use.end == day::End::kOn) part.end = page::Use::End::kOn;
-        if (isContinuous(use)) part.rate = day::rateOf(use);
+        part.isUnseen = use.end == day::End::kUnseen;
+        part.isOn = isEnd && use.end == day::End::kOn;
+        if (isContinuous(use)) part.rate = rateOf(use, use.periodNs);
         for (const day::Enable& enable : use.enables) {
             if (enable.at / base::kNsPerDay != mDay.number) continue;
             part.enables.push_back(enable.at - mMidnight);

@@ -32,9 +32,9 @@ public:
 
     /**
      * The lines, each with `indent` blanks in front: the titles, then the rows. Columns in which
-     * nothing stands are left out. A line is at most `columns` wide, if that is given: what may be
-     * cut is, and where that would leave too little of it, it stands on a line above the rest,
-     * which takes as many lines as it needs.
+     * nothing stands are left out. A line is at most `columns` wide, if that is given. The columns
+     * that may be cut become narrower then. Where that would leave too little of them, they stand
+     * on a line of their own, and the others below on as many lines as they need.
      */
     std::string text(size_t indent, std::optional<size_t> columns = {}) const;
 

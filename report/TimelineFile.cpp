@@ -6,10 +6,9 @@
 
 #include "base/Calendar.h"
 #include "day/Payload.h"
-#include "report/AppNames.h"
 #include "report/DayRows.h"
 #include "report/EventText.h"
-#include "report/SensorNames.h"
+#include "report/Names.h"
 #include "report/Text.h"
 #include "trace/CallTable.h"
 
@@ -107,8 +106,7 @@ void TimelineFile::startBoot(const Record& record) {
 void TimelineFile::endBoot() {
     for (size_t i = 0; i < mStates.size(); ++i) change(static_cast<DeviceState>(i), "");
     if (!mBoot.name.empty()) {
-        mEvents.slice(processOf(kDevice), "boots", mBoot.name, mBoot.since, mAt,
-                      [](JsonWriter*) {});
+        mEvents.slice(processOf(kDevice), "boots", mBoot.name, mBoot.since, mAt);
     }
     mBoot = {};
 }
@@ -162,8 +160,7 @@ void TimelineFile::change(DeviceState state, const std::string& name) {
 /** A state counts where it is known. */
 void TimelineFile::writeState(DeviceState state, const std::string& name, day::Span span) {
     const auto write = [&](const std::string& what, int64_t from, int64_t to) {
-        mEvents.slice(processOf(kDevice), kTracks[static_cast<size_t>(state)], what, from, to,
-                      [](JsonWriter*) {});
+        mEvents.slice(processOf(kDevice), kTracks[static_cast<size_t>(state)], what, from, to);
     };
     const auto& known = mTracker.notes().known;
     if (!known) return write(name, span.from, span.to);

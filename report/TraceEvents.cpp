@@ -77,8 +77,7 @@ TraceEvents::Track TraceEvents::trackOf(const Process& process, std::string_view
 }
 
 void TraceEvents::tell(std::string_view what, Track track, const EventArguments& arguments) {
-    event(
-            "M", what, track, [](JsonWriter*) {}, arguments);
+    event("M", what, track, {}, arguments);
 }
 
 void TraceEvents::event(std::string_view phase, std::string_view name, Track track,
@@ -88,9 +87,9 @@ void TraceEvents::event(std::string_view phase, std::string_view name, Track tra
     json.beginObject().member("ph", phase).member("name", name);
     json.member("pid", static_cast<int64_t>(track.process));
     json.member("tid", static_cast<int64_t>(track.thread));
-    more(&json);
+    if (more) more(&json);
     json.key("args").beginObject();
-    arguments(&json);
+    if (arguments) arguments(&json);
     json.endObject().endObject();
     std::fputs(mIsFirst ? "\n" : ",\n", mFile);
     std::fwrite(line.data(), 1, line.size(), mFile);

@@ -14,7 +14,7 @@
 
 namespace report {
 
-/** Writes the arguments of an event as members of a JSON object. */
+/** Writes the arguments of an event as members of a JSON object; empty: there are none. */
 using EventArguments = std::function<void(base::JsonWriter*)>;
 
 /** A row of tracks: an app's, or one of the tool's own, whatever an app is called. */
@@ -44,7 +44,7 @@ public:
     void add(const Process& process) { processOf(process); }
 
     void slice(const Process& process, std::string_view track, std::string_view name, int64_t from,
-               int64_t to, const EventArguments& arguments);
+               int64_t to, const EventArguments& arguments = {});
     void instant(const Process& process, std::string_view track, std::string_view name, int64_t at,
                  const EventArguments& arguments);
 

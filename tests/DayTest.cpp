@@ -8,7 +8,10 @@
 #include "day/Journal.h"
 #include "day/Profile.h"
 #include "day/Samples.h"
+#include "report/Compare.h"
 #include "report/EventText.h"
+#include "report/PageDay.h"
+#include "report/page/DayPicture.h"
 
 namespace {
 
@@ -177,6 +180,9 @@ TEST(DayTest, EachUseThatEarnsNoReportHasItsCause) {
             {{on(1, "a", {}, 0, 8), off(999, "a", {}, 8), on(999, "b", {}, 0, 8),
               on(1999, "b", {}, 0, 8), off(2001, "b", {}, 8), off(2900, "b", {}, 8)},
              {{Cause::kShortProximity, 1}}},
+            {{on(1, "a", {}, 0, 8), off(999, "a", {}, 8), on(999, "a", {}, 0, 8),
+              off(2001, "a", {}, 8)},
+             {{Cause::kShortProximity, 2}}},
             {{on(1, "a", {}, 0, 8), report}, {{Cause::kOpenProximity, 1}}},
             {{on(1, "com.zuno.a", {}, 0, 8), off(3000, "com.zuno.a", {}, 8)},
              {{Cause::kSystemApp, 1}}},
@@ -221,6 +227,10 @@ TEST(DayTest, WhatEndsInAGapMayHaveBeenSwitchedOffThere) {
     };
     EXPECT_EQ(findings(R"({"from": 40000, "to": 49999})"), 1u);
     EXPECT_EQ(findings(R"({"from": 40000, "to": 50000})"), 0u);
+    for (const int hour : {3599, 3600}) {
+        const auto dark = gather({displayIs(0, false), on(0, "a"), off(hour, "a")});
+        EXPECT_EQ(day::findFindings(dark).size(), hour / 3600u);
+    }
 }
 
 TEST(DayTest, ATableSplitsUsesAtMidnightAndKeepsSensorsOfOneTypeApart) {
@@ -262,13 +272,51 @@ TEST(DayTest, WhatIsSeenAndHeldOnBatteryIsCountedOnce) {
     writer.take({Kind::kOver, 50 * kSecond});
     const day::Profile profile = profileOf(writer.end());
     EXPECT_EQ(profile.covered, 90 * kSecond) << "40 and 60 but for the gap";
-    EXPECT_EQ(profile.displayOff, 25 * kSecond) << "the second process was told nothing";
+    EXPECT_EQ(profile.display.off(), 25 * kSecond) << "the second process was told nothing";
     std::string rows;
     for (const auto& [key, row] : profile.rows) {
-        rows += key.first + ' ' + (key.second ? std::to_string(*key.second) : "none") + ' ' +
-                row.sensor + ' ' + std::to_string(row.heldOnBattery / 1'000'000) + '\n';
+        rows += std::to_string(key.uid.value_or(0)) + ' ' +
+                (key.type ? std::to_string(*key.type) : "none") + ' ' + row.sensor + ' ' +
+                std::to_string(row.heldOnBattery / 1'000'000) + '\n';
     }
-    EXPECT_EQ(rows, "uid 5 none GPS 3\nuid 5 0  2\nuid 5 1 A 1\n");
+    EXPECT_EQ(rows, "5 none GPS 3\n5 0  2\n5 1 A 1\n");
+}
+
+TEST(DayTest, APageShowsOnEachDayItsPartOfAUse) {
+    const day::Journal journal =
+            gather({note(0, R"({"capture": {"knownTo": 400000000}})"),
+                    on(3600, "a", R"({"handle": 1, "before": true})", 20'000'000),
+                    off(2 * 86'400 + 7200, "a", R"({"handle": 1})")});
+    report::page::Day last = report::pageDay(journal, {0, 2});
+    const report::page::Use first = report::pageDay(journal, {0, 0}).lanes.at(0).uses.at(0);
+    EXPECT_EQ(first.facts, "before 01:00:00 to 02:00:00, 2 days later, 49:00:00, 50.0 Hz");
+    EXPECT_TRUE(first.isBefore);
+    EXPECT_FALSE(last.lanes.at(0).uses.at(0).isBefore);
+    EXPECT_EQ(report::page::hoursOf({last}).to, 3 * 3600 * kSecond) << "2 o'clock is shown";
+    last.lanes[0].uses.resize(10);
+    EXPECT_EQ(report::page::drawDay(last, {0, kDay}).find(" more"), std::string::npos);
+}
+
+TEST(DayTest, WhatIsRoundedAwayInAComparisonHasNoSignAndNoRange) {
+    const auto heldFor = [](int64_t seconds, const char* more) {
+        const std::string known = R"({"capture": {"knownTo": 36000000}, "sensors": [
+                {"handle": 1, "name": "A", "type": 1, "maxRate": 1}, {"handle": 2, "name": ")" +
+                                  std::string(more) + R"(", "type": 1, "maxRate": 2}]})";
+        return gather({note(0, known), on(0, "a"), off(seconds, "a"), at(36'000, Kind::kTick)});
+    };
+    for (const auto& [seconds, size] :
+         {std::pair(24, "0:00:00"), {26, "+0:00:01"}, {16, "0:00:00"}, {14, "-0:00:01"}}) {
+        report::ComparedSides sides(2);
+        for (const int64_t each : {19, 21}) sides.add(heldFor(each, "A"));
+        sides.add(heldFor(seconds, "B"));
+        const report::Section compared = *sides.layOut(9);
+        ASSERT_EQ(compared.parts.size(), 2u);
+        EXPECT_EQ(compared.parts[1].tables[0].table.rows().size(), 1u)
+                << "B is new, the first A stays";
+        const auto& row = compared.parts.at(0).tables.at(0).table.rows().at(0);
+        EXPECT_EQ(row, (std::vector<std::string>{"a", "accelerometer", "0:00:02", row[3], size,
+                                                 "hour", row[6]}));
+    }
 }
 
 TEST(DayTest, APayloadIsTakenApartWhateverItsNamesHold) {

@@ -179,14 +179,15 @@ TEST_F(ReplayOutputTest, AReplayThatStopsLeavesWhatWasThere) {
     EXPECT_EQ(run("first").out, "") << "nothing was played";
 }
 
-TEST_F(ReplayOutputTest, ATableHasAllDecimalsOfAMoment) {
+TEST_F(ReplayOutputTest, ATableHasAllDecimalsOfAMomentAndNothingOfWhatIsNotKnown) {
     write("dated", R"({"at": 0, "note": {"capture": {"midnight": "2024-03-05", "knownTo": 9000}}}
 {"at": 1000.05, "call": "SDCImpl.enableSuccess", "args": [true, 1, "a,\"b", "c", 1000]}
 {"at": 2000.000001, "call": "SDCImpl.enableSuccess", "args": [false, 1, "a,\"b", "c", 0]}
 )");
     EXPECT_EQ(run("--uses uses dated").status, 0);
     EXPECT_NE(contents("uses").find(R"(,"a,""b",,,1,,,,c,2024-03-05T00:00:01.00005,)"
-                                    "2024-03-05T00:00:02.000000001,1000.05,2000.000001,"),
+                                    "2024-03-05T00:00:02.000000001,1000.05,2000.000001,0,off,1,1,"
+                                    "1000000,,0.999,0,,\r\n"),
               std::string::npos)
             << contents("uses");
 }

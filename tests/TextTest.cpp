@@ -3,7 +3,9 @@
 #include <gtest/gtest.h>
 
 #include "base/Calendar.h"
+#include "report/DayRows.h"
 #include "report/Format.h"
+#include "report/Names.h"
 #include "report/Table.h"
 
 namespace report {
@@ -70,12 +72,23 @@ TEST(TextTest, TimesRatesAndDaysAreWrittenForAPerson) {
     EXPECT_EQ(formatRate(1000), "1e+06");
     EXPECT_EQ(formatRate(0), "fastest");
     EXPECT_EQ(formatRate(-1), "fastest");
+    EXPECT_EQ(formatSamples(9999.4), "9999");
+    EXPECT_EQ(formatSamples(9999.5), "10.0k") << "as the page's script has it";
     EXPECT_EQ(formatClock(86'399'999'999'999), "day 1 23:59:59.999999999");
     EXPECT_EQ(formatClock(86'461'001'000'000), "day 2 00:01:01.001");
     EXPECT_EQ(onOneLine(" \t a\n\x7f  b"), " a?? b");
     const std::string letters = "?VDIWEFS?";
     for (int level = 1; level < 10; ++level) EXPECT_EQ(levelLetter(level), letters[level - 1]);
     EXPECT_EQ(levelLetter(-1), '?');
+}
+
+TEST(TextTest, AnAppIsNamedByItsPackageAndATimeMarkedByWhatIsNotKnownOfIt) {
+    day::DayRow row;
+    row.holder.pkg = "com.ab";
+    row.holder.packages = {"com.a", "com.b"};
+    row.isBefore = row.isUnseen = true;
+    EXPECT_EQ(nameApp(row.holder), "com.a +1 (com.ab)");
+    EXPECT_EQ(formatHeld(row), "~0:00:00");
 }
 
 TEST(TextTest, ATableFitsItsRoomByCuttingTheWidestNamesFirst) {

@@ -5,6 +5,7 @@
 #include <cstdio>
 
 #include "base/Calendar.h"
+#include "report/Format.h"
 #include "report/Text.h"
 #include "report/page/Html.h"
 
@@ -15,47 +16,29 @@ namespace {
 constexpr size_t kMostLanes = 100;
 constexpr size_t kMostNamed = 10;  // slices of a lane, in the lane's name
 constexpr double kPixel = 0.1;     // percent of the width: about what a screen can show
-constexpr std::string_view kBandNames[] = {"Reports", "Display", "Charger"};
-
-/** What a lane shows from one moment to another. */
-struct Slice {
-    Span span;
-    std::string style;
-    std::string_view facts;
-    bool isBefore = false;
-    bool isOn = false;
-};
 
 std::string timeOfDay(int64_t at) {
     if (at == base::kNsPerDay) return "24:00:00";
-    return base::formatTimeOfDay(std::chrono::nanoseconds(at));
+    return formatTimeOfDay(at);
 }
 
 std::string fromTo(Span span) {
     return timeOfDay(span.from) + " to " + timeOfDay(span.to);
 }
 
-BandLane bandLane(std::string_view name, const std::string& style, const std::string& on,
-                  const Band& band) {
-    BandLane lane{std::string(name), {}};
-    for (const Span& span : band.on) lane.parts.push_back({span, style, on + fromTo(span)});
+BandLane bandLane(const char* name, const char* style, const char* on, const Band& band) {
+    BandLane lane{name, {}};
+    for (const Span& span : band.on) lane.slices.push_back({span, style, on + fromTo(span)});
     for (const Span& span : band.unknown) {
-        lane.parts.push_back({span, "unknown", "not known, " + fromTo(span)});
+        lane.slices.push_back({span, "unknown", "not known, " + fromTo(span)});
     }
     return lane;
-}
-
-std::vector<Slice> slicesOf(const BandLane& lane) {
-    std::vector<Slice> slices;
-    for (const auto& part : lane.parts) slices.push_back({part.span, part.style, part.facts});
-    return slices;
 }
 
 std::vector<Slice> slicesOf(const Lane& lane) {
     std::vector<Slice> slices;
     for (const Use& use : lane.uses) {
-        const bool isOn = use.end == Use::End::kOn;
-        slices.push_back({use.span, styleOf(use), use.facts, use.isBefore, isOn});
+        slices.push_back({use.span, styleOf(use), use.facts, use.isBefore, use.isOn});
     }
     return slices;
 }
@@ -81,7 +64,7 @@ public:
         drawBackground(day);
         drawHours();
         for (const BandLane& lane : bandsOf(day)) {
-            drawLane("band", lane.name, escape(lane.name), slicesOf(lane));
+            drawLane("band", lane.name, escape(lane.name), lane.slices);
         }
         mDrawn = mTold = 0;  // of uses
         mHtml += "<div class=\"lanes\">\n";
@@ -131,10 +114,7 @@ private:
         drawSpans("shade", day.display.on);
         drawSpans("unknown", day.unseen);
         for (int64_t at = mHours.from; at <= mHours.to; at += step()) drawLine("grid", at);
-        for (const auto* marks : {&day.reports, &day.ahead}) {
-            for (const Mark& mark : *marks) drawLine("report", mark.at);
-        }
-        if (day.taken) drawLine("taken", day.taken->at);
+        for (const Mark& mark : day.marks) drawLine(lineStyleOf(mark), mark.at);
         mHtml += "</svg>\n";
     }
 
@@ -190,7 +170,7 @@ private:
 
     void drawSlice(const Slice& slice, double from, double to, std::ptrdiff_t number) {
         const std::string facts =
-                number == 1 ? std::string(slice.facts)
+                number == 1 ? slice.facts
                             : std::to_string(number) + " of them, too close to tell apart";
         drawRect(slice.style + (number == 1 ? "" : " many"), from, to,
                  " y=\"25%\" height=\"50%\"><title>" + escape(facts) + "</title></rect>\n");
@@ -225,29 +205,28 @@ private:
 std::string styleOf(const Use& use) {
     std::string style = "slice";
     if (use.isBefore) style += " before";
-    if (use.end == Use::End::kUnseen) style += " unseen";
-    if (use.end == Use::End::kOn) style += " on";
+    if (use.isUnseen) style += " unseen";
+    if (use.isOn) style += " on";
     return style;
 }
 
+const char* lineStyleOf(const Mark& mark) {
+    return mark.kind == Mark::Kind::kTaken ? "taken" : "report";
+}
+
 std::vector<BandLane> bandsOf(const Day& day) {
-    BandLane reports{std::string(kBandNames[0]), {}};
-    for (const Mark& mark : day.reports) {
-        reports.parts.push_back({{mark.at, mark.at}, "report", mark.text});
-    }
-    for (const Mark& mark : day.ahead) {
-        reports.parts.push_back({{mark.at, mark.at}, "ahead", mark.text});
-    }
-    if (day.taken) {
-        reports.parts.push_back({{day.taken->at, day.taken->at}, "taken", day.taken->text});
+    constexpr const char* kStyles[] = {"report", "ahead", "taken"};  // by Mark::Kind
+    BandLane marks{"Reports", {}};
+    for (const auto& [kind, at, text] : day.marks) {
+        marks.slices.push_back({{at, at}, kStyles[static_cast<size_t>(kind)], text});
     }
     std::vector<BandLane> lanes{
-            std::move(reports),
-            bandLane(kBandNames[1], "display", "on from ", day.display),
-            bandLane(kBandNames[2], "charge", "charging from ", day.charge),
+            std::move(marks),
+            bandLane("Display", "display", "on from ", day.display),
+            bandLane("Charger", "charge", "charging from ", day.charge),
     };
     for (BandLane& lane : lanes) {
-        std::stable_sort(lane.parts.begin(), lane.parts.end(),
+        std::stable_sort(lane.slices.begin(), lane.slices.end(),
                          [](const auto& a, const auto& b) { return a.span.from < b.span.from; });
     }
     return lanes;
@@ -263,8 +242,9 @@ Span hoursOf(const std::vector<Day>& days) {
         for (const Lane& lane : day.lanes) {
             for (const Use& use : lane.uses) take(use.span);
         }
-        for (const Mark& mark : day.reports) take({mark.at, mark.at});
-        if (day.taken) take({day.taken->at, day.taken->at});
+        for (const Mark& mark : day.marks) {
+            if (mark.kind != Mark::Kind::kAhead) take({mark.at, mark.at});
+        }
     }
     if (hours.from > hours.to) return {0, 0};
     // The last moment lies before the end.

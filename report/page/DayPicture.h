@@ -10,16 +10,22 @@ namespace report::page {
 /** The classes of a use: "slice", and "before", "unseen" and "on" where it is that. */
 std::string styleOf(const Use& use);
 
+/** The class of the line at a mark: "report" or "taken". */
+const char* lineStyleOf(const Mark& mark);
+
+/** What a lane shows from one moment to another. */
+struct Slice {
+    Span span;
+    std::string style;  // its classes
+    std::string facts;
+    bool isBefore = false;
+    bool isOn = false;
+};
+
 /** A lane above those of the sensors: reports, a state of the device. */
 struct BandLane {
-    struct Part {
-        Span span;
-        std::string style;  // its classes
-        std::string facts;
-    };
-
     std::string name;
-    std::vector<Part> parts;  // ordered by their begins
+    std::vector<Slice> slices;  // ordered by their begins
 };
 
 std::vector<BandLane> bandsOf(const Day& day);

@@ -44,16 +44,11 @@ struct Table {
 
 /** The part of a use of a sensor that lies within a day. */
 struct Use {
-    enum class End {
-        kSeen,    // it ended, or it goes on in the next day
-        kUnseen,  // it ended at `span.to` at the latest, or perhaps in the next day
-        kOn,      // it was on when the capture was taken, or when the trace ended
-    };
-
     Span span;
-    bool isBefore = false;  // it began before `span.from`, unseen
-    End end = End::kSeen;
-    std::optional<double> rate;    // samples a second that it costs; nothing: unknown
+    bool isBefore = false;       // it began before `span.from`, unseen
+    bool isUnseen = false;       // it ended at `span.to` at the latest, or perhaps in the next day
+    bool isOn = false;           // it was on when the capture was taken, or when the trace ended
+    std::optional<double> rate;  // samples a second that it costs; nothing: unknown
     std::vector<int64_t> enables;  // of this day
     std::string facts;             // all of the use, in words, but the app and the sensor
 };
@@ -73,6 +68,13 @@ struct Band {
 
 /** Something at a moment. */
 struct Mark {
+    enum class Kind {
+        kReport,  // telemetry
+        kAhead,   // telemetry that comes if nothing changes
+        kTaken,   // the moment of the capture
+    };
+
+    Kind kind;
     int64_t at;
     std::string text;
 };
@@ -82,13 +84,10 @@ struct Day {
     std::string name;
     Band display;
     Band charge;
-    std::vector<Span> unseen;   // uses are not known here
-    std::vector<Mark> reports;  // telemetry
-    std::vector<Mark> ahead;    // telemetry that comes if nothing changes
-    std::optional<Mark> taken;  // the moment of the capture
-    std::vector<Lane> lanes;    // lane N is row N of `uses`
+    std::vector<Span> unseen;  // uses are not known here
+    std::vector<Mark> marks;
+    std::vector<Lane> lanes;  // lane N is row N of `uses`
     std::optional<Table> uses;
-    std::vector<std::string> lines;  // below the table
 };
 
 /** One input: a trace, a capture, or several merged ones. */

@@ -135,7 +135,6 @@ private:
             mHtml += "<section class=\"day\">\n" + element("h3", day.name);
             if (hours.from < hours.to) mHtml += drawDay(day, hours);
             if (day.uses) addTable(*day.uses);
-            for (const std::string& line : day.lines) mHtml += element("p", line);
             mHtml += "</section>\n";
         }
     }
@@ -237,7 +236,9 @@ std::string PageWriter::contents() const {
     return html + "</ul>\n</nav>\n";
 }
 
-bool PageWriter::write(std::FILE* file, const std::optional<Section>& first) {
+bool PageWriter::finish(std::FILE* file, const std::optional<Section>& first) {
+    errno = mError;
+    if (mError != 0) return false;
     const std::string title =
             mNames.size() == 1 ? mNames[0] : std::to_string(mNames.size()) + " inputs";
     std::string html =
@@ -246,11 +247,6 @@ bool PageWriter::write(std::FILE* file, const std::optional<Section>& first) {
     if (first) html += InputHtml::html(*first);
     if (!put(html, file) || (mInputs && !copy(mInputs.get(), file))) return false;
     return put(kFoot, file) && put(kScript, file) && put("</script>\n</body>\n</html>\n", file);
-}
-
-bool PageWriter::finish(std::FILE* file, const std::optional<Section>& first) {
-    errno = mError;
-    return mError == 0 && write(file, first);
 }
 
 }  // namespace report::page

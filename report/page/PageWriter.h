@@ -35,7 +35,6 @@ private:
     };
     using File = std::unique_ptr<std::FILE, Close>;
 
-    bool write(std::FILE* file, const std::optional<Section>& first);
     std::string contents() const;
 
     File mInputs;                     // their HTML

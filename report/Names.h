@@ -19,7 +19,16 @@ std::string nameApp(const day::Holder& holder);
 /** The apps of a uid in the same way, or "uid 1000". */
 std::string nameUid(int32_t uid, const std::vector<std::string>& packages);
 
-/** A sensor by its name or kind, or by its handle if the device does not list it. */
+/** The platform's word for a sensor's type, as "accelerometer", or "type N". */
+std::string nameType(int32_t type);
+
+/**
+ * A sensor by its name, behind the word for its type where that is not in it, or by the word. Types
+ * of makers have none.
+ */
+std::string nameSensor(int32_t type, const std::string& name);
+
+/** The same, or its handle if the device does not list it. */
 std::string nameSensor(const day::Holder& holder);
 
 }  // namespace report
