@@ -16,7 +16,6 @@ constexpr size_t kBlock = size_t{256} << 10;
 constexpr size_t kCapacity = LineReader::kMaxLine + kBlock;
 
 constexpr char kTooLong[] = "the line is longer than 64 MiB";
-constexpr std::string_view kMark = "\xEF\xBB\xBF";  // the byte order mark of UTF-8
 
 /** Pages of shared memory that are never touched cost nothing. */
 void* mapShared(size_t size) {
@@ -26,6 +25,12 @@ void* mapShared(size_t size) {
 }
 
 }  // namespace
+
+std::string_view withoutMark(std::string_view text) {
+    constexpr std::string_view kMark = "\xEF\xBB\xBF";
+    if (text.substr(0, kMark.size()) == kMark) text.remove_prefix(kMark.size());
+    return text;
+}
 
 LineReader::LineReader(int fd) : LineReader(std::make_unique<FileSource>(fd)) {}
 
@@ -62,11 +67,8 @@ std::optional<std::string_view> LineReader::next() {
         }
         mState->begin += std::min(length + 1, unread);
         mState->isOpen = feed == nullptr;
-        std::string_view line(begin, length);
-        if (mState->lineNumber == 1 && line.substr(0, kMark.size()) == kMark) {
-            line.remove_prefix(kMark.size());
-        }
-        return line;
+        const std::string_view line(begin, length);
+        return mState->lineNumber == 1 ? withoutMark(line) : line;
     }
 }
 

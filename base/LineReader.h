@@ -11,6 +11,9 @@
 
 namespace base {
 
+/** `text` without the byte order mark of UTF-8 that it may begin with. */
+std::string_view withoutMark(std::string_view text);
+
 /**
  * Reads a file, or a pipe, line by line and in blocks, in constant memory. Its state lives in
  * memory that forked processes share: a line read by one of them is read for all, so a process can

@@ -15,12 +15,6 @@
 
 namespace replay {
 
-namespace {
-
-constexpr std::string_view kMark = "\xEF\xBB\xBF";  // the byte order mark of UTF-8
-
-}  // namespace
-
 bool InputFile::isCapture() const {
     return first && first->find_first_not_of(" \t") != first->find('{');
 }
@@ -66,8 +60,7 @@ bool isSurelyCapture(const std::string& name) {
     char bytes[4096];
     const ssize_t count = fd < 0 ? 0 : read(fd, bytes, sizeof(bytes));
     if (fd >= 0) close(fd);
-    std::string_view text(bytes, static_cast<size_t>(std::max<ssize_t>(count, 0)));
-    if (text.substr(0, kMark.size()) == kMark) text.remove_prefix(kMark.size());
+    auto text = base::withoutMark({bytes, static_cast<size_t>(std::max<ssize_t>(count, 0))});
     while (trace::isSkipped(text.substr(0, text.find('\n')))) {
         if (text.find('\n') == std::string_view::npos) return false;
         text.remove_prefix(text.find('\n') + 1);

@@ -145,32 +145,23 @@ int main(int argc, char** argv) {
                                ? std::string()
                                : "takes a number of at least 1, not " + text;
             });
-    app.add_option("--properties", options.properties,
-                   "keep the system properties in FILE (made if missing)")
-            ->type_name("FILE")
-            ->check(refuseOptionAsFile);
-    app.add_option("--timeline", options.timeline,
-                   "write the days as trace events to FILE, for a timeline viewer")
-            ->type_name("FILE")
-            ->check(refuseOptionAsFile)
+    const auto addFile = [&](const char* name, auto* path, const char* what) {
+        return app.add_option(name, *path, what)->type_name("FILE")->check(refuseOptionAsFile);
+    };
+    addFile("--properties", &options.properties,
+            "keep the system properties in FILE (made if missing)");
+    addFile("--timeline", &options.timeline,
+            "write the days as trace events to FILE, for a timeline viewer")
             ->excludes(printTrace);
-    app.add_option("--page", options.page, "write the summary as an HTML page to FILE")
-            ->type_name("FILE")
-            ->check(refuseOptionAsFile)
+    addFile("--page", &options.page, "write the summary as an HTML page to FILE")
             ->excludes(printTrace);
-    app.add_option("--uses", options.uses, "write a row for each use of a sensor to FILE, as CSV")
-            ->type_name("FILE")
-            ->check(refuseOptionAsFile)
+    addFile("--uses", &options.uses, "write a row for each use of a sensor to FILE, as CSV")
             ->excludes(printTrace);
-    app.add_option("--since-charge", options.sinceCharge,
-                   "write the battery statistics of bug reports to FILE, as CSV")
-            ->type_name("FILE")
-            ->check(refuseOptionAsFile)
+    addFile("--since-charge", &options.sinceCharge,
+            "write the battery statistics of bug reports to FILE, as CSV")
             ->excludes(printTrace);
-    auto* baseline = app.add_option("--baseline", options.baseline,
-                                    "say how the inputs differ from FILE; may be repeated")
-                             ->type_name("FILE")
-                             ->check(refuseOptionAsFile)
+    auto* baseline = addFile("--baseline", &options.baseline,
+                             "say how the inputs differ from FILE; may be repeated")
                              ->allow_extra_args(false);
     for (const char* other : {"--log", "--check", "--print-trace", "--properties", "--timeline"}) {
         baseline->excludes(app.get_option(other));

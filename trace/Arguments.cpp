@@ -5,6 +5,8 @@
 #include <type_traits>
 #include <utility>
 
+#include "base/Json.h"
+
 namespace trace {
 
 using simdjson::dom::array;
@@ -82,7 +84,6 @@ constexpr Readers kCallReaders[] = {
 #define CALL(Class, operation, parameters) \
     ReadersOf<typename ArgumentsOf<decltype(&android::Class::operation)>::type>::kAll,
 #define VARIABLE(name)
-#include "base/Json.h"
 #include "trace/calls.inc"
 #undef CALL
 #undef VARIABLE
