@@ -293,7 +293,7 @@ public:
         return *this;
     }
 
-    /** A value that is JSON already. */
+    /** A value, or members, that are JSON already. */
     JsonWriter& raw(std::string_view json) {
         separate();
         mOut += json;

@@ -2,6 +2,7 @@
 #include <type_traits>
 #include <utility>
 
+#include "base/Json.h"
 #include "rgb/RgbShot.h"
 #include "trace/CallTable.h"
 
@@ -79,12 +80,16 @@ std::optional<std::string> call(int (Class::*operation)(int*, int*),
     auto rect = std::get<Rectangle>(arguments[0]);
     int rgb[3] = {};
     const int status = (Class::getInstance()->*operation)(rgb, rect.data());
-    std::string json = R"({"status": )" + std::to_string(status);
+    std::string result;
+    base::JsonWriter json(&result);
+    json.beginObject().member("status", status);
     if (status != 0) {
-        json += R"(, "rgb": [)" + std::to_string(rgb[0]) + ", " + std::to_string(rgb[1]) + ", " +
-                std::to_string(rgb[2]) + ']';
+        json.key("rgb").beginArray();
+        for (const int average : rgb) json.value(average);
+        json.endArray();
     }
-    return json + '}';
+    json.endObject();
+    return result;
 }
 
 /** `Operation` is a member of a singleton, or `getInstance` itself. */

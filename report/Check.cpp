@@ -108,7 +108,13 @@ void Check::endStretch() {
 void Check::differ(const Entry* expected, const Entry* given) {
     const auto show = [](const Entry* entry) {
         if (entry == nullptr) return std::string("nothing more");
-        return R"({"at": )" + base::formatMs(entry->at) + ", " + entry->text + '}';
+        std::string line;
+        base::JsonWriter(&line)
+                .beginObject()
+                .member("at", base::Ms{entry->at})
+                .raw(entry->text)
+                .endObject();
+        return line;
     };
     const std::string place = expected == nullptr ? mName + ": " : base::at(mName, expected->line);
     mFailure = {place + "the replay differs\n  expected: " + show(expected) +

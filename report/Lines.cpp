@@ -11,12 +11,12 @@ namespace report {
 
 using base::JsonWriter;
 using base::Ms;
+using day::EndedUses;
 using trace::Record;
 
 namespace {
 
 constexpr int64_t kNsPerUs = 1000;
-using day::EndedUses;
 
 /** Writes a member whose value is known. */
 template <typename T>
