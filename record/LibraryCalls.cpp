@@ -7,6 +7,7 @@
 #include <time.h>
 #include <utils/Looper.h>
 
+#include "base/Calendar.h"
 #include "core/Export.h"
 #include "core/SensorHandlerThread.h"
 #include "record/Library.h"
@@ -89,15 +90,14 @@ extern "C" SENSOR_PRIV_EXPORT int __android_log_print(int level, const char* tag
 /** In a stint the monotonic clock stands still for its thread. */
 extern "C" SENSOR_PRIV_EXPORT int clock_gettime(clockid_t clock, timespec* time) noexcept(
         noexcept(::clock_gettime(clock, time))) {
-    constexpr int64_t kNsPerSecond = 1'000'000'000;
     Stint* const stint = clock == CLOCK_MONOTONIC ? Stint::current() : nullptr;
     if (stint == nullptr) {
         static Found<int (*)(clockid_t, timespec*)> found;
         return record::next(&found, "clock_gettime")(clock, time);
     }
     const int64_t now = stint->clock(record::realNow());
-    time->tv_sec = static_cast<time_t>(now / kNsPerSecond);
-    time->tv_nsec = static_cast<long>(now % kNsPerSecond);
+    time->tv_sec = static_cast<time_t>(now / base::kNsPerSecond);
+    time->tv_nsec = static_cast<long>(now % base::kNsPerSecond);
     return 0;
 }
 
@@ -108,7 +108,7 @@ int64_t realNow() {
     const Stint::Scope noStint(nullptr);
     timespec now{};
     clock_gettime(CLOCK_MONOTONIC, &now);
-    return int64_t{now.tv_sec} * 1'000'000'000 + now.tv_nsec;
+    return int64_t{now.tv_sec} * base::kNsPerSecond + now.tv_nsec;
 }
 
 }  // namespace record

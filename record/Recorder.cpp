@@ -25,7 +25,7 @@ namespace {
 constexpr size_t kReserve = size_t{64} << 10;
 
 /** While lines are lost, the record is tried to go on this often. */
-constexpr int64_t kRetryNs = 1'000'000'000;
+constexpr int64_t kRetryNs = base::kNsPerSecond;
 
 // Lines are not held back for longer than this for a stint that hangs in somebody else's code, nor
 // are more of them than that.
@@ -348,7 +348,7 @@ void Recorder::expect(Stint* stint, std::string_view body) {
     // A line without an action lets a replay come to the message's moment, also at a trace's end.
     if (stint->tellsMoment) lines += '\n';
     stint->tellsMoment = false;
-    base::JsonWriter(&lines).key("expect").raw('{' + std::string(body) + '}');
+    base::JsonWriter(&lines).key("expect").beginObject().raw(body).endObject();
     lines += '\n';
     if (!mOrder.mayWrite(stint, lines)) return leaveHanging(realNow());
     appendAll(lines, stint->now);

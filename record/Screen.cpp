@@ -48,7 +48,10 @@ std::string Screen::take(const int* rgb, const int* rect) {
     const bool fails = rgb == nullptr;
     if (mFails != fails) json.key("fault").raw(fails ? R"("capture")" : "null");
     mFails = fails;
-    return changes.empty() ? changes : R"("display": {)" + changes + '}';
+    std::string body;
+    if (!changes.empty())
+        base::JsonWriter(&body).key("display").beginObject().raw(changes).endObject();
+    return body;
 }
 
 }  // namespace record

@@ -7,32 +7,11 @@
 #include "base/Json.h"
 #include "record/Library.h"
 #include "trace/CallTable.h"
+#include "trace/Words.h"
 
 namespace record {
 
 namespace {
-
-/** What the library reads. A test holds this list against its sources. */
-constexpr const char* kProperties[] = {
-        "persist.sys.ds_oriut",
-        "persist.sys.fc_oriut",
-        "persist.sys.oc_oriut",
-        "persist.sys.sc_oriut",
-        "persist.sys.skip_restrict",
-        "persist.sys.total_oriut",
-        "persist.sys.uc_oriut",
-        "persist.zuno.device.invalid.count",
-        "persist.zuno.flow.detect.count",
-        "persist.zuno.rgb.shot.count",
-        "persist.zuno.route.invalid.count",
-        "persist.zuno.rx.close.count",
-        "persist.zuno.ultra.enable.count",
-        "persist.zuno.ultra.invalid.count",
-        "persist.zuno.ultra.phone.enable.count",
-        "persist.zuno.wechat.count.info",
-        "ro.zuno.product.overseas",
-        "service.bootanim.exit",
-};
 
 /** The host writes them without a lock, as the library reads them. */
 __attribute__((no_sanitize("thread"))) int32_t read(const void* address, bool isBool) {
@@ -44,7 +23,7 @@ __attribute__((no_sanitize("thread"))) int32_t read(const void* address, bool is
 std::string bodyOf(const char* action, const std::string& members) {
     if (members.empty()) return {};
     std::string body;
-    base::JsonWriter(&body).key(action).raw('{' + members + '}');
+    base::JsonWriter(&body).key(action).beginObject().raw(members).endObject();
     return body;
 }
 
@@ -59,7 +38,7 @@ Surroundings::Surroundings()
 #undef CALL
 #undef VARIABLE
         } {
-    for (const char* name : kProperties) mProperties.push_back({name, std::nullopt, 0});
+    for (const auto& each : trace::kProperties) mProperties.push_back({each.name, std::nullopt, 0});
 }
 
 std::string Surroundings::takeVariables() {
@@ -95,7 +74,7 @@ std::string Surroundings::takeProperty(std::string_view name) {
 void Surroundings::take(Property* property, std::string* members) {
     if (property->writes > 0) return;
     char value[PROPERTY_VALUE_MAX] = {};
-    property_get(property->name, value, "");
+    property_get(property->name.data(), value, "");
     if (property->known == value) return;
     property->known = value;
     if (!members->empty()) *members += ", ";

@@ -41,7 +41,7 @@ private:
     };
 
     struct Property {
-        const char* name;
+        std::string_view name;             // ends with a NUL
         std::optional<std::string> known;  // unset: ""
         int writes;                        // that have begun and not ended
     };

@@ -57,7 +57,6 @@ for property in $(strings '(persist|ro|service)\.[a-z._]+'); do
     # A row may leave out the first two parts of a name that stand in the name before it.
     suffix=${property#*.*.}
     expect "$suffix\`" docs/output.md "the property $property"
-    expect "\"$property\"," record/Surroundings.cpp "the property $property"
     expect "\"$property\"," trace/Words.h "the property $property"
 done
 

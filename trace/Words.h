@@ -177,13 +177,14 @@ enum class Property {
 };
 
 inline constexpr struct {
-    std::string_view name;
+    std::string_view name;  // ends with a NUL
     Property property;
 } kProperties[] = {
         {"persist.sys.ds_oriut", Property::kOrientationDays},
         {"persist.sys.fc_oriut", Property::kOrientationFastCharging},
         {"persist.sys.oc_oriut", Property::kOrientationOtherCharging},
         {"persist.sys.sc_oriut", Property::kOrientationShockAndCharge},
+        {"persist.sys.skip_restrict", Property::kSkipRestriction},
         {"persist.sys.total_oriut", Property::kOrientationTotal},
         {"persist.sys.uc_oriut", Property::kOrientationUsbCharging},
         {"persist.zuno.device.invalid.count", Property::kInvalidDevices},
@@ -195,7 +196,6 @@ inline constexpr struct {
         {"persist.zuno.ultra.invalid.count", Property::kInvalidCalls},
         {"persist.zuno.ultra.phone.enable.count", Property::kUltrasonicCalls},
         {"persist.zuno.wechat.count.info", Property::kChatCalls},
-        {"persist.sys.skip_restrict", Property::kSkipRestriction},
         {"ro.zuno.product.overseas", Property::kOverseas},
         {"service.bootanim.exit", Property::kBootAnimation},
 };
