@@ -17,7 +17,7 @@ void Check::begin(const std::string& name) {
     mExpected.clear();
     mGiven.clear();
     mLost.reset();
-    mLosses.clear();
+    mTold.clear();
     mDoubts.clear();
     mMet = 0;
     mHasMetAny = false;
@@ -37,8 +37,7 @@ void Check::take(const Record& record) {
         // A boot line that tells of a loss begins what comes after it.
         if (mBoots && mLost) endStretch();
     } else if (record.kind == Record::Kind::kTorn) {
-        mLosses +=
-                base::at(mName, record.number) + "the last line is torn; those before it count\n";
+        mTold += base::at(mName, record.number) + "the last line is torn; those before it count\n";
     } else if (record.kind == Record::Kind::kOver && record.number != 0) {
         endProcess(record.at);
     } else if (record.kind == Record::Kind::kBoot && mLost) {
@@ -49,16 +48,19 @@ void Check::take(const Record& record) {
 }
 
 void Check::takeNote(const trace::Note& note, int64_t line) {
+    const auto tell = [&](const std::string& text) {
+        const std::string told = base::at(mName, line) + text;
+        mTold += told + '\n';
+        mDoubts += "\n  " + told;
+    };
     if (note.lost) {
         mLost = note.lost;
-        const std::string text = "lines are lost from " + std::to_string(note.lost->from) + " to " +
-                                 std::to_string(note.lost->to) + " ms: " + safe(note.lost->why);
-        mLosses += base::at(mName, line) + text + '\n';
-        mDoubts += "\n  " + base::at(mName, line) + text;
+        tell("lines are lost from " + std::to_string(note.lost->from) + " to " +
+             std::to_string(note.lost->to) + " ms: " + safe(note.lost->why));
     }
     if (note.hang) {
-        mDoubts += "\n  " + base::at(mName, line) + "what began at " +
-                   std::to_string(note.hang->from) + " ms hung, and did the rest later";
+        tell("what began at " + std::to_string(note.hang->from) +
+             " ms hung, and did the rest later");
     }
 }
 
@@ -84,8 +86,8 @@ void Check::compare() {
 /** A process that was killed after its last line has not told what that line did. */
 void Check::endProcess(int64_t at) {
     if (!mExpected.empty() || mGiven.empty() || mGiven.front().at != at) return;
-    mLosses += mName + ": the process ends at " + base::formatMs(at) + " ms; the replay does " +
-               std::to_string(mGiven.size()) + " more of that moment\n";
+    mTold += mName + ": the process ends at " + base::formatMs(at) + " ms; the replay does " +
+             std::to_string(mGiven.size()) + " more of that moment\n";
     mGiven.clear();
 }
 
@@ -100,7 +102,7 @@ void Check::endStretch() {
                       mGiven.empty() ? nullptr : &mGiven.front());
     }
     if (mMet > 0) mOut->write(mName + ": " + std::to_string(mMet) + " expectations met\n");
-    mOut->write(std::exchange(mLosses, {}));
+    mOut->write(std::exchange(mTold, {}));
     mHasMetAny |= mMet > 0;
     mMet = 0;
 }

@@ -29,7 +29,7 @@ public:
 
     /**
      * Says on standard output how many expectations the replay has met, for each stretch that it
-     * has met as a whole, and what is missing in the trace.
+     * has met as a whole, what is missing in the trace, and what hung when it was recorded.
      */
     void end(bool isWhole) override;
 
@@ -54,7 +54,7 @@ private:
     std::deque<Entry> mExpected;  // not compared yet; either queue is empty
     std::deque<Entry> mGiven;
     std::optional<trace::LostNote> mLost;  // in the present stretch
-    std::string mLosses;                   // lines that tell of them
+    std::string mTold;                     // what the trace notes of the record, a line each
     std::string mDoubts;                   // why the replay may differ, as the trace says
     int64_t mMet = 0;                      // in the present stretch
     bool mHasMetAny = false;
