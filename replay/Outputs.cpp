@@ -14,7 +14,31 @@
 
 namespace replay {
 
+using base::OutputFile;
 using trace::Record;
+
+const std::vector<FileOutput>& fileOutputs() {
+    using Made = std::unique_ptr<report::Report>;
+    static const std::vector<FileOutput> outputs{
+            {"--timeline", "write the days as trace events to FILE, for a timeline viewer",
+             [](OutputFile* file, const Options& options) -> Made {
+                 return std::make_unique<report::TimelineFile>(file, options.inputs() > 1);
+             }},
+            {"--page", "write the summary as an HTML page to FILE",
+             [](OutputFile* file, const Options& options) -> Made {
+                 return std::make_unique<report::Page>(file, options.baseline.size());
+             }},
+            {"--uses", "write a row for each use of a sensor to FILE, as CSV",
+             [](OutputFile* file, const Options&) -> Made {
+                 return std::make_unique<report::UsesCsv>(file);
+             }},
+            {"--since-charge", "write the battery statistics of bug reports to FILE, as CSV",
+             [](OutputFile* file, const Options&) -> Made {
+                 return std::make_unique<report::SinceChargeCsv>(file);
+             }},
+    };
+    return outputs;
+}
 
 Outputs::Outputs(const Options& options, Progress* progress) : mProgress(progress) {
     const report::Looks looks{options.all, options.colours, options.columns};
@@ -35,26 +59,13 @@ Outputs::Outputs(const Options& options, Progress* progress) : mProgress(progres
 }
 
 base::Result<void> Outputs::open(const Options& options) {
-    base::Result<void> opened;
-    const auto open = [&](const std::optional<std::string>& path, const auto& make) {
-        if (!path || !opened) return;
-        auto file = base::OutputFile::create(*path);
-        if (!file) {
-            opened = tl::unexpected(file.error());
-            return;
-        }
+    for (const auto& [output, path] : options.outputs) {
+        auto file = base::OutputFile::create(path);
+        if (!file) return tl::unexpected(file.error());
         mFiles.push_back(std::move(*file));
-        add(make(&mFiles.back()));
-    };
-    open(options.timeline, [&](base::OutputFile* file) {
-        return std::make_unique<report::TimelineFile>(file, options.inputs() > 1);
-    });
-    open(options.page, [&](base::OutputFile* file) {
-        return std::make_unique<report::Page>(file, options.baseline.size());
-    });
-    open(options.uses, std::make_unique<report::UsesCsv, base::OutputFile*>);
-    open(options.sinceCharge, std::make_unique<report::SinceChargeCsv, base::OutputFile*>);
-    return opened;
+        add(output->make(&mFiles.back(), options));
+    }
+    return {};
 }
 
 void Outputs::take(const Record& record) {

@@ -16,6 +16,16 @@
 
 namespace replay {
 
+/** An output in a file of its own. A new one is a `Report` and a row of `fileOutputs`. */
+struct FileOutput {
+    const char* option;  // "--page"
+    const char* help;
+    std::unique_ptr<report::Report> (*make)(base::OutputFile* file, const Options& options);
+};
+
+/** All of them, in the order in which `--help` lists them. */
+const std::vector<FileOutput>& fileOutputs();
+
 /**
  * What the options ask for, made of the records of all inputs: reports on standard output and in
  * files. One thread at a time may use it.

@@ -14,6 +14,7 @@
 #include "base/Nearest.h"
 #include "base/OutputFile.h"
 #include "base/Result.h"
+#include "replay/Outputs.h"
 #include "replay/Replay.h"
 #include "trace/CallTable.h"
 
@@ -72,14 +73,10 @@ std::vector<base::NamedFile> filesOf(const replay::Options& options) {
     std::vector<base::NamedFile> files;
     for (const std::string& name : options.files) files.push_back({"the input", name});
     for (const std::string& name : options.baseline) files.push_back({"--baseline", name});
-    const auto add = [&](const char* option, const std::optional<std::string>& path) {
-        if (path) files.push_back({option, *path, true});
-    };
-    add("--properties", options.properties);
-    add("--timeline", options.timeline);
-    add("--page", options.page);
-    add("--uses", options.uses);
-    add("--since-charge", options.sinceCharge);
+    if (options.properties) files.push_back({"--properties", *options.properties, true});
+    for (const auto& [output, path] : options.outputs) {
+        files.push_back({output->option, path, true});
+    }
     return files;
 }
 
@@ -150,16 +147,15 @@ int main(int argc, char** argv) {
     };
     addFile("--properties", &options.properties,
             "keep the system properties in FILE (made if missing)");
-    addFile("--timeline", &options.timeline,
-            "write the days as trace events to FILE, for a timeline viewer")
-            ->excludes(printTrace);
-    addFile("--page", &options.page, "write the summary as an HTML page to FILE")
-            ->excludes(printTrace);
-    addFile("--uses", &options.uses, "write a row for each use of a sensor to FILE, as CSV")
-            ->excludes(printTrace);
-    addFile("--since-charge", &options.sinceCharge,
-            "write the battery statistics of bug reports to FILE, as CSV")
-            ->excludes(printTrace);
+    for (const replay::FileOutput& output : replay::fileOutputs()) {
+        const auto ask = [&options, &output](const std::string& path) {
+            options.outputs.push_back({&output, path});
+        };
+        app.add_option_function<std::string>(output.option, ask, output.help)
+                ->type_name("FILE")
+                ->check(refuseOptionAsFile)
+                ->excludes(printTrace);
+    }
     auto* baseline = addFile("--baseline", &options.baseline,
                              "say how the inputs differ from FILE; may be repeated")
                              ->allow_extra_args(false);
