@@ -136,8 +136,12 @@ TEST_F(RecordTest, SamplesGiveTheSameColoursAgainAndFailAgain) {
 TEST_F(RecordTest, ADisplayIsTheOneThatGivesAnAverageWithPixelsOutside) {
     const int rgb[] = {97, 63, 191};
     const int rect[] = {-1, -1, 3, 3};  // nine of sixteen pixels are on the display
-    EXPECT_EQ(record::Screen().take(rgb, rect),
+    record::Screen screen;
+    EXPECT_EQ(screen.take(rgb, rect),
               R"("display": {"size": [1080, 2400], "color": [173, 112, 255], "fault": null})");
+    EXPECT_EQ(screen.take(rgb, rect), "");
+    EXPECT_EQ(screen.take(nullptr, rect), R"("display": {"fault": "capture"})");
+    EXPECT_EQ(screen.take(nullptr, rect), "");
 }
 
 TEST_F(RecordTest, ProcessesAddToTheRecordAndEachBootReplays) {
