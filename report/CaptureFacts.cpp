@@ -14,11 +14,12 @@ std::string formatMomentMs(int64_t ms, const day::Notes& notes) {
 
 std::string describeKnown(const char* what, const std::vector<trace::Interval>& known,
                           const day::Notes& notes) {
-    std::vector<std::string> spans;
+    std::string spans;
     for (const trace::Interval& each : known) {
-        spans.push_back(formatMomentMs(each.from, notes) + " to " + formatMomentMs(each.to, notes));
+        spans += (spans.empty() ? " known from " : ", ") + formatMomentMs(each.from, notes) +
+                 " to " + formatMomentMs(each.to, notes);
     }
-    return std::string(what) + (spans.empty() ? " unknown" : " known from " + join(spans));
+    return what + (spans.empty() ? " unknown" : spans);
 }
 
 void describe(const day::Notes& notes, std::vector<std::string>* lines) {
