@@ -89,6 +89,7 @@ TEST_F(RecordedHostTest, PseudonymsLeakNothingAndDamageNoNumber) {
 
 TEST_F(RecordedHostTest, ATornLastLineIsPassedOverByACheckOnly) {
     live("leaves-its-folder");
+    EXPECT_THAT(read("sensor-priv.jsonl"), HasSubstr(R"("policy": 7)"));
     write("torn", read("sensor-priv.jsonl") + R"({"at": 9000000000, "cal)");
     const Played played = run("--check torn");
     EXPECT_EQ(played.status, 0) << played.err;

@@ -34,6 +34,7 @@
 #include "exception/FlowingDataException.h"
 #include "exception/UltraException.h"
 #include "platform/Telemetry.h"
+#include "rgb/LightSensorState.h"
 #include "rgb/RgbShotManager.h"
 
 namespace {
@@ -300,6 +301,7 @@ void names() {
 }
 
 void leavesItsFolder() {
+    policy = 7;  // the program holds this variable itself
     if (chdir("/") != 0) std::perror("/");
     report();
 }
