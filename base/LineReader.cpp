@@ -26,12 +26,6 @@ void* mapShared(size_t size) {
 
 }  // namespace
 
-std::string_view withoutMark(std::string_view text) {
-    constexpr std::string_view kMark = "\xEF\xBB\xBF";
-    if (text.substr(0, kMark.size()) == kMark) text.remove_prefix(kMark.size());
-    return text;
-}
-
 LineReader::LineReader(int fd) : LineReader(std::make_unique<FileSource>(fd)) {}
 
 LineReader::LineReader(std::unique_ptr<ByteSource> source)

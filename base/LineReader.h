@@ -12,7 +12,11 @@
 namespace base {
 
 /** `text` without the byte order mark of UTF-8 that it may begin with. */
-std::string_view withoutMark(std::string_view text);
+constexpr std::string_view withoutMark(std::string_view text) {
+    constexpr std::string_view kMark = "\xEF\xBB\xBF";
+    if (text.substr(0, kMark.size()) == kMark) text.remove_prefix(kMark.size());
+    return text;
+}
 
 /**
  * Reads a file, or a pipe, line by line and in blocks, in constant memory. Its state lives in

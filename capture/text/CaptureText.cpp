@@ -2,12 +2,13 @@
 
 #include <algorithm>
 
+#include "base/LineReader.h"
+
 namespace capture {
 
 namespace {
 
 constexpr std::string_view kBlanks = " \t\r";
-constexpr std::string_view kMark = "\xEF\xBB\xBF";
 
 }  // namespace
 
@@ -26,7 +27,7 @@ std::string_view trimmed(std::string_view text) {
 }
 
 std::string_view unquoted(std::string_view line) {
-    takePrefix(&line, kMark);
+    line = base::withoutMark(line);
     for (;;) {
         const size_t begin = line.find_first_not_of(kBlanks);
         if (begin == std::string_view::npos) return {};
