@@ -242,6 +242,10 @@ private:
 
 }  // namespace
 
+void preload() {
+    loadCallModule();
+}
+
 base::Result<NextBoot> play(const Boot& boot, const trace::TraceLine* first,
                             const Channels& channels) {
     Player player(channels);

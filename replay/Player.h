@@ -29,6 +29,13 @@ struct Channels {
 };
 
 /**
+ * Loads the library into this process, for boots that will be forked from it. Its static
+ * initialisers run here, once, and see no properties: for inputs that set none before their first
+ * call.
+ */
+void preload();
+
+/**
  * Plays one boot of the library in this process, which must be a fresh one: starts the clock as
  * `boot` says, carries out `first`, if there is one, and then the lines up to the next boot line.
  * After a failure nothing more has run.

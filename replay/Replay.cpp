@@ -15,6 +15,7 @@
 #include "replay/InputPlayer.h"
 #include "replay/Jobs.h"
 #include "replay/Outputs.h"
+#include "replay/Player.h"
 #include "replay/Progress.h"
 #include "replay/TracePrinter.h"
 
@@ -89,6 +90,7 @@ private:
         // A capture's first note asks for the records of calls.
         const trace::WantedRecords wanted{true, mOutputs.wanted().counters};
         const auto play = [&](const std::string& name, trace::RecordWriter* records) {
+            preload();
             const Audience audience{[&](const Record& record) { records->add(record); },
                                     [&] { return wanted; }, [](const std::string&, int64_t) {}};
             return InputPlayer(mOptions, audience).play(name);
