@@ -96,7 +96,6 @@ void Csv::begin(const std::string& name) {
 
 void Csv::end(bool) {
     mTracker.end();
-    endInput();
     flush();
 }
 
@@ -118,15 +117,7 @@ void UsesCsv::take(const trace::Record& record) {
     tracker()->take(record);
     // A boot of the device forgets the notes that its uses need.
     const bool isOver = record.kind == trace::Record::Kind::kOver;
-    addEnded(isOver ? day::EndedUses::kAll : record.at);
-}
-
-void UsesCsv::endInput() {
-    addEnded(day::EndedUses::kAll);
-}
-
-void UsesCsv::addEnded(int64_t before) {
-    for (const day::Use& use : mEnded.take(before)) add(use);
+    for (const day::Use& use : mEnded.take(isOver ? day::EndedUses::kAll : record.at)) add(use);
 }
 
 void UsesCsv::add(const day::Use& use) {

@@ -38,8 +38,6 @@ protected:
     std::string* rows() { return &mRows; }
     void flushIfLarge();
 
-    virtual void endInput() {}
-
 private:
     void flush();
 
@@ -58,8 +56,6 @@ public:
     void take(const trace::Record& record) override;
 
 private:
-    void endInput() override;
-    void addEnded(int64_t before);
     void add(const day::Use& use);
 
     day::EndedUses mEnded;

@@ -302,7 +302,8 @@ TEST(DayTest, WhatIsRoundedAwayInAComparisonHasNoSignAndNoRange) {
         const std::string known = R"({"capture": {"knownTo": 36000000}, "sensors": [
                 {"handle": 1, "name": "A", "type": 1, "maxRate": 1}, {"handle": 2, "name": ")" +
                                   std::string(more) + R"(", "type": 1, "maxRate": 2}]})";
-        return gather({note(0, known), on(0, "a"), off(seconds, "a"), at(36'000, Kind::kTick)});
+        const std::string tag = std::string("a$") + (*more == 'A' ? "1" : "23");
+        return gather({note(0, known), on(0, tag), off(seconds, tag), at(36'000, Kind::kTick)});
     };
     for (const auto& [seconds, size] :
          {std::pair(24, "0:00:00"), {26, "+0:00:01"}, {16, "0:00:00"}, {14, "-0:00:01"}}) {

@@ -227,6 +227,9 @@ TEST_F(ReplayTest, ChecksExpectationsInOrderAndWithoutTheirTimes) {
         EXPECT_NE(played.err.find(message), std::string::npos) << played.err;
         EXPECT_EQ(played.out, status == 0 ? "trace: 2 expectations met\n" : "");
     }
+    const std::string noted = R"({"note": {"hang": {"from": 3}}, )" + event.substr(1);
+    write("trace", joined({sample("0"), report("400"), noted, stored, end}));
+    EXPECT_NE(run("--check trace").out.find("trace:3: what began at 3 ms hung"), std::string::npos);
     write("trace", sample("0") + "\n");
     EXPECT_EQ(run("--check trace").err, "trace: nothing to check: no \"expect\" lines\n");
 }
